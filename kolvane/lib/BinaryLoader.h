@@ -1,0 +1,35 @@
+// Dictionaries in the Kolvane Binary Format, versions 1.0 and 1.5.
+//
+// All integers are little-endian, nothing is aligned or padded:
+//
+//   21 bytes magic, 1 major version, 1 minor version, 1 value encoding (0 UTF-16 in little-endian
+//   order, 1 UTF-8, else the system's code page; a signed byte)
+//   1.5: u32 group count G; G × u32 cumulative count of lengths, two for each entry; u32 lengths, a
+//        key's and then its value's for each entry; G × u16 bucket index; keys and values
+//   1.0: u16 record count, one more than there are groups; for each record a u16 bucket index and a
+//        u32 offset of the group's first byte, or for the last record the end; for each entry a u32
+//        length and the key, a u32 length and the value
+#pragma once
+
+#include <iosfwd>
+#include <string_view>
+
+#include "LoadStatus.h"
+
+class DictionaryTable;
+
+namespace tovali_private {
+
+inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
+
+// Loads the image, whose stream stands at offset 0 and is known to begin with the magic, and
+// splices each of its groups into the bucket that the group names. Returns 0 when it read the body
+// to its end and -1 when it stopped before; `status` gets format, encoding, counts, and the first
+// damage.
+//
+// Nothing that an image says is trusted: a count or a length that exceeds what is left of the
+// stream is a short read, and is found out before anything is allocated for it. What was read
+// before a stop, or before a value whose conversion throws OVErrException, stays in the table.
+int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status);
+
+}  // namespace tovali_private

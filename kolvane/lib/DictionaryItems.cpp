@@ -1,0 +1,116 @@
+#include "DictionaryItems.h"
+
+#include <algorithm>
+#include <cstring>
+#include <memory>
+#include <ostream>
+#include <vector>
+
+#include "Converters.h"
+#include "TextSyntax.h"
+
+namespace tovali_private {
+namespace {
+
+uint32_t WriteBytes(std::ostream& out, const void* bytes, size_t byteCount) {
+  out.write(static_cast<const char*>(bytes), static_cast<std::streamsize>(byteCount));
+  return static_cast<uint32_t>(byteCount);
+}
+
+uint32_t WriteUnits(std::ostream& out, std::span<const uint16_t> units) {
+  return WriteBytes(out, units.data(), units.size_bytes());
+}
+
+uint32_t WriteTextValue(std::ostream& out, std::span<const uint16_t> value) {
+  static constexpr uint16_t kLineEnd[] = {'"', '\r', '\n'};
+  const auto escaped = EscapeForText(value);
+  const uint32_t written = WriteUnits(out, escaped ? std::span<const uint16_t>(*escaped) : value);
+  return written + WriteUnits(out, kLineEnd);
+}
+
+uint32_t WriteMultiByteValue(std::ostream& out, const KolvaneString& value, const int* selector) {
+  const int size = CountMultiByte(value.Data(), value.Length(), selector);
+  std::vector<char> bytes(static_cast<size_t>(size));
+  ConvertToMultiByte(value.Data(), value.Length(), bytes.data(), size, selector);
+  return WriteBytes(out, bytes.data(), bytes.size() - 1);
+}
+
+const uint8_t* CopyOf(std::span<const uint8_t> bytes) {
+  if (bytes.empty()) return nullptr;
+  auto copy = std::make_unique_for_overwrite<uint8_t[]>(bytes.size());
+  std::memcpy(copy.get(), bytes.data(), bytes.size());
+  return copy.release();
+}
+
+}  // namespace
+
+uint32_t HashItem::WriteKey(std::ostream& out, bool binary, const int* selector) const {
+  return Write(out, binary, selector);
+}
+
+uint32_t HashItem::WriteValue(std::ostream& out, bool binary, const int* selector) const {
+  return Write(out, binary, selector);
+}
+
+ByteRunKey::ByteRunKey(const uint8_t* bytes, uint32_t byteCount, bool copy)
+    : data(byteCount == 0 ? nullptr : bytes), length(byteCount), owns(copy) {
+  if (copy) data = CopyOf(Bytes());
+}
+
+ByteRunKey::ByteRunKey(const ByteRunKey& other) : ByteRunKey(other.data, other.length, true) {}
+
+ByteRunKey::~ByteRunKey() {
+  if (owns) delete[] data;
+}
+
+uint32_t ByteRunKey::Write(std::ostream& out, bool binary, const int*) const {
+  if (length == 0) return 0;
+  if (binary) return WriteBytes(out, data, length);
+  std::vector<uint16_t> text;
+  text.reserve(size_t{length} + 2);
+  text.push_back('"');
+  text.insert(text.end(), data, data + length);
+  text.push_back('=');
+  return WriteUnits(out, text);
+}
+
+// Looks at nine bytes at most: every one of a key of up to nine, then every second, and so on.
+uint32_t ByteRunKey::Hash(uint32_t n) const noexcept {
+  const uint32_t step = std::max(length / 5, 1u);
+  uint32_t hash = 0;
+  for (uint64_t i = 0; i < length; i += step) hash = ((hash << 5) + data[i]) % n;
+  return hash;
+}
+
+bool ByteRunKey::Equals(const HashItem& other) const noexcept {
+  const auto& key = static_cast<const ByteRunKey&>(other);
+  return length == key.length && (length == 0 || std::memcmp(data, key.data, length) == 0);
+}
+
+DictionaryEntry::DictionaryEntry(const ByteRunKey& key, const uint8_t* valueBytes,
+                                 uint32_t byteCount)
+    : ByteRunKey(key), value(valueBytes, byteCount) {}
+
+DictionaryEntry::DictionaryEntry(const ByteRunKey& key, const uint16_t* text, uint32_t unitCount)
+    : ByteRunKey(key), value(Unescape({text, unitCount})) {}
+
+uint32_t DictionaryEntry::SerializedSize() const {
+  return ByteRunKey::SerializedSize() + 2 * value.Length();
+}
+
+uint32_t DictionaryEntry::Write(std::ostream& out, bool binary, const int* selector) const {
+  const uint32_t keyBytes = WriteKey(out, binary, selector);
+  return keyBytes + WriteValue(out, binary, selector);
+}
+
+uint32_t DictionaryEntry::WriteKey(std::ostream& out, bool binary, const int* selector) const {
+  return ByteRunKey::Write(out, binary, selector);
+}
+
+uint32_t DictionaryEntry::WriteValue(std::ostream& out, bool binary, const int* selector) const {
+  if (!binary) return WriteTextValue(out, value.Units());
+  if (selector != nullptr) return WriteMultiByteValue(out, value, selector);
+  return WriteBytes(out, value.Data(), value.ByteLength());
+}
+
+}  // namespace tovali_private

@@ -1,0 +1,87 @@
+// Text images as lines of UTF-16, whatever they are encoded in.
+#pragma once
+
+#include <cstdint>
+#include <iosfwd>
+#include <memory>
+
+#include "GrowableBuffer.h"
+#include "LoadStatus.h"
+
+namespace tovali_private {
+
+// Reads one stream, which it borrows, from where it stands; whoever owns the stream may move it
+// between two lines. Buffers are kept from line to line, and lines have no length limit but theirs.
+class DictionaryReader {
+ public:
+  virtual ~DictionaryReader() = default;
+
+  // The next line without its terminator but with a zero unit behind it, valid until the next call;
+  // null when the input ends and no line is pending. A zero character ends a line, and the input
+  // where no line is pending; the next call reads on behind it. Throws OVErrException for a line
+  // that cannot be converted and std::bad_alloc for one that cannot be held.
+  virtual const uint16_t* GetNextLine() = 0;
+
+  // The length in units of the line that GetNextLine returned last, its zero unit not counted.
+  uint32_t LineLength() const noexcept { return line.Length() - 1; }
+
+  TextEncoding Encoding() const noexcept { return encoding; }
+
+  // Tells the encoding from the first two bytes: a UTF-16 byte-order mark of either order, which is
+  // left behind the stream's position, or else the system's code page, with the stream moved back
+  // to position 0.
+  static std::unique_ptr<DictionaryReader> Create(std::istream* stream);
+
+ protected:
+  DictionaryReader(std::istream* input, TextEncoding inputEncoding)
+      : stream(input), encoding(inputEncoding) {}
+
+  // Reads up to `count` bytes, one at a time, and sets `count` to those that came before the stream
+  // ended or failed.
+  void ReadBytes(uint8_t* bytes, uint32_t& count) { ReadStreamBytes(stream, bytes, count); }
+  static void ReadStreamBytes(std::istream* stream, uint8_t* bytes, uint32_t& count);
+
+  UnicodeBuffer line;
+
+ private:
+  std::istream* stream;
+  TextEncoding encoding;
+};
+
+// UTF-16 in little-endian order. Line feed, carriage return, U+2028 and U+2029 end lines.
+class UnicodeReader : public DictionaryReader {
+ public:
+  explicit UnicodeReader(std::istream* input) : UnicodeReader(input, TextEncoding::kUTF16LE) {}
+
+  const uint16_t* GetNextLine() override;
+
+  // Reads one unit and returns whether the input ends with it, which it does where no byte is left
+  // and at a zero unit. A single last byte counts as followed by a zero byte.
+  virtual bool ReadChar(uint16_t& unit);
+
+ protected:
+  using DictionaryReader::DictionaryReader;
+};
+
+// UTF-16 in big-endian order.
+class ByteSwapUnicodeReader final : public UnicodeReader {
+ public:
+  explicit ByteSwapUnicodeReader(std::istream* input)
+      : UnicodeReader(input, TextEncoding::kUTF16BE) {}
+
+  bool ReadChar(uint16_t& unit) override;
+};
+
+// Text of the system's code page. Line feed and carriage return end lines.
+class MultibyteReader final : public DictionaryReader {
+ public:
+  explicit MultibyteReader(std::istream* input)
+      : DictionaryReader(input, TextEncoding::kCodePage) {}
+
+  const uint16_t* GetNextLine() override;
+
+ private:
+  ByteBuffer bytes;
+};
+
+}  // namespace tovali_private

@@ -1,0 +1,102 @@
+// The dictionary proper: entries in 1021 buckets, found by key, loaded from images.
+//
+// DictionaryTable.cpp keeps the entries, DictionaryLoad.cpp is the road of an image in, and
+// DictionaryLookup.cpp the road of a key through.
+#pragma once
+
+#include <cstdint>
+#include <iosfwd>
+#include <memory>
+#include <span>
+
+#include "DictionaryItems.h"
+#include "KeyIndex.h"
+#include "LoadStatus.h"
+#include "TranslatedString.h"
+
+namespace tovali_private {
+class DictionaryReader;
+}
+
+// What became of a text line.
+enum class StoredLine : uint8_t { kDropped, kAdded, kReplaced };
+
+// Owns its entries. Not for concurrent use: even a lookup writes to the table, and values are
+// shared with plain reference counts.
+class DictionaryTable {
+ public:
+  using DictionaryEntry = tovali_private::DictionaryEntry;
+  using ByteRunKey = tovali_private::ByteRunKey;
+
+  static constexpr uint32_t kBucketCount = 1021;
+
+  DictionaryTable() = default;
+  DictionaryTable(const DictionaryTable&) = delete;
+  DictionaryTable& operator=(const DictionaryTable&) = delete;
+
+  // If this table is the default dictionary, there is none afterwards.
+  ~DictionaryTable();
+
+  // Adds the entries of one image, text or binary, to those the table holds. The stream stands at
+  // its start and can seek. Damage is not reported but by LastLoad; time and memory are linear in
+  // the image's size. Throws OVErrException when a conversion fails and std::bad_alloc; what was
+  // stored before stays.
+  void Load(std::istream& image);
+
+  // How the latest load went, one that threw included.
+  const LoadStatus& LastLoad() const noexcept { return lastLoad; }
+
+  // Makes this the process's default dictionary, in which every table looks for what it lacks. The
+  // table stays with its owner.
+  void MakeDefault() noexcept;
+
+  // Translates UTF-8 text of the form `$$$/Key=Default text`: the value that this table or else the
+  // default dictionary has for the key, or else the default text, decoded. The result is empty when
+  // there is none of them, for null, and for a text that begins with `$` but not `$$$`.
+  //
+  // The selector (Converters.h) says what the default text is encoded in; with null and 0 each of
+  // its bytes becomes the unit of the same value. Keys are compared as bytes. Throws OVErrException
+  // when the default text cannot be converted.
+  TranslatedString Translate(const char* text, const int* selector);
+
+  // Puts the definition of one line of text (TextSyntax.h) in place of the one that its key had. A
+  // key's units are narrowed to their low 8 bits. When it throws, the table is as it was.
+  StoredLine StoreLine(std::span<const uint16_t> line);
+
+  // The first entry of the key's bucket that has this key, or null.
+  DictionaryEntry* Find(const ByteRunKey& key) noexcept;
+
+  // Takes out what Find finds; an equal key behind it is found from then on.
+  std::unique_ptr<DictionaryEntry> Detach(const ByteRunKey& key) noexcept;
+
+  // Puts an entry at the head of its bucket, in front of any of the same key.
+  void Insert(std::unique_ptr<DictionaryEntry> entry) noexcept;
+
+  // Puts the entries, in their order, in front of what the bucket holds. An entry whose key belongs
+  // to another bucket is owned but never found. Returns how many now hide an entry of the same key.
+  // `bucket` is less than kBucketCount.
+  uint32_t Splice(uint32_t bucket, std::span<std::unique_ptr<DictionaryEntry>> group) noexcept;
+
+  // Destroys every entry.
+  void Clear() noexcept;
+
+  // The first item of a bucket's chain, or null.
+  const tovali_private::HashItem* Bucket(uint32_t bucket) const noexcept { return buckets[bucket]; }
+
+ private:
+  bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry) noexcept;
+  void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
+  KolvaneString Lookup(std::span<const char> text, const int* selector);
+
+  // Where the latest Find looked, and the item before the one it returned.
+  uint32_t lastBucket = 0;
+  tovali_private::HashItem* predecessor = nullptr;
+
+  // The chains are the truth. The index finds what a walk from a chain's head would find first.
+  tovali_private::HashItem* buckets[kBucketCount] = {};
+  tovali_private::KeyIndex index;
+
+  LoadStatus lastLoad;
+
+  static DictionaryTable* defaultDictionary;  // owned by whoever owns the table
+};

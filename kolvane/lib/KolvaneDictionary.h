@@ -1,0 +1,28 @@
+// A dictionary as its users hold it.
+#pragma once
+
+#include <iosfwd>
+#include <memory>
+
+#include "LoadStatus.h"
+#include "TranslatedString.h"
+
+class DictionaryTable;
+
+// Owns one DictionaryTable, empty at first, and forwards to it; DictionaryTable.h is the contract
+// of each operation.
+class KolvaneDictionary {
+ public:
+  KolvaneDictionary();
+  KolvaneDictionary(const KolvaneDictionary&) = delete;
+  KolvaneDictionary& operator=(const KolvaneDictionary&) = delete;
+  ~KolvaneDictionary();
+
+  void Load(std::istream& image);
+  const LoadStatus& LastLoad() const noexcept;
+  void MakeDefault() noexcept;
+  TranslatedString Translate(const char* text, const int* selector);
+
+ private:
+  std::unique_ptr<DictionaryTable> table;
+};

@@ -1,0 +1,21 @@
+// Every turning of bytes into integers that the dictionary library does.
+#pragma once
+
+#include <bit>
+#include <cstdint>
+
+namespace tovali_private {
+
+// Texts are stored, and dictionary files are laid out, in little-endian order; code units are used
+// where they lie.
+static_assert(std::endian::native == std::endian::little);
+
+inline uint16_t Read16(const uint8_t* bytes) noexcept {
+  return static_cast<uint16_t>(bytes[0] | bytes[1] << 8);
+}
+
+inline uint32_t Read32(const uint8_t* bytes) noexcept {
+  return Read16(bytes) | static_cast<uint32_t>(Read16(bytes + 2)) << 16;
+}
+
+}  // namespace tovali_private

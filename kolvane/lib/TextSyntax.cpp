@@ -1,0 +1,150 @@
+#include "TextSyntax.h"
+
+#include <algorithm>
+
+#include "NamedCharacters.h"
+
+namespace tovali_private {
+namespace {
+
+using Units = std::span<const uint16_t>;
+
+constexpr uint16_t kQuote = '"';
+constexpr uint16_t kCaret = '^';
+constexpr uint16_t kBackslash = '\\';
+
+// The place of the first double quote from `start` on that no backslash immediately precedes, or
+// the line's length. Only the one unit before a quote counts.
+size_t FindQuote(Units line, size_t start) noexcept {
+  for (size_t i = start; i < line.size(); ++i) {
+    if (line[i] == kQuote && (i == 0 || line[i - 1] != kBackslash)) return i;
+  }
+  return line.size();
+}
+
+struct Escape {
+  char letter;
+  uint16_t character;
+};
+
+constexpr Escape kCaretEscapes[] = {{'Q', 0x0022}, {'[', 0x201C}, {']', 0x201D}, {'{', 0x2018},
+                                    {'}', 0x2019}, {'C', 0x00A9}, {'R', 0x00AE}, {'T', 0x2122},
+                                    {'D', 0x00B0}, {'B', 0x2022}, {'#', 0x2318}, {'!', 0x00AC},
+                                    {'I', 0x2206}, {'S', 0x2211}, {'n', 0x000A}, {'r', 0x000D}};
+
+constexpr Escape kBackslashEscapes[] = {
+    {'"', 0x0022}, {'n', 0x000A}, {'r', 0x000D}, {'t', 0x0009}, {'b', 0x0008}};
+
+constexpr bool IsEscapeCharacter(uint16_t unit) noexcept {
+  return unit == kCaret || unit == kBackslash;
+}
+
+const Escape* FindEscape(uint16_t escapeCharacter, uint16_t letter) noexcept {
+  const std::span<const Escape> table = escapeCharacter == kCaret
+                                            ? std::span<const Escape>(kCaretEscapes)
+                                            : std::span<const Escape>(kBackslashEscapes);
+  const auto found = std::find_if(table.begin(), table.end(),
+                                  [&](const Escape& escape) { return escape.letter == letter; });
+  return found == table.end() ? nullptr : &*found;
+}
+
+std::vector<uint16_t> DecodeEscapes(Units text) {
+  std::vector<uint16_t> decoded;
+  decoded.reserve(text.size());
+  uint16_t pending = 0;  // the escape character before this unit, if there is one
+  for (const uint16_t unit : text) {
+    if (pending == 0) {
+      if (IsEscapeCharacter(unit)) {
+        pending = unit;
+      } else {
+        decoded.push_back(unit);
+      }
+      continue;
+    }
+    if (const Escape* escape = FindEscape(pending, unit)) {
+      decoded.push_back(escape->character);
+    } else {
+      decoded.push_back(pending);
+      if (unit != pending) decoded.push_back(unit);
+    }
+    pending = 0;
+  }
+  if (pending != 0) decoded.push_back(pending);
+  return decoded;
+}
+
+// In place: a name is longer than its character.
+void ExpandNamedCharacters(std::vector<uint16_t>& text) {
+  const auto firstMark = std::find(text.begin(), text.end(), '#');
+  auto out = firstMark;
+  for (auto in = firstMark; in != text.end();) {
+    const NamedCharacter* named = *in == '#' ? MatchNamedCharacter(Units(in, text.end())) : nullptr;
+    if (named == nullptr) {
+      *out++ = *in++;
+      continue;
+    }
+    for (const uint16_t unit : named->Units()) *out++ = unit;
+    in += static_cast<std::ptrdiff_t>(named->WrittenLength());
+  }
+  text.erase(out, text.end());
+}
+
+// The letter that stands for a unit after a backslash in written text, or 0 for a unit that is
+// written as it is.
+constexpr char LetterFor(uint16_t unit) noexcept {
+  switch (unit) {
+    case '\n':
+      return 'n';
+    case '\r':
+      return 'r';
+    case kQuote:
+      return '"';
+    default:
+      return 0;
+  }
+}
+
+}  // namespace
+
+Units EntryText(Units line) noexcept {
+  const size_t opening = FindQuote(line, 0);
+  if (opening == line.size()) return line;
+  const size_t closing = FindQuote(line, opening + 1);
+  return line.subspan(opening + 1, closing - opening - 1);
+}
+
+template <class Unit>
+std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept {
+  if (!text.empty() && text[0] == '$') {
+    if (text.size() < 3 || text[1] != '$' || text[2] != '$') return std::nullopt;
+    text = text.subspan(3);
+  }
+  const auto equals = std::find(text.begin(), text.end(), Unit{'='});
+  const auto keyLength = static_cast<size_t>(equals - text.begin());
+  const size_t valueStart = std::min(keyLength + 1, text.size());
+  return SplitText<Unit>{text.first(keyLength), text.subspan(valueStart)};
+}
+
+template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noexcept;
+template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
+
+KolvaneString Unescape(Units text) {
+  std::vector<uint16_t> decoded = DecodeEscapes(text);
+  ExpandNamedCharacters(decoded);
+  return {decoded.data(), static_cast<uint32_t>(decoded.size())};
+}
+
+std::optional<std::vector<uint16_t>> EscapeForText(Units text) {
+  const auto escaped = std::count_if(text.begin(), text.end(), LetterFor);
+  if (escaped == 0) return std::nullopt;
+  std::vector<uint16_t> written;
+  written.reserve(text.size() + static_cast<size_t>(escaped));
+  for (const uint16_t unit : text) {
+    const char letter = LetterFor(unit);
+    if (letter != 0) written.push_back(kBackslash);
+    written.push_back(letter != 0 ? static_cast<uint16_t>(letter) : unit);
+  }
+  return written;
+}
+
+}  // namespace tovali_private

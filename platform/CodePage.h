@@ -1,0 +1,45 @@
+// Conversion between UTF-16 and the multibyte text of a code page.
+//
+// Two code pages exist: UTF-8, and the system's own, which off Windows is windows-1252. On Windows
+// these functions are the system's; elsewhere a layer of ours keeps the same contract:
+//
+// * flags must be 0; counts are positive (a text's terminator is not looked for); the text is not
+// null.
+// * capacity 0 asks for the size: the result is the number of units (or bytes) that the whole text
+//   needs, and the output, which may be null, is left alone.
+// * Otherwise the text is converted into the output, which holds `capacity` units (or bytes) and
+// gets
+//   no terminator; the result is the number written.
+// * 0 means failure, and GetLastError tells why: kErrorInsufficientBuffer when the output is too
+// small
+//   (what it then holds is not defined), kErrorInvalidParameter when a rule above is broken or the
+//   size does not fit an int.
+//
+// Damaged text never fails. Each maximal subpart of malformed UTF-8 becomes U+FFFD; an unpaired
+// surrogate becomes EF BF BD in UTF-8; a unit that windows-1252 lacks becomes '?'. The bytes 81,
+// 8D, 8F, 90 and 9D of windows-1252, which it leaves undefined, stand for the C1 control of their
+// value.
+//
+// Nothing here allocates or throws.
+#pragma once
+
+#include <cstdint>
+
+namespace platform {
+
+inline constexpr uint32_t kCodePageSystem = 0;
+inline constexpr uint32_t kCodePageUTF8 = 65001;
+
+inline constexpr uint32_t kErrorInvalidParameter = 87;
+inline constexpr uint32_t kErrorInsufficientBuffer = 122;
+
+int MultiByteToWideChar(uint32_t codePage, uint32_t flags, const char* text, int byteCount,
+                        uint16_t* units, int capacity) noexcept;
+
+int WideCharToMultiByte(uint32_t codePage, uint32_t flags, const uint16_t* units, int unitCount,
+                        char* bytes, int capacity) noexcept;
+
+// The reason of the calling thread's latest failure; a success leaves it as it was.
+uint32_t GetLastError() noexcept;
+
+}  // namespace platform

@@ -1,0 +1,68 @@
+#include "AllocationMeter.h"
+
+#include <cstdlib>
+#include <new>
+
+namespace {
+
+bool gWatching = false;
+bool gFailed = false;
+size_t gTotalBytes = 0;
+size_t gUntilFailure = 0;
+
+bool MayAllocate(size_t size) {
+  if (!gWatching) return true;
+  gTotalBytes += size;
+  if (gUntilFailure == 0 || --gUntilFailure != 0) return true;
+  gFailed = true;
+  return false;
+}
+
+}  // namespace
+
+AllocationMeter::AllocationMeter(size_t failAt) {
+  gFailed = false;
+  gTotalBytes = 0;
+  gUntilFailure = failAt;
+  gWatching = true;
+}
+
+AllocationMeter::~AllocationMeter() {
+  gWatching = false;
+}
+
+size_t AllocationMeter::TotalBytes() const {
+  return gTotalBytes;
+}
+bool AllocationMeter::Failed() const {
+  return gFailed;
+}
+
+void* operator new(size_t size) {
+  void* const block = MayAllocate(size) ? std::malloc(size != 0 ? size : 1) : nullptr;
+  if (block == nullptr) throw std::bad_alloc();
+  return block;
+}
+
+void* operator new(size_t size, const std::nothrow_t&) noexcept {
+  return MayAllocate(size) ? std::malloc(size != 0 ? size : 1) : nullptr;
+}
+
+void* operator new[](size_t size) {
+  return operator new(size);
+}
+void* operator new[](size_t size, const std::nothrow_t& tag) noexcept {
+  return operator new(size, tag);
+}
+void operator delete(void* block) noexcept {
+  std::free(block);
+}
+void operator delete[](void* block) noexcept {
+  std::free(block);
+}
+void operator delete(void* block, size_t) noexcept {
+  std::free(block);
+}
+void operator delete[](void* block, size_t) noexcept {
+  std::free(block);
+}

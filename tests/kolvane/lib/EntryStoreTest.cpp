@@ -1,0 +1,222 @@
+// Strings, items, and the table with its chains and index.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <random>
+#include <sstream>
+
+#include "Converters.h"
+#include "DictionaryTable.h"
+#include "OVErrException.h"
+#include "Support.h"
+
+namespace {
+
+using namespace tovali_private;
+
+ByteRunKey Key(const std::string& key, bool copy = true) {
+  return {reinterpret_cast<const uint8_t*>(key.data()), static_cast<uint32_t>(key.size()), copy};
+}
+
+std::unique_ptr<DictionaryEntry> Entry(const std::string& key, const std::u16string& value) {
+  const std::string bytes = Bytes(value);
+  return std::make_unique<DictionaryEntry>(Key(key), reinterpret_cast<const uint8_t*>(bytes.data()),
+                                           static_cast<uint32_t>(bytes.size()));
+}
+
+class Mortal : public RefCountObj {
+ public:
+  explicit Mortal(int& deathCount) : deaths(deathCount) {}
+  ~Mortal() override { ++deaths; }
+
+ private:
+  int& deaths;
+};
+
+TEST(RefCountObj, DiesOnceWithItsLastHandle) {
+  int deaths = 0;
+  auto* const object = new Mortal(deaths);
+  object->AddRef();
+  object->AddRef();
+  object->Release();
+  EXPECT_EQ(deaths, 0);
+  object->Release();
+  EXPECT_EQ(deaths, 1);
+}
+
+TEST(KolvaneString, SharesItsBytes) {
+  const uint8_t bytes[] = {'a', 0, 'b', 0, 'c'};
+  KolvaneString odd(bytes, 5);
+  EXPECT_EQ(odd.Length(), 2u);
+  EXPECT_EQ(odd.ByteLength(), 5u);
+  KolvaneString other;
+  {
+    KolvaneString copy(odd);
+    other = copy;
+    copy = *&copy;
+    other = copy;
+    EXPECT_EQ(other.Data(), odd.Data());
+    odd = KolvaneString();
+  }
+  EXPECT_EQ(Text(other), u"ab");
+  EXPECT_EQ(odd.Data(), nullptr);
+  EXPECT_EQ(odd.Length(), 0u);
+}
+
+TEST(ByteRunKey, HashesAndComparesBytes) {
+  struct {
+    const char* key;
+    uint32_t bucket;
+  } const cases[] = {{"", 0},
+                     {"a", 97},
+                     {"/a", 580},
+                     {"abcde", 606},
+                     {"/Menu/File/Open", 243},
+                     {"/Dialog/OK", 929},
+                     {"0123456789", BucketOf("0x2x4x6x8x")}};
+  for (const auto& each : cases) EXPECT_EQ(Key(each.key).Hash(1021), each.bucket) << each.key;
+  EXPECT_TRUE(Key("ab").Equals(Key("ab")));
+  EXPECT_TRUE(Key("").Equals(Key("")));
+  EXPECT_FALSE(Key("ab").Equals(Key("abc")));
+  EXPECT_FALSE(Key("/A").Equals(Key("/a")));
+  const std::string text = "borrowed";
+  const ByteRunKey probe = Key(text, false);
+  EXPECT_EQ(static_cast<const void*>(probe.Bytes().data()), text.data());
+  EXPECT_TRUE(ByteRunKey(probe).Owns());
+  EXPECT_EQ(Key("", true).Bytes().data(), nullptr);
+}
+
+TEST(DictionaryEntry, WritesItself) {
+  const int utf8 = 1, codePage = 2;
+  struct {
+    bool binary;
+    const int* selector;
+    const char* key;
+    const char16_t* value;
+    std::string written;
+  } const cases[] = {
+      {false, nullptr, "/a", u"say \"hi\"", Bytes(u"\"/a=say \\\"hi\\\"\"\r\n")},
+      {false, nullptr, "\xE9", u"a\nb^", Bytes(u"\"\u00E9=a\\nb^\"\r\n")},
+      {false, nullptr, "", u"x", Bytes(u"x\"\r\n")},
+      {true, nullptr, "/a", u"\u20AC", "/a\xAC\x20"},
+      {true, nullptr, "/a", u"", "/a"},
+      {true, &utf8, "/a", u"\u20AC", "/a\xE2\x82\xAC"},
+      {true, &codePage, "/a", u"\u20AC\u0416", "/a\x80?"},
+      {true, &utf8, "", u"", ""},
+  };
+  for (const auto& each : cases) {
+    SCOPED_TRACE(&each - cases);
+    const auto entry = Entry(each.key, each.value);
+    std::ostringstream whole, parts;
+    EXPECT_EQ(entry->Write(whole, each.binary, each.selector), each.written.size());
+    EXPECT_EQ(entry->WriteKey(parts, each.binary, each.selector) +
+                  entry->WriteValue(parts, each.binary, each.selector),
+              each.written.size());
+    EXPECT_EQ(whole.str(), each.written);
+    EXPECT_EQ(parts.str(), each.written);
+  }
+  EXPECT_EQ(Entry("/abc", u"xyz")->SerializedSize(), 10u);
+}
+
+// Random inserts, detaches and splices of keys that crowd two buckets, against plain lists. Every
+// state is compared whole: the chains, and for every key what is found.
+TEST(DictionaryTable, FindsWhatAWalkOfTheChainFinds) {
+  std::vector<std::string> keys;
+  for (size_t i = 0; i < 40; ++i) {
+    keys.push_back("0_2_4_" + std::string(i % 2, 'x') + "6_" + static_cast<char>('a' + i / 2) +
+                   "_");
+  }
+  DictionaryTable table;
+  std::map<uint32_t, std::vector<std::pair<std::string, std::u16string>>> twin;
+  std::mt19937 random(3);
+  for (int round = 0; round < 4000; ++round) {
+    const std::string& key = keys[random() % keys.size()];
+    const std::u16string value(1, static_cast<char16_t>(round));
+    auto& chain = twin[BucketOf(key)];
+    const auto equal = [&](const auto& entry) { return entry.first == key; };
+    if (const auto choice = random() % 8; choice < 2) {
+      table.Insert(Entry(key, value));
+      chain.insert(chain.begin(), {key, value});
+    } else if (choice == 2) {
+      const std::string& second = keys[random() % keys.size()];  // perhaps in a bucket not its own
+      std::unique_ptr<DictionaryEntry> group[] = {Entry(key, value), Entry(second, u"2"),
+                                                  Entry(key, u"3")};
+      table.Splice(BucketOf(key), group);
+      chain.insert(chain.begin(), {{key, value}, {second, u"2"}, {key, u"3"}});
+    } else {
+      const auto expected = std::find_if(chain.begin(), chain.end(), equal);
+      const auto detached = table.Detach(Key(key));
+      ASSERT_EQ(detached != nullptr, expected != chain.end());
+      if (detached == nullptr) continue;
+      ASSERT_EQ(Text(detached->Value()), expected->second);
+      ASSERT_TRUE(detached->next == nullptr && detached->previous == nullptr);
+      chain.erase(expected);
+    }
+    Contents expected;
+    for (const auto& [bucket, entries] : twin) {
+      for (const auto& entry : entries) expected.emplace_back(bucket, entry.first, entry.second);
+    }
+    ASSERT_EQ(ContentsOf(table), expected);
+    const DictionaryEntry* const found = table.Find(Key(key));
+    const auto first = std::find_if(chain.begin(), chain.end(), equal);
+    ASSERT_EQ(found != nullptr, first != chain.end());
+    if (found != nullptr) {
+      ASSERT_EQ(Text(found->Value()), first->second);
+    }
+  }
+  table.Clear();
+  EXPECT_TRUE(ContentsOf(table).empty());
+  EXPECT_EQ(table.Find(Key(keys[0])), nullptr);
+}
+
+TEST(Converters, GuardTheirBuffers) {
+  const auto units = Units(u"\u20ACuro");
+  const int utf8 = 1, other = 2;
+  EXPECT_EQ(CodePageFor(nullptr), 0u);
+  EXPECT_EQ(CodePageFor(&utf8), 65001u);
+  EXPECT_EQ(CodePageFor(&other), 0u);
+  const int size = CountMultiByte(units.data(), units.size(), &utf8);
+  EXPECT_EQ(size, 7);
+  const auto codeFor = [&](char* bytes, size_t count, int room) {
+    try {
+      ConvertToMultiByte(units.data(), count, bytes, room, &utf8);
+    } catch (const OVErrException& error) {
+      return error.Code();
+    }
+    return 0u;
+  };
+  for (int room = 0; room <= 8; ++room) {
+    std::vector<char> exact(static_cast<size_t>(room));
+    EXPECT_EQ(codeFor(exact.data(), units.size(), room), room < size ? kErrorBufferTooSmall : 0)
+        << room;
+    if (room >= size) {
+      EXPECT_STREQ(exact.data(), "\xE2\x82\xACuro");
+    }
+  }
+  EXPECT_EQ(codeFor(nullptr, 0, 8), kErrorBufferTooSmall);
+  char one = 'x';
+  EXPECT_EQ(codeFor(&one, 0, 1), 0u);
+  EXPECT_EQ(one, 0);
+
+  UnicodeBuffer buffer;
+  ConvertToUnicode("", 0, buffer);
+  EXPECT_EQ(buffer.Length(), 0u);
+  ConvertToUnicode("\x80uro", 4, buffer, &other);
+  EXPECT_EQ(buffer.Length(), 4u);
+  EXPECT_EQ(buffer.Data()[0], 0x20AC);
+}
+
+TEST(GrowableBuffer, GrowsByHalfAndKeepsWhatItHolds) {
+  UnicodeBuffer buffer;
+  for (uint16_t i = 0; i < 300; ++i) buffer.Append(i);
+  EXPECT_EQ(buffer.Capacity(), 384u);
+  buffer.Reserve(600);
+  EXPECT_EQ(buffer.Capacity(), 864u);
+  EXPECT_EQ(buffer.Data()[299], 299);
+  EXPECT_THROW(buffer.Reserve(size_t{1} << 31), std::bad_alloc);
+  EXPECT_EQ(buffer.Length(), 300u);
+  buffer.Clear();
+  EXPECT_EQ(buffer.Capacity(), 864u);
+}
+
+}  // namespace

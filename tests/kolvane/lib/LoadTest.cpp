@@ -1,0 +1,350 @@
+// Images in: readers, both binary versions, and every kind of damage.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <boost/interprocess/streams/bufferstream.hpp>
+#include <chrono>
+#include <random>
+#include <sstream>
+
+#include "AllocationMeter.h"
+#include "Converters.h"
+#include "DictionaryReader.h"
+#include "OVErrException.h"
+#include "SlowTwin.h"
+#include "Support.h"
+
+namespace {
+
+using namespace tovali_private;
+
+std::vector<std::u16string> Lines(DictionaryReader& reader) {
+  std::vector<std::u16string> lines;
+  while (const uint16_t* line = reader.GetNextLine()) {
+    EXPECT_EQ(line[reader.LineLength()], 0);
+    lines.emplace_back(line, line + reader.LineLength());
+  }
+  return lines;
+}
+
+TEST(DictionaryReader, DeliversLines) {
+  using namespace std::string_literals;
+  struct {
+    std::string input;
+    TextEncoding encoding;
+    std::vector<std::u16string> lines;  // of each run of GetNextLine up to null
+    std::vector<std::u16string> after;
+  } const cases[] = {
+      {"", TextEncoding::kCodePage, {}, {}},
+      {"a", TextEncoding::kCodePage, {u"a"}, {}},
+      {"ab\r\ncd\n\xE9\x80\x81", TextEncoding::kCodePage, {u"ab", u"", u"cd", u"é€\x81"}, {}},
+      {"ab\0c\n\0d"s, TextEncoding::kCodePage, {u"ab", u"c"}, {u"d"}},
+      {"a\0b\0\n\0"s, TextEncoding::kCodePage, {u"a", u"b", u""}, {}},
+      {"\xEF\xBB\xBF", TextEncoding::kCodePage, {u"ï»¿"}, {}},
+      {LittleEndianImage(u"a\u2028b\u2029c\r\n\nd"),
+       TextEncoding::kUTF16LE,
+       {u"a", u"b", u"c", u"", u"", u"d"},
+       {}},
+      {BigEndianImage(u"a\u0A0D\nb"), TextEncoding::kUTF16BE, {u"a\u0A0D", u"b"}, {}},
+      {LittleEndianImage(u"a") + "\0\0b\0\n\0\0\0c"s, TextEncoding::kUTF16LE, {u"a", u"b"}, {u"c"}},
+      {BigEndianImage(u"a") + "b", TextEncoding::kUTF16BE, {u"a\u6200"}, {}},
+      {LittleEndianImage(u""), TextEncoding::kUTF16LE, {}, {}},
+  };
+  for (const auto& each : cases) {
+    SCOPED_TRACE(&each - cases);
+    std::istringstream stream(each.input);
+    const auto reader = DictionaryReader::Create(&stream);
+    EXPECT_EQ(reader->Encoding(), each.encoding);
+    EXPECT_EQ(Lines(*reader), each.lines);
+    EXPECT_EQ(Lines(*reader), each.after);
+  }
+  std::istringstream failed("some text");
+  failed.setstate(std::ios::failbit);
+  EXPECT_EQ(DictionaryReader::Create(&failed)->GetNextLine(), nullptr);
+  EXPECT_EQ(DictionaryReader::Create(nullptr)->GetNextLine(), nullptr);
+}
+
+// The same dictionary in every form an image can have.
+std::vector<std::string> ValidImages() {
+  const std::u16string text =
+      u"\"$$$/a=H\u00E4\"\r\n\n\"$$$/b=x^ny\" z\n\"$$/c=d\"\n\"$$$/a=\u20AC\"";
+  std::string codePage;
+  for (const char16_t unit : text) codePage += unit == u'\u20AC' ? '\x80' : static_cast<char>(unit);
+  std::vector<std::string> images = {LittleEndianImage(text), BigEndianImage(text), codePage};
+  for (const int encoding : {0, 1, 2}) {
+    const std::string value = encoding == 0   ? Bytes(u"H\u00E4")
+                              : encoding == 1 ? "H\xC3\xA4"
+                                              : "H\xE4";
+    const std::vector<ImageGroup> groups = {{580, {{"/a", value}, {"/a", ""}}},
+                                            {581, {{"/b", value}, {"/a", value}}},
+                                            {7, {}},
+                                            {580, {{"/a", value}}}};
+    images.push_back(Image1_5(encoding, groups));
+    images.push_back(Image1_0(encoding, groups));
+  }
+  return images;
+}
+
+void ExpectLoadsAsTheTwinDoes(const std::string& image) {
+  DictionaryTable table;
+  SlowTwin twin;
+  for (const std::string& each : {std::string("\"$$$/a=was here before\""), image}) {
+    Load(table, each);
+    twin.Load(each);
+  }
+  ASSERT_EQ(ContentsOf(table), twin.AllContents());
+  ASSERT_EQ(Translated(table, "$$$/a=none"), twin.Translate("$$$/a=none"));
+}
+
+TEST(Load, TakesWholeImagesWhole) {
+  for (const std::string& image : ValidImages()) {
+    SCOPED_TRACE(image);
+    ExpectLoadsAsTheTwinDoes(image);
+    DictionaryTable table;
+    Load(table, image);
+    EXPECT_TRUE(table.LastLoad().Complete());
+    EXPECT_GT(table.LastLoad().entriesAdded, 2u);
+    EXPECT_GT(table.LastLoad().entriesReplaced, 0u);
+  }
+}
+
+TEST(Load, SurvivesEveryPrefix) {
+  for (const std::string& image : ValidImages()) {
+    for (size_t length = 0; length < image.size(); ++length) {
+      SCOPED_TRACE(testing::Message() << length << " of " << image);
+      ExpectLoadsAsTheTwinDoes(image.substr(0, length));
+    }
+  }
+}
+
+TEST(Load, SurvivesEveryChangedByte) {
+  for (std::string image : ValidImages()) {
+    for (char& byte : image) {
+      const char original = byte;
+      for (int change = 1; change < 256; ++change) {
+        byte = static_cast<char>(original ^ change);
+        SCOPED_TRACE(testing::Message() << &byte - image.data() << " of " << image);
+        ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(image));
+      }
+      byte = original;
+    }
+  }
+}
+
+TEST(Load, TakesRandomTextsAsTheTwinDoes) {
+  constexpr char16_t kAlphabet[] = u"\"\"\"$$$$===\\\\^n#{lt}/ab\n\n\r\u2028\u00E9\0";
+  std::mt19937 random(4);
+  for (int round = 0; round < 20000; ++round) {
+    std::u16string text(21, u'\n');
+    for (size_t length = random() % 60; length > 0; --length)
+      text += kAlphabet[random() % std::size(kAlphabet)];
+    std::string narrow(text.begin(), text.end());
+    std::shuffle(narrow.begin(), narrow.end(), random);
+    ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(LittleEndianImage(text)));
+    ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(BigEndianImage(text)));
+    ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(narrow));
+  }
+}
+
+TEST(Load, TakesRandomBinariesAsTheTwinDoes) {
+  std::mt19937 random(5);
+  for (int round = 0; round < 5000; ++round) {
+    std::vector<ImageGroup> groups(1 + random() % 4);
+    for (ImageGroup& group : groups) {
+      group.bucket = static_cast<uint16_t>(random() % 8 == 0 ? random() : 580 + random() % 3);
+      for (size_t count = random() % 4; count > 0; --count) {
+        const std::string key = {'/', static_cast<char>('a' + random() % 3)};
+        group.entries.emplace_back(key, std::string(random() % 5, static_cast<char>(random())));
+      }
+    }
+    const int encoding = static_cast<int>(random() % 4) - 1;
+    ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(Image1_5(encoding, groups)));
+    ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(Image1_0(encoding, groups)));
+  }
+}
+
+// What LastLoad tells.
+TEST(Load, TellsHowItWent) {
+  using namespace std::string_literals;
+  const auto damaged = [](std::string image, size_t at, const std::string& bytes) {
+    return image.replace(at, bytes.size(), bytes);
+  };
+  const std::string one15 = Image1_5(0, {{580, {{"/a", Bytes(u"Hi")}}}});
+  const std::string one10 = Image1_0(0, {{580, {{"/a", Bytes(u"Hi")}}}});
+  const std::string two15 = Image1_5(1, {{580, {{"/a", "x"}}}, {581, {{"/b", "y"}}}});
+  const std::string two10 = Image1_0(9, {{580, {{"/a", "x"}}}, {581, {{"/b", "y"}}}});
+  ASSERT_EQ(one15, "Kolvane Binary Format\1\5\0\1\0\0\0\2\0\0\0\2\0\0\0\4\0\0\0\x44\2/aH\0i\0"s);
+  ASSERT_EQ(
+      one10,
+      "Kolvane Binary Format\1\0\0\2\0\x44\2\x26\0\0\0\0\0\x34\0\0\0\2\0\0\0/a\4\0\0\0H\0i\0"s);
+  const std::string line = "\"$$$/a=a line of text\"\n";
+  struct {
+    std::string image;
+    ImageFormat format;
+    TextEncoding encoding;
+    uint32_t added, replaced, dropped;
+    LoadDamage damage;
+    uint64_t offset;
+  } const cases[] = {
+      {"", ImageFormat::kNone, TextEncoding::kCodePage, 0, 0, 0, LoadDamage::kTooShort, 0},
+      {LittleEndianImage(u"\"$$$/a=b\""), ImageFormat::kNone, TextEncoding::kCodePage, 0, 0, 0,
+       LoadDamage::kTooShort, 0},
+      {LittleEndianImage(u"\"$$$/a=b\"\r\n"), ImageFormat::kText, TextEncoding::kUTF16LE, 1, 0, 0,
+       LoadDamage::kNone, 0},
+      {line + line + "$x\n", ImageFormat::kText, TextEncoding::kCodePage, 2, 1, 1,
+       LoadDamage::kNone, 0},
+      {line + "\0"s, ImageFormat::kText, TextEncoding::kCodePage, 1, 0, 0, LoadDamage::kNone, 0},
+      {line + "\0x"s, ImageFormat::kText, TextEncoding::kCodePage, 1, 0, 0,
+       LoadDamage::kZeroCharacter, 23},
+      {BigEndianImage(u"\"$$$/abcdef=b\"\n") + "\0\0x"s, ImageFormat::kText, TextEncoding::kUTF16BE,
+       1, 0, 0, LoadDamage::kZeroCharacter, 32},
+      {one15, ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 1, 0, 0, LoadDamage::kNone, 0},
+      {one10, ImageFormat::kBinary1_0, TextEncoding::kUTF16LE, 1, 0, 0, LoadDamage::kNone, 0},
+      {one15 + "behind", ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 1, 0, 0,
+       LoadDamage::kNone, 0},
+      {two15, ImageFormat::kBinary1_5, TextEncoding::kUTF8, 2, 0, 0, LoadDamage::kNone, 0},
+      {two10, ImageFormat::kBinary1_0, TextEncoding::kCodePage, 2, 0, 0, LoadDamage::kNone, 0},
+      {two15.substr(0, two15.size() - 1), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 1, 0, 0,
+       LoadDamage::kShortRead, two15.size() - 1},
+      {damaged(one15, 21, "\1\7"), ImageFormat::kBinaryOther, TextEncoding::kUTF16LE, 0, 0, 0,
+       LoadDamage::kUnsupportedVersion, 21},
+      {damaged(one15, 24, "\xFF\xFF\xFF\xFF"), ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 0,
+       0, 0, LoadDamage::kShortRead, 28},
+      {damaged(one15, 24, "\0\0\0\0"s), ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 0, 0, 0,
+       LoadDamage::kNoGroups, 24},
+      {damaged(one10, 24, "\0\0"s), ImageFormat::kBinary1_0, TextEncoding::kUTF16LE, 0, 0, 0,
+       LoadDamage::kNoGroups, 24},
+      {damaged(two15, 28, "\1"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0,
+       LoadDamage::kBadCounts, 28},
+      {damaged(two15, 28, "\6"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0,
+       LoadDamage::kBadCounts, 28},
+      {damaged(two15, 36, "\xFF\xFF\xFF\xFF"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0,
+       0, LoadDamage::kShortRead, 56},
+      {damaged(two15, 52, "\xFD\3"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 1, 0, 0,
+       LoadDamage::kBadBucket, 52},
+      {damaged(two10, 26, "\xFD\3"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 1, 0, 0,
+       LoadDamage::kBadBucket, 26},
+      {damaged(two10, 34, "\x2D"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 2, 0, 0,
+       LoadDamage::kBadOffset, 34},
+  };
+  for (const auto& each : cases) {
+    SCOPED_TRACE(&each - cases);
+    DictionaryTable table;
+    Load(table, each.image);
+    const LoadStatus& status = table.LastLoad();
+    EXPECT_EQ(status.format, each.format);
+    EXPECT_EQ(status.encoding, each.encoding);
+    EXPECT_EQ(status.entriesAdded, each.added);
+    EXPECT_EQ(status.entriesReplaced, each.replaced);
+    EXPECT_EQ(status.linesDropped, each.dropped);
+    EXPECT_EQ(status.damage, each.damage);
+    EXPECT_EQ(status.damageOffset, each.offset);
+    EXPECT_EQ(status.Complete(), each.damage == LoadDamage::kNone);
+  }
+}
+
+uint32_t RefuseConversion(const char*, int, uint16_t*, int, const int*) noexcept {
+  return 42;
+}
+
+TEST(Load, KeepsWhatCameBeforeAConversionFailed) {
+  const std::string binary = Image1_5(1, {{580, {{"/a", "x"}}}});
+  for (const std::string& image : {binary, std::string("\"$$$/a=a line of text\"\n")}) {
+    DictionaryTable table;
+    Load(table, "\"$$$/kept=a line of text\"");
+    const ConverterTable working = gConverterTable;
+    gConverterTable.multiByteToUnicode = RefuseConversion;
+    const int utf8 = 1;
+    try {
+      EXPECT_THROW(table.Translate("$$$/b=x", &utf8), OVErrException);
+      Load(table, image);
+      ADD_FAILURE() << "nothing was thrown";
+    } catch (const OVErrException& error) {
+      EXPECT_EQ(error.Code(), 42u);
+    }
+    gConverterTable = working;
+    EXPECT_EQ(table.LastLoad().damage, LoadDamage::kInterrupted);
+    EXPECT_EQ(Translated(table, "$$$/kept=none"), u"a line of text");
+    Load(table, image);
+    EXPECT_TRUE(table.LastLoad().Complete());
+  }
+}
+
+// Whatever allocation fails, the table keeps only whole entries, and the next load is as good as
+// new.
+TEST(Load, SurvivesEveryFailedAllocation) {
+  for (const std::string& image : ValidImages()) {
+    SlowTwin twin;
+    Contents possible;  // after the whole image or any number of its lines
+    for (size_t length = 1; length <= image.size(); ++length) {
+      if (length != image.size() && image[length - 1] != '\n') continue;
+      twin = {};
+      twin.Load(image.substr(0, length));
+      const Contents contents = twin.AllContents();
+      possible.insert(possible.end(), contents.begin(), contents.end());
+    }
+    size_t failures = 0;
+    for (bool failed = true; failed; failures += failed) {
+      DictionaryTable table;
+      boost::interprocess::ibufferstream stream(image.data(), image.size());
+      {
+        const AllocationMeter meter(failures + 1);
+        try {
+          table.Load(stream);
+          table.Translate("$$$/none=x^ny", nullptr);
+        } catch (const std::bad_alloc&) {
+        }
+        failed = meter.Failed();
+      }
+      for (const auto& entry : ContentsOf(table)) {
+        ASSERT_NE(std::find(possible.begin(), possible.end(), entry), possible.end());
+      }
+      Load(table, image);
+      for (const auto& [bucket, key, value] : twin.AllContents()) {
+        ASSERT_EQ(Translated(table, key.c_str()), twin.Translate(key));
+      }
+    }
+    EXPECT_GT(failures, 10u);
+  }
+}
+
+// Counts that promise the world.
+TEST(Load, AllocatesNoMoreThanTheImageJustifies) {
+  for (std::string image : ValidImages()) {
+    for (size_t at = 0; at + 4 <= image.size(); ++at) {
+      std::string promising = image;
+      promising.replace(at, 4, "\xFF\xFF\xFF\x7F");
+      boost::interprocess::ibufferstream stream(promising.data(), promising.size());
+      DictionaryTable table;
+      AllocationMeter meter;
+      table.Load(stream);
+      ASSERT_LT(meter.TotalBytes(), 4096 + 64 * image.size()) << at;
+    }
+  }
+}
+
+// Keys of which every one falls into the same bucket: loading them four times as often must not
+// take sixteen times as long.
+TEST(Load, TakesTimeLinearInTheImage) {
+  const auto secondsFor = [](int count) {
+    std::string image;
+    for (int i = 0; i < count; ++i) {
+      std::string key = "/App/Page/Dialog/Item000000000/Label";
+      const std::string number = std::to_string(i);
+      for (size_t digit = 0; digit < number.size(); ++digit) key[22 + digit] = number[digit];
+      image += "\"$$$" + key + "=x\"\n";
+    }
+    double best = 1e9;
+    for (int round = 0; round < 3; ++round) {
+      const auto start = std::chrono::steady_clock::now();
+      DictionaryTable table;
+      Load(table, image);
+      const std::chrono::duration<double> taken = std::chrono::steady_clock::now() - start;
+      best = std::min(best, taken.count());
+    }
+    return best;
+  };
+  EXPECT_LT(secondsFor(40000), 10 * secondsFor(10000));
+}
+
+}  // namespace

@@ -1,0 +1,161 @@
+"""Runs the kolvane command as its users do: test_kolvane.py COMMAND SAMPLES."""
+
+import contextlib
+import os
+import pathlib
+import signal
+import subprocess
+import sys
+import tempfile
+import unittest
+
+KOLVANE = sys.argv.pop(1)
+SAMPLES = pathlib.Path(sys.argv.pop(1))
+CANCEL = "$$$/Dialog/Cancel=Cancel"
+
+
+def run(*arguments, stdin=b"", **options):
+    """Returns the status, standard output and standard error."""
+    done = subprocess.run([KOLVANE, *map(str, arguments)], input=stdin, stderr=subprocess.PIPE,
+                          stdout=options.pop("stdout", subprocess.PIPE), timeout=60, **options)
+    return done.returncode, (done.stdout or b"").decode(), done.stderr.decode()
+
+
+def translate(*arguments, **options):
+    return run("translate", *arguments, **options)
+
+
+class Translate(unittest.TestCase):
+    def setUp(self):
+        self.folder = tempfile.TemporaryDirectory()
+        self.addCleanup(self.folder.cleanup)
+
+    def file(self, content, name="d.txt"):
+        path = pathlib.Path(self.folder.name, name)
+        path.write_bytes(content)
+        return path
+
+    def test_samples_in_every_form(self):
+        for name, cancel in {"de.txt": "Abbrechen", "fr.txt": "Annuler", "ja.txt": "キャンセル", "es.txt": "Cancelar",
+                             "pl.txt": "Anuluj", "it.txt": "Annulla", "it.bin": "Annulla"}.items():
+            with self.subTest(name):
+                self.assertEqual(translate("--dictionary", SAMPLES / name, CANCEL), (0, cancel + "\n", ""))
+
+    def test_dictionaries_before_defaults_before_default_text(self):
+        first = self.file(b'"$$$/a=first"\n"$$$/b=first"\n', "1")
+        second = self.file(b'"$$$/b=second"\n\n\n\n\n\n\n\n\n', "2")
+        fallback = self.file(b'"$$$/b=fallback"\n"$$$/c=fallback"\n', "3")
+        keys = [f"$$$/{name}=text" for name in "abcd"]
+        self.assertEqual(translate("--dictionary", first, "--default-dictionary", fallback, "--dictionary", second, *keys),
+                         (0, "first\nsecond\nfallback\ntext\n", ""))
+
+    def test_keys_are_taken_as_they_are(self):
+        keys = ["[a,b]=x", "[]", "{}", "", "/a=ä€𝄞", "-", "a=two\nlines"]
+        self.assertEqual(translate(*keys)[1], "x\n\n\n\nä€𝄞\n\ntwo\nlines\n")
+        self.assertEqual(translate("--nul", "a=1", "--", "--b=2", "--")[1], "1\0" + "2\0" + "\0")
+
+    def test_keys_on_standard_input(self):
+        long = b"x" * 300000
+        for options, stdin, expected in [([], b"", ""), ([], b"a=1\n\nb=2", "1\n\n2\n"), ([], b"a=1\r\nb=2\n", "1\n2\n"),
+                                         ([], b"a=" + long, long.decode() + "\n"),
+                                         (["--nul"], b"a=1\n\0\0b=2", "1\n\0\0" + "2\0")]:
+            self.assertEqual(translate(*options, stdin=stdin), (0, expected, ""))
+        self.assertEqual(translate("a=1", stdin=b"b=2\n")[1], "1\n")
+
+    def test_answers_come_while_the_input_stays_open(self):
+        with subprocess.Popen([KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE) as process:
+            for number in range(3):
+                process.stdin.write(b"a=%d\n" % number)
+                process.stdin.flush()
+                self.assertEqual(process.stdout.readline(), b"%d\n" % number)
+
+    def test_encodings(self):
+        utf8 = self.file('"$$$/a=Żółć"\n"$$$/b=x"\n'.encode())
+        marked = self.file('\ufeff"$$$/a=Żółć"\n'.encode(), "marked")
+        legacy = self.file('"$$$/a=Größe"\n"$$$/b=x"\n'.encode("cp1252"), "legacy")
+        binary = self.file(bytes.fromhex("4b6f6c76616e652042696e61727920466f726d6174010501"
+                                         "01000000020000000200000002000000440200002f61c3a4")
+                           .replace(b"\x44\x02\0\0", b"\x44\x02"), "binary")
+        for file, how, expected in [(utf8, "auto", "Żółć"), (utf8, "image", "Å»Ã³Å‚Ä‡"), (utf8, "utf-8", "Żółć"),
+                                    (marked, "auto", "Żółć"), (marked, "utf-8", "Żółć"), (legacy, "auto", "Größe"),
+                                    (legacy, "utf-8", "Gr\ufffd\ufffde"), (binary, "auto", "ä")]:
+            with self.subTest(file=file, how=how):
+                self.assertEqual(translate("--encoding", how, "--dictionary", file, "$$$/a=none"),
+                                 (0, expected + "\n", ""))
+
+    def test_warns_of_what_a_translator_forgives(self):
+        binary = (SAMPLES / "it.bin").read_bytes()
+        for content, warning in [
+                (b"", "the file is empty; nothing was loaded"),
+                (b'"$$$/a=b"', "the file is too short for a dictionary; nothing was loaded"),
+                (b"\n" * 30, "the file adds nothing"),
+                (b'"$$$/a=some text"\r\n\r\n\0rest', "the text ends at a zero character at the start of line 3; 1 entry was loaded"),
+                (b'"$$$/a=some text"\n"$/b=c"\n', "1 line was dropped: it begins with one or two dollar signs where none or three are due"),
+                (binary[:1500], "the image is cut short: byte "),
+                (binary[:21] + b"\2" + binary[22:], "byte 21: this version of the binary format is not supported; nothing was loaded"),
+        ]:
+            with self.subTest(warning):
+                path = self.file(content)
+                status, output, errors = translate("--dictionary", path, "$$$/x=still works")
+                self.assertEqual((status, output), (0, "still works\n"))
+                self.assertTrue(errors.startswith(f"kolvane: {path}: warning: {warning}"), errors)
+                self.assertEqual(errors.count("\n"), 1)
+
+    def test_unreadable_files(self):
+        missing = pathlib.Path(self.folder.name, "no\nsuch")
+        status, output, errors = translate("--dictionary", missing, "--default-dictionary", self.folder.name, "a=b")
+        self.assertEqual((status, output), (2, ""))
+        self.assertIn("no\\x0Asuch: No such file or directory\n", errors)
+        self.assertIn(f"{self.folder.name}: Is a directory\n", errors)
+        self.assertEqual(translate("--dictionary", "-", "$$$/a=b", stdin=b'"$$$/a=from standard input"\n')[1],
+                         "from standard input\n")
+
+    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
+    def test_output_that_cannot_be_written(self):
+        with open("/dev/full", "wb") as full:
+            for arguments in [["translate", "a=b"], ["--help"], ["--version"], ["translate", "--help"]]:
+                status, _, errors = run(*arguments, stdout=full)
+                self.assertEqual(status, 2)
+                self.assertIn("cannot write to standard output: No space left on device", errors)
+
+    def test_closed_pipe_is_quiet(self):
+        for ignored in (False, True):
+            disposition = signal.SIG_IGN if ignored else signal.SIG_DFL
+            with subprocess.Popen([KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE,
+                                  stderr=subprocess.PIPE, restore_signals=False,
+                                  preexec_fn=lambda: signal.signal(signal.SIGPIPE, disposition)) as process:
+                process.stdout.close()
+                with contextlib.suppress(BrokenPipeError), process.stdin as keys:
+                    keys.write(b"a=b\n" * 100000)
+                self.assertEqual(process.stderr.read(), b"")
+                self.assertEqual(process.wait(), 2 if ignored else -signal.SIGPIPE)
+
+    def test_help_and_wrong_use(self):
+        for arguments in [["--help"], ["help"], ["translate", "--help"], ["help", "translate"], ["--version"]]:
+            status, output, errors = run(*arguments)
+            self.assertEqual((status, errors), (0, ""), arguments)
+        self.assertEqual(run("help", "translate"), run("translate", "--help"))
+        self.assertRegex(run("--version")[1], r"^kolvane \d+\.\d+\.\d+\n.*1\.0 and 1\.5")
+        for arguments, hint in [([], "kolvane"), (["bogus"], "kolvane"), (["help", "bogus"], "kolvane"),
+                                (["translate", "--bogus", "x"], "kolvane translate"),
+                                (["translate", "x", "-n"], "kolvane translate"),
+                                (["translate", "--encoding", "x", "y"], "kolvane translate"),
+                                (["translate", "--dictionary"], "kolvane translate"),
+                                (["translate", "--dictionary", "-"], "kolvane translate"),
+                                (["translate", "--dictionary", "-", "--dictionary", "-", "x"], "kolvane translate")]:
+            status, output, errors = run(*arguments)
+            self.assertEqual((status, output), (2, ""), arguments)
+            self.assertRegex(errors, rf"^kolvane: .*\ntry '{hint} --help'\n$")
+
+    @unittest.skipUnless(hasattr(os, "openpty"), "no terminals")
+    def test_terminal_without_keys(self):
+        ours, terminal = os.openpty()
+        done = subprocess.run([KOLVANE, "translate"], stdin=terminal, capture_output=True, timeout=10)
+        os.close(ours)
+        os.close(terminal)
+        self.assertEqual(done.returncode, 2)
+        self.assertIn(b"try 'kolvane translate --help'", done.stderr)
+
+
+if __name__ == "__main__":
+    unittest.main()

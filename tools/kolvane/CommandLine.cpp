@@ -1,0 +1,61 @@
+#include "CommandLine.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <memory>
+#include <utility>
+
+#include "Messages.h"
+#include "StandardOutput.h"
+
+namespace {
+
+class HelpFormatter : public CLI::Formatter {
+ public:
+  HelpFormatter(std::string commandName, std::string commandOperands)
+      : name(std::move(commandName)), operands(std::move(commandOperands)) {
+    column_width(34);
+  }
+
+  std::string make_usage(const CLI::App*, std::string) const override {
+    return fmt::format("\nUsage: {} [OPTION]... {}\n", name, operands);
+  }
+
+ private:
+  std::string name;
+  std::string operands;
+};
+
+// Takes the first `--` out of what the options left; what stands before it must not look like an
+// option.
+std::vector<std::string> Operands(std::vector<std::string> left) {
+  const auto marker = std::find(left.begin(), left.end(), "--");
+  const auto stray = std::find_if(left.begin(), marker, [](const std::string& word) {
+    return word.size() > 1 && word.front() == '-';
+  });
+  if (stray != marker) throw UsageError(fmt::format("unknown option {}", Printable(*stray)));
+  if (marker != left.end()) left.erase(marker);
+  return left;
+}
+
+}  // namespace
+
+CommandLine::CommandLine(std::string name, std::string operands, std::string about)
+    : app(std::move(about), name) {
+  app.formatter(std::make_shared<HelpFormatter>(std::move(name), std::move(operands)));
+  app.allow_extras();
+  app.get_option("--help")->description("Print this help and exit");
+}
+
+std::vector<std::string> CommandLine::Parse(int argc, const char* const* argv) {
+  try {
+    app.parse(argc, argv);
+  } catch (const CLI::CallForHelp&) {
+    WriteOutput(app.help());
+    throw HelpPrinted();
+  } catch (const CLI::ParseError& error) {
+    throw UsageError(error.what());
+  }
+  return Operands(app.remaining());
+}

@@ -1,0 +1,21 @@
+// Dictionary files, and the images that translators are given of them.
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+enum class FileEncoding {
+  kAuto,   // kUTF8 for valid UTF-8 with a character beyond ASCII that is no binary dictionary,
+           // else kImage
+  kImage,  // the file's bytes exactly as they are
+  kUTF8    // text in UTF-8, handed over as UTF-16
+};
+
+struct ImageFile {
+  std::string name;   // as the user gave it; `-` is standard input
+  std::string bytes;  // the image
+};
+
+// Throws Failure, with the file's name and the system's reason, for a file that cannot be read, and
+// for one whose image would exceed the 2^31 - 1 bytes that a translator takes.
+ImageFile ReadImageFile(const std::string& name, FileEncoding encoding);

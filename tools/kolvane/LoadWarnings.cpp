@@ -1,0 +1,81 @@
+#include "LoadWarnings.h"
+
+#include <fmt/format.h>
+
+#include <cstdint>
+
+#include "Messages.h"
+
+namespace {
+
+// The number, from 1, of the line of a text image that holds the byte at `offset`. CR LF ends one
+// line.
+size_t LineAt(std::string_view image, TextEncoding encoding, uint64_t offset) {
+  const size_t unitSize = encoding == TextEncoding::kCodePage ? 1 : 2;
+  const size_t low = encoding == TextEncoding::kUTF16BE ? 1 : 0;
+  size_t line = 1;
+  uint32_t before = 0;
+  for (size_t at = 0; at + unitSize <= offset; at += unitSize) {
+    uint32_t unit = static_cast<uint8_t>(image[at + low]);
+    if (unitSize == 2) unit |= uint32_t{static_cast<uint8_t>(image[at + 1 - low])} << 8;
+    const bool separator = unitSize == 2 && (unit == 0x2028 || unit == 0x2029);
+    const bool afterReturn = unit == '\n' && before == '\r';
+    if ((unit == '\n' && !afterReturn) || unit == '\r' || separator) ++line;
+    before = unit;
+  }
+  return line;
+}
+
+std::string DamageText(const ImageFile& file, const LoadStatus& status) {
+  const uint64_t at = status.damageOffset;
+  switch (status.damage) {
+    case LoadDamage::kNone:
+      return {};
+    case LoadDamage::kInterrupted:
+      return "could not be loaded to its end";
+    case LoadDamage::kTooShort:
+      return file.bytes.empty() ? "the file is empty" : "the file is too short for a dictionary";
+    case LoadDamage::kZeroCharacter:
+      return fmt::format("the text ends at a zero character at the start of line {}",
+                         LineAt(file.bytes, status.encoding, at));
+    case LoadDamage::kShortRead:
+      return fmt::format("the image is cut short: byte {} begins what is not all there", at);
+    case LoadDamage::kUnsupportedVersion:
+      return fmt::format("byte {}: this version of the binary format is not supported", at);
+    case LoadDamage::kNoGroups:
+      return fmt::format("byte {}: the image is damaged, its group count is 0", at);
+    case LoadDamage::kBadCounts:
+      return fmt::format("byte {}: the image is damaged, a group's count is odd or decreases", at);
+    case LoadDamage::kBadBucket:
+      return fmt::format("byte {}: the image is damaged, a group's bucket does not exist", at);
+    case LoadDamage::kBadOffset:
+      return fmt::format("byte {}: the image is damaged, a group does not end at its offset", at);
+  }
+  return {};
+}
+
+std::string Loaded(uint32_t count) {
+  if (count == 0) return "nothing was loaded";
+  return count == 1 ? "1 entry was loaded" : fmt::format("{} entries were loaded", count);
+}
+
+}  // namespace
+
+std::vector<std::string> WarningsOf(const ImageFile& file, const LoadStatus& status) {
+  std::vector<std::string> warnings;
+  const auto warn = [&](std::string_view text) {
+    warnings.push_back(fmt::format("{}: warning: {}", Printable(file.name), text));
+  };
+  if (const std::string damage = DamageText(file, status); !damage.empty()) {
+    warn(fmt::format("{}; {}", damage, Loaded(status.entriesAdded)));
+  } else if (status.entriesAdded == 0) {
+    warn("the file adds nothing");
+  }
+  if (status.linesDropped != 0) {
+    warn(fmt::format("{} with one or two dollar signs where none or three are due",
+                     status.linesDropped == 1
+                         ? "1 line was dropped: it begins"
+                         : fmt::format("{} lines were dropped: they begin", status.linesDropped)));
+  }
+  return warnings;
+}

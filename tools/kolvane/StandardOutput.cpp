@@ -1,0 +1,31 @@
+#include "StandardOutput.h"
+
+#include <fmt/format.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstring>
+
+#include "Messages.h"
+
+namespace {
+
+void Require(bool written) {
+  if (written) return;
+  if (errno == EPIPE) throw ClosedPipe();
+  throw Failure(fmt::format("cannot write to standard output: {}", std::strerror(errno)));
+}
+
+}  // namespace
+
+void WriteOutput(std::string_view text) {
+  Require(std::fwrite(text.data(), 1, text.size(), stdout) == text.size());
+}
+
+void FlushOutput() {
+  Require(std::fflush(stdout) == 0);
+}
+
+void CloseOutput() {
+  Require(std::fclose(stdout) == 0);
+}

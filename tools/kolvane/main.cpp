@@ -1,0 +1,128 @@
+// The kolvane command: finds the subcommand, runs it, and turns whatever happens into a message and
+// an exit status.
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <exception>
+#include <new>
+#include <string>
+#include <string_view>
+
+#include "CommandLine.h"
+#include "Messages.h"
+#include "OVErrException.h"
+#include "StandardOutput.h"
+#include "TranslateCommand.h"
+
+namespace {
+
+struct Command {
+  const char* name;
+  const char* purpose;
+  ExitStatus (*run)(int argc, const char* const* argv);
+};
+
+constexpr Command kCommands[] = {
+    {"translate", "translate keys with dictionaries", RunTranslate},
+};
+
+constexpr const char* kHelp =
+    R"(Work with Kolvane dictionaries.
+
+Examples:
+  kolvane translate --dictionary de.txt '$$$/Dialog/Cancel=Cancel'
+  kolvane help translate
+
+Usage: kolvane COMMAND [ARGUMENT]...
+
+Commands:
+)";
+
+constexpr const char* kHelpEnd =
+    R"(
+Options:
+  -h,--help                   Print this help and exit
+  --version                   Print the version and exit
+
+'kolvane COMMAND --help' tells what a command does and takes.
+)";
+
+void PrintHelp() {
+  WriteOutput(kHelp);
+  for (const Command& command : kCommands) {
+    WriteOutput(fmt::format("  {:<27} {}\n", command.name, command.purpose));
+  }
+  WriteOutput(kHelpEnd);
+}
+
+void PrintVersion() {
+  WriteOutput(
+      fmt::format("kolvane {}\nreads binary dictionaries of versions 1.0 and 1.5, and "
+                  "writes none\n",
+                  KOLVANE_VERSION));
+}
+
+ExitStatus RunCommand(const Command& command, int argc, const char* const* argv) {
+  try {
+    return command.run(argc, argv);
+  } catch (const CommandLine::HelpPrinted&) {
+    return ExitStatus::kDone;
+  } catch (const UsageError& error) {
+    Say(fmt::format("{0}: {1}\ntry 'kolvane {0} --help'", command.name, error.what()));
+    return ExitStatus::kNotDone;
+  }
+}
+
+ExitStatus RunNamed(std::string_view name, int argc, const char* const* argv) {
+  for (const Command& command : kCommands) {
+    if (name == command.name) return RunCommand(command, argc, argv);
+  }
+  throw UsageError(fmt::format("unknown command '{}'", Printable(name)));
+}
+
+ExitStatus Run(int argc, const char* const* argv) {
+  if (argc < 2) throw UsageError("no command");
+  const std::string_view first = argv[1];
+  if (first == "--version") {
+    PrintVersion();
+    return ExitStatus::kDone;
+  }
+  if (first == "--help" || first == "-h" || (first == "help" && argc == 2)) {
+    PrintHelp();
+    return ExitStatus::kDone;
+  }
+  if (first == "help") {
+    const char* const askHelp[] = {argv[2], "--help"};
+    return RunNamed(argv[2], 2, askHelp);
+  }
+  return RunNamed(first, argc - 1, argv + 1);
+}
+
+// Every way that a run can fail ends here, as a message and a status.
+template <class Action>
+ExitStatus Guard(Action action) {
+  try {
+    return action();
+  } catch (const UsageError& error) {
+    Say(fmt::format("{}\ntry 'kolvane --help'", error.what()));
+  } catch (const ClosedPipe&) {
+  } catch (const OVErrException& error) {
+    Say(fmt::format("a text could not be converted (code {:#010x})", error.Code()));
+  } catch (const std::bad_alloc&) {
+    Say("out of memory");
+  } catch (const std::exception& error) {
+    Say(error.what());
+  }
+  return ExitStatus::kNotDone;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  const ExitStatus run = Guard([&] { return Run(argc, argv); });
+  const ExitStatus closed = Guard([] {
+    CloseOutput();
+    return ExitStatus::kDone;
+  });
+  return static_cast<int>(std::max(run, closed));
+}
