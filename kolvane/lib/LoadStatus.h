@@ -34,7 +34,7 @@ struct LoadStatus {
   uint32_t entriesAdded = 0;     // all that the load linked into the table
   uint32_t entriesReplaced = 0;  // those of them whose key the table held already: in text the
                                  // older entry is gone, in a binary image it stays, hidden
-  uint32_t linesDropped = 0;  // lines whose text begins with `$` or `$$` but not `$$$`
+  uint32_t linesDropped = 0;     // lines whose text begins with `$` or `$$` but not `$$$`
   LoadDamage damage = LoadDamage::kNone;
   uint64_t damageOffset = 0;  // bytes from the image's start to where the damage was first met: the
                               // field that is wrong or cut short; 0 for kInterrupted
