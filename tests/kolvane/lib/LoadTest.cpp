@@ -98,7 +98,7 @@ void ExpectLoadsAsTheTwinDoes(const std::string& image) {
 
 TEST(Load, TakesWholeImagesWhole) {
   for (const std::string& image : ValidImages()) {
-    SCOPED_TRACE(image);
+    SCOPED_TRACE(testing::PrintToString(image));
     ExpectLoadsAsTheTwinDoes(image);
     DictionaryTable table;
     Load(table, image);
@@ -111,7 +111,7 @@ TEST(Load, TakesWholeImagesWhole) {
 TEST(Load, SurvivesEveryPrefix) {
   for (const std::string& image : ValidImages()) {
     for (size_t length = 0; length < image.size(); ++length) {
-      SCOPED_TRACE(testing::Message() << length << " of " << image);
+      SCOPED_TRACE(testing::Message() << length << " of " << testing::PrintToString(image));
       ExpectLoadsAsTheTwinDoes(image.substr(0, length));
     }
   }
@@ -123,7 +123,8 @@ TEST(Load, SurvivesEveryChangedByte) {
       const char original = byte;
       for (int change = 1; change < 256; ++change) {
         byte = static_cast<char>(original ^ change);
-        SCOPED_TRACE(testing::Message() << &byte - image.data() << " of " << image);
+        SCOPED_TRACE(testing::Message()
+                     << &byte - image.data() << " of " << testing::PrintToString(image));
         ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(image));
       }
       byte = original;
