@@ -4,16 +4,14 @@
 // these functions are the system's; elsewhere a layer of ours keeps the same contract:
 //
 // * flags must be 0; counts are positive (a text's terminator is not looked for); the text is not
-// null.
+//   null.
 // * capacity 0 asks for the size: the result is the number of units (or bytes) that the whole text
 //   needs, and the output, which may be null, is left alone.
 // * Otherwise the text is converted into the output, which holds `capacity` units (or bytes) and
-// gets
-//   no terminator; the result is the number written.
+//   gets no terminator; the result is the number written.
 // * 0 means failure, and GetLastError tells why: kErrorInsufficientBuffer when the output is too
-// small
-//   (what it then holds is not defined), kErrorInvalidParameter when a rule above is broken or the
-//   size does not fit an int.
+//   small (what it then holds is not defined), kErrorInvalidParameter when a rule above is broken
+//   or the size does not fit an int.
 //
 // Damaged text never fails. Each maximal subpart of malformed UTF-8 becomes U+FFFD; an unpaired
 // surrogate becomes EF BF BD in UTF-8; a unit that windows-1252 lacks becomes '?'. The bytes 81,

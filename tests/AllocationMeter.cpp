@@ -66,3 +66,9 @@ void operator delete(void* block, size_t) noexcept {
 void operator delete[](void* block, size_t) noexcept {
   std::free(block);
 }
+void operator delete(void* block, const std::nothrow_t&) noexcept {
+  std::free(block);
+}
+void operator delete[](void* block, const std::nothrow_t&) noexcept {
+  std::free(block);
+}

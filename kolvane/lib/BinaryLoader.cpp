@@ -75,6 +75,11 @@ class Group {
     status.entriesReplaced += table.Splice(bucket, entries);
   }
 
+  // Whether an entry can be found in the group's bucket.
+  bool Suits(const DictionaryEntry& entry) const noexcept {
+    return bucket == entry.Hash(DictionaryTable::kBucketCount);
+  }
+
   void Append(std::unique_ptr<DictionaryEntry> entry) { entries.push_back(std::move(entry)); }
 
  private:
@@ -101,7 +106,7 @@ class BinaryLoader {
   // Whether the body was read to its end.
   bool Load();
 
-  // The first damage that Load met.
+  // What ended Load, or else the first damage that it met.
   LoadDamage Damage() const noexcept { return damage; }
   uint64_t DamageOffset() const noexcept { return damageOffset; }
 
@@ -111,8 +116,9 @@ class BinaryLoader {
   bool LoadGroups(const Tables1_5& tables);
   bool LoadBody1_0();
   bool LoadEntry1_0(Group& group);
-  bool ReadKey(uint32_t length) { return source.Read(keyBytes, length) || StopShort(); }
+  bool ReadKey(uint32_t length);
   bool ReadValue(uint32_t length) { return source.Read(valueBytes, length) || StopShort(); }
+  void AppendEntry(Group& group);
   std::unique_ptr<DictionaryEntry> MakeEntry();
 
   void CheckBucket(uint32_t bucket, uint64_t offset);
@@ -180,7 +186,7 @@ bool BinaryLoader::LoadGroups(const Tables1_5& tables) {
     for (; next < end; next += 2) {
       const uint8_t* const pair = &tables.lengths[size_t{4} * next];
       if (!ReadKey(Read32(pair)) || !ReadValue(Read32(pair + 4))) return false;
-      group.Append(MakeEntry());
+      AppendEntry(group);
     }
   }
   return true;
@@ -223,8 +229,20 @@ bool BinaryLoader::LoadEntry1_0(Group& group) {
   uint32_t valueLength = 0;
   if (!source.Read(valueLength)) return StopShort();
   if (!ReadValue(valueLength)) return false;
-  group.Append(MakeEntry());
+  AppendEntry(group);
   return true;
+}
+
+bool BinaryLoader::ReadKey(uint32_t length) {
+  status.damageOffset = source.Position();  // should the entry interrupt the load
+  return source.Read(keyBytes, length) || StopShort();
+}
+
+void BinaryLoader::AppendEntry(Group& group) {
+  const uint64_t entryAt = status.damageOffset;
+  auto entry = MakeEntry();
+  if (!group.Suits(*entry)) Note(LoadDamage::kWrongBucket, entryAt);
+  group.Append(std::move(entry));
 }
 
 std::unique_ptr<DictionaryEntry> BinaryLoader::MakeEntry() {
@@ -250,7 +268,8 @@ void BinaryLoader::Note(LoadDamage met, uint64_t offset) {
 }
 
 bool BinaryLoader::Stop(LoadDamage met, uint64_t offset) {
-  Note(met, offset);
+  damage = met;
+  damageOffset = offset;
   return false;
 }
 

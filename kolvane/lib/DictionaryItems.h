@@ -21,13 +21,12 @@ class HashItem {
   virtual uint32_t SerializedSize() const = 0;
 
   // Write, WriteKey and WriteValue write the item, its key or its value, and return the number of
-  // bytes written. In text form (binary is false) that is one line of UTF-16 in little-endian
-  // order,
-  // `"key=value"` CR LF, whose key WriteKey and whose rest WriteValue writes. In binary form keys
-  // are written as they are, values as UTF-16 in little-endian order where the selector is null,
-  // else as multibyte text in the code page that it names (Converters.h); lengths are not written.
-  // A text that cannot be converted throws OVErrException. Failures of the stream stay with the
-  // stream.
+  // bytes written. In text form (binary is false) that is one line of little-endian UTF-16,
+  // `"key=value"` CR LF, of which WriteKey writes what ends with the `=`, and WriteValue the rest.
+  // In binary form keys are written as they are, values as UTF-16 in little-endian order where the
+  // selector is null, else as multibyte text in the code page that it names (Converters.h); lengths
+  // are not written. A text that cannot be converted throws OVErrException. Failures of the stream
+  // stay with the stream.
   virtual uint32_t Write(std::ostream& out, bool binary, const int* selector) const = 0;
   virtual uint32_t WriteKey(std::ostream& out, bool binary, const int* selector) const;
   virtual uint32_t WriteValue(std::ostream& out, bool binary, const int* selector) const;

@@ -1,7 +1,6 @@
 // The road of an image into a dictionary.
 #include <algorithm>
 #include <array>
-#include <cstdio>
 #include <istream>
 #include <string_view>
 #include <utility>
@@ -28,6 +27,24 @@ Recognised Recognise(std::istream& image) {
   image.seekg(0);
   const bool isBinary = std::string_view(head.data(), head.size()) == kBinaryMagic;
   return isBinary ? Recognised::kBinary : Recognised::kText;
+}
+
+// Whether a text image, whose last line has been read, ended there and ended well.
+void CheckTextEnd(std::istream& image, TextEncoding encoding, LoadStatus& status) {
+  if (image.bad()) return;  // and leaves the load interrupted
+  const std::streamoff unitSize = encoding == TextEncoding::kCodePage ? 1 : 2;
+  const std::streamoff stop = image.good() ? std::streamoff{image.tellg()} : 0;
+  image.clear();
+  image.seekg(0, std::ios::end);
+  const std::streamoff end = image.tellg();
+  status.damage = LoadDamage::kNone;
+  if (stop != 0 && stop < end) {
+    status.damage = LoadDamage::kZeroCharacter;
+    status.damageOffset = static_cast<uint64_t>(stop - unitSize);
+  } else if (end % unitSize != 0) {
+    status.damage = LoadDamage::kHalfUnit;
+    status.damageOffset = static_cast<uint64_t>(end - 1);
+  }
 }
 
 }  // namespace
@@ -66,14 +83,7 @@ void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
         break;
     }
   }
-  lastLoad.damage = LoadDamage::kNone;
-  if (image.bad()) {
-    lastLoad.damage = LoadDamage::kInterrupted;
-  } else if (const auto end = image.tellg(); image.good() && image.peek() != EOF) {
-    lastLoad.damage = LoadDamage::kZeroCharacter;
-    const int zeroBytes = reader.Encoding() == TextEncoding::kCodePage ? 1 : 2;
-    lastLoad.damageOffset = static_cast<uint64_t>(end - std::streamoff{zeroBytes});
-  }
+  CheckTextEnd(image, reader.Encoding(), lastLoad);
 }
 
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {

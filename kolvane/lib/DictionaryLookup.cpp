@@ -17,7 +17,7 @@ void DictionaryTable::MakeDefault() noexcept {
 }
 
 TranslatedString DictionaryTable::Translate(const char* text, const int* selector) {
-  if (text == nullptr) return TranslatedString(KolvaneString());
+  if (text == nullptr || *text == 0) return TranslatedString(KolvaneString());
   return TranslatedString(Lookup({text, std::strlen(text)}, selector));
 }
 

@@ -52,7 +52,8 @@ class DictionaryTable {
 
   // Translates UTF-8 text of the form `$$$/Key=Default text`: the value that this table or else the
   // default dictionary has for the key, or else the default text, decoded. The result is empty when
-  // there is none of them, for null, and for a text that begins with `$` but not `$$$`.
+  // there is none of them, for null, for an empty text, and for one that begins with `$` but not
+  // `$$$`.
   //
   // The selector (Converters.h) says what the default text is encoded in; with null and 0 each of
   // its bytes becomes the unit of the same value. Keys are compared as bytes. Throws OVErrException

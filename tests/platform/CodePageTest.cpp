@@ -19,8 +19,7 @@ std::u16string Decoded(uint32_t codePage, const std::string& text) {
   const int count = static_cast<int>(text.size());
   const int size = platform::MultiByteToWideChar(codePage, 0, text.data(), count, nullptr, 0);
   std::vector<uint16_t> units(static_cast<size_t>(size));
-  EXPECT_EQ(size,
-            platform::MultiByteToWideChar(codePage, 0, text.data(), count, units.data(), size));
+  EXPECT_EQ(size, platform::MultiByteToWideChar(codePage, 0, text.data(), count, units.data(), size));
   return {units.begin(), units.end()};
 }
 
@@ -29,8 +28,7 @@ std::string Encoded(uint32_t codePage, const std::u16string& text) {
   const int count = static_cast<int>(units.size());
   const int size = platform::WideCharToMultiByte(codePage, 0, units.data(), count, nullptr, 0);
   std::string bytes(static_cast<size_t>(size), '\0');
-  EXPECT_EQ(size,
-            platform::WideCharToMultiByte(codePage, 0, units.data(), count, bytes.data(), size));
+  EXPECT_EQ(size, platform::WideCharToMultiByte(codePage, 0, units.data(), count, bytes.data(), size));
   return bytes;
 }
 
@@ -45,9 +43,8 @@ std::string ICUEncodedUTF8(const std::u16string& text) {
 }
 
 // Bytes around which UTF-8 changes its mind.
-constexpr unsigned char kEdges[] = {0x00, 0x41, 0x7F, 0x80, 0x8F, 0x90, 0x9F, 0xA0, 0xBF,
-                                    0xC0, 0xC1, 0xC2, 0xDF, 0xE0, 0xE1, 0xEC, 0xED, 0xEE,
-                                    0xEF, 0xF0, 0xF1, 0xF3, 0xF4, 0xF5, 0xFF};
+constexpr unsigned char kEdges[] = {0x00, 0x41, 0x7F, 0x80, 0x8F, 0x90, 0x9F, 0xA0, 0xBF, 0xC0, 0xC1, 0xC2, 0xDF,
+                                    0xE0, 0xE1, 0xEC, 0xED, 0xEE, 0xEF, 0xF0, 0xF1, 0xF3, 0xF4, 0xF5, 0xFF};
 
 // Calls `check` with every text of `length` characters of the alphabet.
 template <class Alphabet, class Text, class Check>
@@ -63,18 +60,15 @@ void ForEveryText(const Alphabet& alphabet, size_t length, Text& text, const Che
 TEST(CodePage, DecodesUTF8AsICUDoes) {
   for (size_t length = 1; length <= 4; ++length) {
     std::string text;
-    ForEveryText(kEdges, length, text,
-                 [&] { ASSERT_EQ(Decoded(kCodePageUTF8, text), ICUDecodedUTF8(text)); });
+    ForEveryText(kEdges, length, text, [&] { ASSERT_EQ(Decoded(kCodePageUTF8, text), ICUDecodedUTF8(text)); });
   }
 }
 
 TEST(CodePage, EncodesUTF8AsICUDoes) {
-  constexpr char16_t kUnits[] = {0,      0x7F,   0x80,   0x7FF,  0x800,  0xD7FF, 0xD800,
-                                 0xDBFF, 0xDC00, 0xDFFF, 0xE000, 0xFFFD, 0xFFFF, 'a'};
+  constexpr char16_t kUnits[] = {0, 0x7F, 0x80, 0x7FF, 0x800, 0xD7FF, 0xD800, 0xDBFF, 0xDC00, 0xDFFF, 0xE000, 0xFFFD, 0xFFFF, 'a'};
   for (size_t length = 1; length <= 4; ++length) {
     std::u16string text;
-    ForEveryText(kUnits, length, text,
-                 [&] { ASSERT_EQ(Encoded(kCodePageUTF8, text), ICUEncodedUTF8(text)); });
+    ForEveryText(kUnits, length, text, [&] { ASSERT_EQ(Encoded(kCodePageUTF8, text), ICUEncodedUTF8(text)); });
   }
 }
 
@@ -140,14 +134,12 @@ TEST(CodePage, RefusesEveryShortBuffer) {
   const auto byteCount = static_cast<int>(bytes.size());
   for (int capacity = 1; capacity < unitCount; ++capacity) {
     std::vector<uint16_t> exact(static_cast<size_t>(capacity));  // the sanitizer minds its end
-    EXPECT_EQ(0, platform::MultiByteToWideChar(kCodePageUTF8, 0, text.data(), byteCount,
-                                               exact.data(), capacity));
+    EXPECT_EQ(0, platform::MultiByteToWideChar(kCodePageUTF8, 0, text.data(), byteCount, exact.data(), capacity));
     EXPECT_EQ(platform::GetLastError(), platform::kErrorInsufficientBuffer);
   }
   for (int capacity = 1; capacity < byteCount; ++capacity) {
     std::vector<char> exact(static_cast<size_t>(capacity));
-    EXPECT_EQ(0, platform::WideCharToMultiByte(kCodePageUTF8, 0, units.data(), unitCount,
-                                               exact.data(), capacity));
+    EXPECT_EQ(0, platform::WideCharToMultiByte(kCodePageUTF8, 0, units.data(), unitCount, exact.data(), capacity));
     EXPECT_EQ(platform::GetLastError(), platform::kErrorInsufficientBuffer);
   }
 }
@@ -161,17 +153,12 @@ TEST(CodePage, RefusesWhatBreaksItsRules) {
     uint16_t* out;
     int capacity;
   } const cases[] = {
-      {1252, 0, "a", 1, units, 4},
-      {kCodePageUTF8, 8, "a", 1, units, 4},
-      {kCodePageUTF8, 0, nullptr, 1, units, 4},
-      {kCodePageUTF8, 0, "a", 0, units, 4},
-      {kCodePageUTF8, 0, "a", -1, units, 4},
-      {kCodePageUTF8, 0, "a", 1, nullptr, 4},
+      {1252, 0, "a", 1, units, 4},           {kCodePageUTF8, 8, "a", 1, units, 4},  {kCodePageUTF8, 0, nullptr, 1, units, 4},
+      {kCodePageUTF8, 0, "a", 0, units, 4},  {kCodePageUTF8, 0, "a", -1, units, 4}, {kCodePageUTF8, 0, "a", 1, nullptr, 4},
       {kCodePageUTF8, 0, "a", 1, units, -1},
   };
   for (const auto& each : cases) {
-    EXPECT_EQ(0, platform::MultiByteToWideChar(each.codePage, each.flags, each.text, each.count,
-                                               each.out, each.capacity));
+    EXPECT_EQ(0, platform::MultiByteToWideChar(each.codePage, each.flags, each.text, each.count, each.out, each.capacity));
     EXPECT_EQ(platform::GetLastError(), platform::kErrorInvalidParameter) << &each - cases;
   }
 }

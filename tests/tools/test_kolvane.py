@@ -57,6 +57,7 @@ class Translate(unittest.TestCase):
     def test_keys_on_standard_input(self):
         long = b"x" * 300000
         for options, stdin, expected in [([], b"", ""), ([], b"a=1\n\nb=2", "1\n\n2\n"), ([], b"a=1\r\nb=2\n", "1\n2\n"),
+                                         ([], b"a=1\0b=2\n", "1\n2\n"), (["--nul"], b"a=1\r\0", "1\r\0"),
                                          ([], b"a=" + long, long.decode() + "\n"),
                                          (["--nul"], b"a=1\n\0\0b=2", "1\n\0\0" + "2\0")]:
             self.assertEqual(translate(*options, stdin=stdin), (0, expected, ""))
@@ -65,7 +66,7 @@ class Translate(unittest.TestCase):
     def test_answers_come_while_the_input_stays_open(self):
         with subprocess.Popen([KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE) as process:
             for number in range(3):
-                process.stdin.write(b"a=%d\n" % number)
+                process.stdin.write(b"a=%d\na" % number)  # and the start of the next key
                 process.stdin.flush()
                 self.assertEqual(process.stdout.readline(), b"%d\n" % number)
 
@@ -91,6 +92,10 @@ class Translate(unittest.TestCase):
                 (b"\n" * 30, "the file adds nothing"),
                 (b'"$$$/a=some text"\r\n\r\n\0rest', "the text ends at a zero character at the start of line 3; 1 entry was loaded"),
                 (b'"$$$/a=some text"\n"$/b=c"\n', "1 line was dropped: it begins with one or two dollar signs where none or three are due"),
+                ('\ufeff"$$$/a=1"\r\n\u2028"$$$/b=2"\n\0x'.encode("utf-16-be"),
+                 "the text ends at a zero character at the start of line 4; 2 entries were loaded"),
+                ('\ufeff"$$$/a=some text"\n'.encode("utf-16-le") + b"\n",
+                 "the text is cut short: byte 38 is half a character; 1 entry was loaded"),
                 (binary[:1500], "the image is cut short: byte "),
                 (binary[:21] + b"\2" + binary[22:], "byte 21: this version of the binary format is not supported; nothing was loaded"),
         ]:
@@ -109,6 +114,19 @@ class Translate(unittest.TestCase):
         self.assertIn(f"{self.folder.name}: Is a directory\n", errors)
         self.assertEqual(translate("--dictionary", "-", "$$$/a=b", stdin=b'"$$$/a=from standard input"\n')[1],
                          "from standard input\n")
+
+    def test_unreadable_keys(self):
+        folder = os.open(self.folder.name, os.O_RDONLY)
+        self.addCleanup(os.close, folder)
+        done = subprocess.run([KOLVANE, "translate"], stdin=folder, capture_output=True, timeout=60)
+        self.assertEqual((done.returncode, done.stderr), (2, b"kolvane: cannot read standard input\n"))
+
+    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
+    def test_messages_that_cannot_be_written(self):
+        with open("/dev/full", "wb") as full:
+            for arguments, status, output in [(["bogus"], 2, b""), (["translate", "--dictionary", "/dev/null", "a=b"], 0, b"b\n")]:
+                done = subprocess.run([KOLVANE, *arguments], stdout=subprocess.PIPE, stderr=full, timeout=60)
+                self.assertEqual((done.returncode, done.stdout), (status, output))
 
     @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
     def test_output_that_cannot_be_written(self):
@@ -140,12 +158,14 @@ class Translate(unittest.TestCase):
                                 (["translate", "--bogus", "x"], "kolvane translate"),
                                 (["translate", "x", "-n"], "kolvane translate"),
                                 (["translate", "--encoding", "x", "y"], "kolvane translate"),
+                                (["translate", "--encoding", "a\nb\u009b", "y"], "kolvane translate"),
                                 (["translate", "--dictionary"], "kolvane translate"),
+                                (["translate", "--dictionary=", "x"], "kolvane translate"),
                                 (["translate", "--dictionary", "-"], "kolvane translate"),
                                 (["translate", "--dictionary", "-", "--dictionary", "-", "x"], "kolvane translate")]:
             status, output, errors = run(*arguments)
             self.assertEqual((status, output), (2, ""), arguments)
-            self.assertRegex(errors, rf"^kolvane: .*\ntry '{hint} --help'\n$")
+            self.assertRegex(errors, rf"^kolvane: [^\x00-\x1f\x7f-\x9f]*\ntry '{hint} --help'\n$")
 
     @unittest.skipUnless(hasattr(os, "openpty"), "no terminals")
     def test_terminal_without_keys(self):

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <memory>
+#include <string_view>
 #include <utility>
 
 #include "Messages.h"
@@ -39,6 +40,16 @@ std::vector<std::string> Operands(std::vector<std::string> left) {
   return left;
 }
 
+// The parser would take the word after `--option=` for the value.
+void RefuseEmptyValues(int argc, const char* const* argv) {
+  for (int i = 1; i < argc && std::string_view(argv[i]) != "--"; ++i) {
+    const std::string_view word = argv[i];
+    if (word.starts_with("--") && word.ends_with("=")) {
+      throw UsageError(fmt::format("{} lacks its value", Printable(word)));
+    }
+  }
+}
+
 }  // namespace
 
 CommandLine::CommandLine(std::string name, std::string operands, std::string about)
@@ -49,13 +60,14 @@ CommandLine::CommandLine(std::string name, std::string operands, std::string abo
 }
 
 std::vector<std::string> CommandLine::Parse(int argc, const char* const* argv) {
+  RefuseEmptyValues(argc, argv);
   try {
     app.parse(argc, argv);
   } catch (const CLI::CallForHelp&) {
     WriteOutput(app.help());
     throw HelpPrinted();
   } catch (const CLI::ParseError& error) {
-    throw UsageError(error.what());
+    throw UsageError(Printable(error.what()));
   }
   return Operands(app.remaining());
 }

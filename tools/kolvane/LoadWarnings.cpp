@@ -38,16 +38,21 @@ std::string DamageText(const ImageFile& file, const LoadStatus& status) {
     case LoadDamage::kZeroCharacter:
       return fmt::format("the text ends at a zero character at the start of line {}",
                          LineAt(file.bytes, status.encoding, at));
+    case LoadDamage::kHalfUnit:
+      return fmt::format("the text is cut short: byte {} is half a character", at);
     case LoadDamage::kShortRead:
       return fmt::format("the image is cut short: byte {} begins what is not all there", at);
     case LoadDamage::kUnsupportedVersion:
       return fmt::format("byte {}: this version of the binary format is not supported", at);
     case LoadDamage::kNoGroups:
-      return fmt::format("byte {}: the image is damaged, its group count is 0", at);
+      return fmt::format("byte {}: the image is damaged, its count of groups is 0", at);
     case LoadDamage::kBadCounts:
       return fmt::format("byte {}: the image is damaged, a group's count is odd or decreases", at);
     case LoadDamage::kBadBucket:
       return fmt::format("byte {}: the image is damaged, a group's bucket does not exist", at);
+    case LoadDamage::kWrongBucket:
+      return fmt::format("byte {}: the image is damaged, a key is filed where it is never found",
+                         at);
     case LoadDamage::kBadOffset:
       return fmt::format("byte {}: the image is damaged, a group does not end at its offset", at);
   }

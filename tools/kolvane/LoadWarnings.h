@@ -7,6 +7,6 @@
 #include "ImageFile.h"
 #include "LoadStatus.h"
 
-// One line for each: the file is empty or adds nothing, is cut short or damaged, lines were
-// dropped. Each names the file, the reason and the place.
+// One line for each, naming the file and the reason: the file is empty or adds nothing, is cut
+// short or damaged (with the place), lines were dropped (with their number).
 std::vector<std::string> WarningsOf(const ImageFile& file, const LoadStatus& status);

@@ -4,18 +4,37 @@
 
 #include <cstdio>
 
+namespace {
+
+bool IsControl(unsigned char byte) {
+  return byte < 0x20 || byte == 0x7F;
+}
+
+// The controls from U+0080 to U+009F take two bytes.
+bool IsControlPair(unsigned char first, unsigned char second) {
+  return first == 0xC2 && second >= 0x80 && second < 0xA0;
+}
+
+}  // namespace
+
 void Say(std::string_view message) {
-  fmt::print(stderr, "kolvane: {}\n", message);
+  const std::string line = fmt::format("kolvane: {}\n", message);
+  std::fwrite(line.data(), 1, line.size(), stderr);
 }
 
 std::string Printable(std::string_view text) {
   std::string printable;
-  for (const char character : text) {
-    const auto byte = static_cast<unsigned char>(character);
-    if (byte < 0x20 || byte == 0x7F) {
-      printable += fmt::format("\\x{:02X}", byte);
+  const auto byteAt = [text](size_t at) -> unsigned char {
+    return at < text.size() ? static_cast<unsigned char>(text[at]) : '\0';
+  };
+  for (size_t at = 0; at < text.size(); ++at) {
+    if (IsControlPair(byteAt(at), byteAt(at + 1))) {
+      printable += fmt::format("\\x{:02X}\\x{:02X}", byteAt(at), byteAt(at + 1));
+      ++at;
+    } else if (IsControl(byteAt(at))) {
+      printable += fmt::format("\\x{:02X}", byteAt(at));
     } else {
-      printable += character;
+      printable += text[at];
     }
   }
   return printable;

@@ -13,6 +13,7 @@ class Failure : public std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
+// Where standard error cannot be written, the message is lost and nothing else.
 void Say(std::string_view message);
 
 // The text with its control characters written as escapes, so that a message stays one line.

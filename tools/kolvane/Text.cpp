@@ -1,5 +1,8 @@
 #include "Text.h"
 
+#include <algorithm>
+#include <cstddef>
+
 #include "Converters.h"
 
 namespace {
@@ -23,7 +26,13 @@ std::vector<uint16_t> ToUTF16(std::string_view text) {
   return {units.Data(), units.Data() + units.Length()};
 }
 
-// Whatever is malformed comes back as the replacement character.
+// Whatever is malformed becomes a replacement character beside those that the text holds itself.
 bool IsValidUTF8(std::string_view text) {
-  return ToUTF8(ToUTF16(text)) == text;
+  constexpr std::string_view kReplacement = "\xEF\xBF\xBD";
+  std::ptrdiff_t own = 0;
+  for (size_t at = text.find(kReplacement); at != text.npos; at = text.find(kReplacement, at + 3)) {
+    ++own;
+  }
+  const std::vector<uint16_t> units = ToUTF16(text);
+  return std::count(units.begin(), units.end(), uint16_t{0xFFFD}) == own;
 }

@@ -7,8 +7,8 @@
 #include <string_view>
 #include <vector>
 
-// Damaged text is replaced as translations replace it. A text of 2^31 - 1 bytes or units or more
-// throws OVErrException.
+// Damaged text is replaced as translations replace it. Throws OVErrException where the text or the
+// result has more than 2^31 - 1 bytes or units.
 std::string ToUTF8(std::span<const uint16_t> units);
 std::vector<uint16_t> ToUTF16(std::string_view text);
 

@@ -6,6 +6,7 @@
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <iostream>
 #include <map>
+#include <new>
 #include <string>
 #include <vector>
 
@@ -89,6 +90,9 @@ bool LoadAll(const std::vector<std::string>& names, FileEncoding encoding,
     } catch (const Failure& failure) {
       Say(failure.what());
       readAll = false;
+    } catch (const std::bad_alloc&) {
+      Say(fmt::format("{}: out of memory", Printable(name)));
+      readAll = false;
     }
   }
   return readAll;
@@ -103,15 +107,32 @@ std::string Translation(KolvaneDictionary& dictionary, const std::string& key) {
   return ToUTF8(units);
 }
 
-void TranslateInput(KolvaneDictionary& dictionary, char ending) {
-  std::ios::sync_with_stdio(false);
-  for (std::string key; std::getline(std::cin, key, ending);) {
-    if (ending == '\n' && key.ends_with('\r')) key.pop_back();
-    WriteOutput(Translation(dictionary, key) + ending);
-    // Whoever waits for an answer before asking on gets it.
-    if (std::cin.rdbuf()->in_avail() <= 0) FlushOutput();
+// Reads up to the next line end or NUL (with `nul`, to the next NUL), which ends the key and starts
+// none. Returns false at the end of the input. Whoever waits for an answer before asking on gets
+// it: nothing stays unwritten while there is nothing to read.
+bool ReadKey(std::streambuf& input, bool nul, std::string& key) {
+  constexpr int kEnd = std::char_traits<char>::eof();
+  key.clear();
+  for (;;) {
+    if (input.in_avail() <= 0) FlushOutput();
+    const int character = input.sbumpc();
+    if (character == kEnd) return !key.empty();
+    if (character == '\0' || (character == '\n' && !nul)) break;
+    key += static_cast<char>(character);
   }
-  if (std::cin.bad()) throw Failure("cannot read standard input");
+  if (!nul && key.ends_with('\r')) key.pop_back();
+  return true;
+}
+
+void TranslateInput(KolvaneDictionary& dictionary, bool nul, char ending) {
+  std::ios::sync_with_stdio(false);
+  try {
+    for (std::string key; ReadKey(*std::cin.rdbuf(), nul, key);) {
+      WriteOutput(Translation(dictionary, key) + ending);
+    }
+  } catch (const std::ios_base::failure&) {
+    throw Failure("cannot read standard input");
+  }
 }
 
 }  // namespace
@@ -136,6 +157,6 @@ ExitStatus RunTranslate(int argc, const char* const* argv) {
 
   const char ending = request.nul ? '\0' : '\n';
   for (const std::string& key : request.keys) WriteOutput(Translation(dictionary, key) + ending);
-  if (request.keys.empty()) TranslateInput(dictionary, ending);
+  if (request.keys.empty()) TranslateInput(dictionary, request.nul, ending);
   return ExitStatus::kDone;
 }

@@ -22,7 +22,7 @@ std::string ReadFile(const std::filesystem::path& path) {
 
 TEST(Dictionary, Translates) {
   DictionaryTable table, other;
-  Load(table, "\"$$$/a=Hello\"\n\"$$$/both=own\"\n\"$$$/empty=\"\n");
+  Load(table, "\"$$$/a=Hello\"\n\"$$$/both=own\"\n\"$$$/empty=\"\n\"$$$=no key\"\n");
   Load(table, Image1_5(0, Grouped({{"/raw", Bytes(u"^n")}})));
   Load(other, "\"$$$/both=default\"\n\"$$$/other=from default\"\n");
   other.MakeDefault();
@@ -34,8 +34,8 @@ TEST(Dictionary, Translates) {
       {"", u""},
       {"$$", u""},
       {"$x=abc", u""},
-      {"$$$", u""},
-      {"$$$=x", u"x"},
+      {"$$$", u"no key"},
+      {"$$$=x", u"no key"},
       {"$$$/a=Fallback", u"Hello"},
       {"/a=Fallback", u"Hello"},
       {"$$$/a", u"Hello"},
@@ -48,11 +48,10 @@ TEST(Dictionary, Translates) {
       {"$$$/raw=x", u"^n"},
       {"$$$/k=\xE2\x82\xAC #{euro}", u"\u20AC \u20AC"},
   };
-  for (const auto& each : cases)
-    EXPECT_EQ(Translated(table, each.text), each.translation) << &each - cases;
+  for (const auto& each : cases) EXPECT_EQ(Translated(table, each.text), each.translation) << &each - cases;
   EXPECT_EQ(Translated(other, "$$$/a=x"), u"x");
   EXPECT_EQ(Translated(other, "$$$/other=x"), u"from default");
-  EXPECT_EQ(Translated(table, "$$$/k=\xE9^n", 0), u"\u00E9\n");
+  EXPECT_EQ(Translated(table, "$$$/k=\x80^n", 0), u"\u0080\n");
   EXPECT_EQ(Translated(table, "$$$/k=\x80", 2), u"\u20AC");
   EXPECT_EQ(Text(KolvaneString()), Translated(table, "$$$/empty=x"));
 }
@@ -91,15 +90,16 @@ TEST(TranslatedString, CopiesWhatFits) {
   EXPECT_EQ(text.BufferSize(), 4u);
   for (uint32_t capacity = 0; capacity <= 5; ++capacity) {
     std::vector<uint16_t> buffer(5, 'x');
-    const auto copy = [&](bool throwIfShort) {
-      text.CopyTo(buffer.data(), capacity, throwIfShort);
-    };
+    const auto copy = [&](bool throwIfShort) { text.CopyTo(buffer.data(), capacity, throwIfShort); };
     EXPECT_NO_THROW(copy(false));
-    if (capacity < 4) {
-      EXPECT_THROW(copy(true), OVErrException);
+    try {
+      copy(true);
+      EXPECT_GE(capacity, 4u);
+    } catch (const OVErrException& error) {
+      EXPECT_LT(capacity, 4u);
+      EXPECT_EQ(error.Code(), kErrorBufferTooSmall);
     }
-    std::u16string expected =
-        capacity == 0 ? u"" : std::u16string(u"abc").substr(0, capacity - 1) + u'\0';
+    std::u16string expected = capacity == 0 ? u"" : std::u16string(u"abc").substr(0, capacity - 1) + u'\0';
     expected.resize(5, u'x');
     EXPECT_EQ(buffer, Units(expected)) << capacity;
   }
@@ -119,8 +119,7 @@ void ExpectSameAnswersAsBinary(const std::filesystem::path& path) {
   ASSERT_EQ(contents, twin.AllContents());
   std::vector<ImageGroup> groups;
   for (const auto& [bucket, key, value] : contents) {
-    if (groups.empty() || groups.back().bucket != bucket)
-      groups.push_back({static_cast<uint16_t>(bucket), {}});
+    if (groups.empty() || groups.back().bucket != bucket) groups.push_back({static_cast<uint16_t>(bucket), {}});
     groups.back().entries.emplace_back(key, Bytes(value));
   }
   for (const std::string& binary : {Image1_5(0, groups), Image1_0(0, groups)}) {
@@ -128,8 +127,7 @@ void ExpectSameAnswersAsBinary(const std::filesystem::path& path) {
     Load(table, binary);
     ASSERT_TRUE(table.LastLoad().Complete());
     ASSERT_EQ(ContentsOf(table), contents);
-    for (const auto& [bucket, key, value] : contents)
-      ASSERT_EQ(Translated(table, key.c_str()), value);
+    for (const auto& [bucket, key, value] : contents) ASSERT_EQ(Translated(table, key.c_str()), value);
   }
 }
 
@@ -151,8 +149,7 @@ TEST(Dictionary, SamplesSayWhatTheirTwinsSay) {
   Load(text, ReadFile(samples / "it.txt"));
   Load(binary, ReadFile(samples / "it.bin"));
   EXPECT_TRUE(binary.LastLoad().Complete());
-  for (const auto& [bucket, key, value] : ContentsOf(text))
-    EXPECT_EQ(Translated(binary, key.c_str()), value);
+  for (const auto& [bucket, key, value] : ContentsOf(text)) EXPECT_EQ(Translated(binary, key.c_str()), value);
   EXPECT_EQ(binary.LastLoad().entriesAdded, text.LastLoad().entriesAdded);
 }
 

@@ -20,8 +20,7 @@ ByteRunKey Key(const std::string& key, bool copy = true) {
 
 std::unique_ptr<DictionaryEntry> Entry(const std::string& key, const std::u16string& value) {
   const std::string bytes = Bytes(value);
-  return std::make_unique<DictionaryEntry>(Key(key), reinterpret_cast<const uint8_t*>(bytes.data()),
-                                           static_cast<uint32_t>(bytes.size()));
+  return std::make_unique<DictionaryEntry>(Key(key), reinterpret_cast<const uint8_t*>(bytes.data()), static_cast<uint32_t>(bytes.size()));
 }
 
 class Mortal : public RefCountObj {
@@ -53,11 +52,11 @@ TEST(KolvaneString, SharesItsBytes) {
   {
     KolvaneString copy(odd);
     other = copy;
-    copy = *&copy;
     other = copy;
     EXPECT_EQ(other.Data(), odd.Data());
     odd = KolvaneString();
   }
+  other = *&other;  // the only handle by now
   EXPECT_EQ(Text(other), u"ab");
   EXPECT_EQ(odd.Data(), nullptr);
   EXPECT_EQ(odd.Length(), 0u);
@@ -109,13 +108,16 @@ TEST(DictionaryEntry, WritesItself) {
     const auto entry = Entry(each.key, each.value);
     std::ostringstream whole, parts;
     EXPECT_EQ(entry->Write(whole, each.binary, each.selector), each.written.size());
-    EXPECT_EQ(entry->WriteKey(parts, each.binary, each.selector) +
-                  entry->WriteValue(parts, each.binary, each.selector),
+    EXPECT_EQ(entry->WriteKey(parts, each.binary, each.selector) + entry->WriteValue(parts, each.binary, each.selector),
               each.written.size());
     EXPECT_EQ(whole.str(), each.written);
     EXPECT_EQ(parts.str(), each.written);
   }
   EXPECT_EQ(Entry("/abc", u"xyz")->SerializedSize(), 10u);
+  std::ostringstream odd;
+  const uint8_t bytes[] = {'H', 0, 'i'};
+  DictionaryEntry(Key("/a"), bytes, 3).Write(odd, true, nullptr);
+  EXPECT_EQ(odd.str(), std::string("/aH\0i", 5));
 }
 
 // Random inserts, detaches and splices of keys that crowd two buckets, against plain lists. Every
@@ -123,8 +125,7 @@ TEST(DictionaryEntry, WritesItself) {
 TEST(DictionaryTable, FindsWhatAWalkOfTheChainFinds) {
   std::vector<std::string> keys;
   for (size_t i = 0; i < 40; ++i) {
-    keys.push_back("0_2_4_" + std::string(i % 2, 'x') + "6_" + static_cast<char>('a' + i / 2) +
-                   "_");
+    keys.push_back("0_2_4_" + std::string(i % 2, 'x') + "6_" + static_cast<char>('a' + i / 2) + "_");
   }
   DictionaryTable table;
   std::map<uint32_t, std::vector<std::pair<std::string, std::u16string>>> twin;
@@ -139,8 +140,7 @@ TEST(DictionaryTable, FindsWhatAWalkOfTheChainFinds) {
       chain.insert(chain.begin(), {key, value});
     } else if (choice == 2) {
       const std::string& second = keys[random() % keys.size()];  // perhaps in a bucket not its own
-      std::unique_ptr<DictionaryEntry> group[] = {Entry(key, value), Entry(second, u"2"),
-                                                  Entry(key, u"3")};
+      std::unique_ptr<DictionaryEntry> group[] = {Entry(key, value), Entry(second, u"2"), Entry(key, u"3")};
       table.Splice(BucketOf(key), group);
       chain.insert(chain.begin(), {{key, value}, {second, u"2"}, {key, u"3"}});
     } else {
@@ -187,8 +187,7 @@ TEST(Converters, GuardTheirBuffers) {
   };
   for (int room = 0; room <= 8; ++room) {
     std::vector<char> exact(static_cast<size_t>(room));
-    EXPECT_EQ(codeFor(exact.data(), units.size(), room), room < size ? kErrorBufferTooSmall : 0)
-        << room;
+    EXPECT_EQ(codeFor(exact.data(), units.size(), room), room < size ? kErrorBufferTooSmall : 0) << room;
     if (room >= size) {
       EXPECT_STREQ(exact.data(), "\xE2\x82\xACuro");
     }
@@ -198,12 +197,57 @@ TEST(Converters, GuardTheirBuffers) {
   EXPECT_EQ(codeFor(&one, 0, 1), 0u);
   EXPECT_EQ(one, 0);
 
+  // More than an int counts is refused before any of it is looked at.
+  EXPECT_THROW(CountUnicode("x", size_t{1} << 31), OVErrException);
+  EXPECT_THROW(CountMultiByte(units.data(), size_t{1} << 31), OVErrException);
+
   UnicodeBuffer buffer;
   ConvertToUnicode("", 0, buffer);
   EXPECT_EQ(buffer.Length(), 0u);
   ConvertToUnicode("\x80uro", 4, buffer, &other);
   EXPECT_EQ(buffer.Length(), 4u);
   EXPECT_EQ(buffer.Data()[0], 0x20AC);
+}
+
+uint32_t FailToCount(const char*, int, int* count, const int*) noexcept {
+  return *count = 0, 1;
+}
+uint32_t FailToDecode(const char*, int, uint16_t*, int, const int*) noexcept {
+  return 2;
+}
+uint32_t FailToMeasure(const uint16_t*, int, int* count, const int*) noexcept {
+  return *count = 0, 3;
+}
+uint32_t FailToEncode(const uint16_t*, int, char*, int, int* written, const int*) noexcept {
+  return *written = 0, 4;
+}
+
+TEST(Converters, CallThroughTheTableAndThrowItsCodes) {
+  const ConverterTable working = gConverterTable;
+  UnicodeBuffer buffer;
+  char bytes[8];
+  const uint16_t unit = 'x';
+  const auto codeOf = [](const auto& conversion) {
+    try {
+      conversion();
+    } catch (const OVErrException& error) {
+      return error.Code();
+    }
+    return 0u;
+  };
+  const auto decode = [&] { ConvertToUnicode("text", 4, buffer); };
+  gConverterTable.multiByteToUnicode = FailToDecode;
+  EXPECT_EQ(codeOf(decode), 2u);
+  EXPECT_EQ(buffer.Length(), 4u);  // the counted length, all the same
+  gConverterTable.multiByteToUnicodeLength = FailToCount;
+  EXPECT_EQ(codeOf(decode), 1u);
+  gConverterTable.unicodeToMultiByteLength = FailToMeasure;
+  EXPECT_EQ(codeOf([&] { CountMultiByte(&unit, 1); }), 3u);
+  gConverterTable.unicodeToMultiByte = FailToEncode;
+  EXPECT_EQ(codeOf([&] { ConvertToMultiByte(&unit, 1, bytes, 8); }), 4u);
+  gConverterTable = working;
+  EXPECT_EQ(MultiByteToUnicode(nullptr, 1, buffer.Data(), 8, nullptr), kErrorConversionFailed);
+  EXPECT_EQ(MultiByteToUnicode("text", 4, buffer.Data(), 3, nullptr), kErrorBufferTooSmall);
 }
 
 TEST(GrowableBuffer, GrowsByHalfAndKeepsWhatItHolds) {

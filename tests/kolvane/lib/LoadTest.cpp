@@ -41,10 +41,7 @@ TEST(DictionaryReader, DeliversLines) {
       {"ab\0c\n\0d"s, TextEncoding::kCodePage, {u"ab", u"c"}, {u"d"}},
       {"a\0b\0\n\0"s, TextEncoding::kCodePage, {u"a", u"b", u""}, {}},
       {"\xEF\xBB\xBF", TextEncoding::kCodePage, {u"ï»¿"}, {}},
-      {LittleEndianImage(u"a\u2028b\u2029c\r\n\nd"),
-       TextEncoding::kUTF16LE,
-       {u"a", u"b", u"c", u"", u"", u"d"},
-       {}},
+      {LittleEndianImage(u"a\u2028b\u2029c\r\n\nd"), TextEncoding::kUTF16LE, {u"a", u"b", u"c", u"", u"", u"d"}, {}},
       {BigEndianImage(u"a\u0A0D\nb"), TextEncoding::kUTF16BE, {u"a\u0A0D", u"b"}, {}},
       {LittleEndianImage(u"a") + "\0\0b\0\n\0\0\0c"s, TextEncoding::kUTF16LE, {u"a", u"b"}, {u"c"}},
       {BigEndianImage(u"a") + "b", TextEncoding::kUTF16BE, {u"a\u6200"}, {}},
@@ -66,19 +63,13 @@ TEST(DictionaryReader, DeliversLines) {
 
 // The same dictionary in every form an image can have.
 std::vector<std::string> ValidImages() {
-  const std::u16string text =
-      u"\"$$$/a=H\u00E4\"\r\n\n\"$$$/b=x^ny\" z\n\"$$/c=d\"\n\"$$$/a=\u20AC\"";
+  const std::u16string text = u"\"$$$/a=H\u00E4\"\r\n\n\"$$$/b=x^ny\" z\n\"$$/c=d\"\n\"$$$/a=\u20AC\"";
   std::string codePage;
   for (const char16_t unit : text) codePage += unit == u'\u20AC' ? '\x80' : static_cast<char>(unit);
   std::vector<std::string> images = {LittleEndianImage(text), BigEndianImage(text), codePage};
   for (const int encoding : {0, 1, 2}) {
-    const std::string value = encoding == 0   ? Bytes(u"H\u00E4")
-                              : encoding == 1 ? "H\xC3\xA4"
-                                              : "H\xE4";
-    const std::vector<ImageGroup> groups = {{580, {{"/a", value}, {"/a", ""}}},
-                                            {581, {{"/b", value}, {"/a", value}}},
-                                            {7, {}},
-                                            {580, {{"/a", value}}}};
+    const std::string value = encoding == 0 ? Bytes(u"H\u00E4") : encoding == 1 ? "H\xC3\xA4" : "H\xE4";
+    const std::vector<ImageGroup> groups = {{580, {{"/a", value}, {"/a", ""}}}, {581, {{"/b", value}}}, {7, {}}, {580, {{"/a", value}}}};
     images.push_back(Image1_5(encoding, groups));
     images.push_back(Image1_0(encoding, groups));
   }
@@ -123,8 +114,7 @@ TEST(Load, SurvivesEveryChangedByte) {
       const char original = byte;
       for (int change = 1; change < 256; ++change) {
         byte = static_cast<char>(original ^ change);
-        SCOPED_TRACE(testing::Message()
-                     << &byte - image.data() << " of " << testing::PrintToString(image));
+        SCOPED_TRACE(testing::Message() << &byte - image.data() << " of " << testing::PrintToString(image));
         ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(image));
       }
       byte = original;
@@ -137,8 +127,7 @@ TEST(Load, TakesRandomTextsAsTheTwinDoes) {
   std::mt19937 random(4);
   for (int round = 0; round < 20000; ++round) {
     std::u16string text(21, u'\n');
-    for (size_t length = random() % 60; length > 0; --length)
-      text += kAlphabet[random() % std::size(kAlphabet)];
+    for (size_t length = random() % 60; length > 0; --length) text += kAlphabet[random() % std::size(kAlphabet)];
     std::string narrow(text.begin(), text.end());
     std::shuffle(narrow.begin(), narrow.end(), random);
     ASSERT_NO_FATAL_FAILURE(ExpectLoadsAsTheTwinDoes(LittleEndianImage(text)));
@@ -167,17 +156,13 @@ TEST(Load, TakesRandomBinariesAsTheTwinDoes) {
 // What LastLoad tells.
 TEST(Load, TellsHowItWent) {
   using namespace std::string_literals;
-  const auto damaged = [](std::string image, size_t at, const std::string& bytes) {
-    return image.replace(at, bytes.size(), bytes);
-  };
+  const auto damaged = [](std::string image, size_t at, const std::string& bytes) { return image.replace(at, bytes.size(), bytes); };
   const std::string one15 = Image1_5(0, {{580, {{"/a", Bytes(u"Hi")}}}});
   const std::string one10 = Image1_0(0, {{580, {{"/a", Bytes(u"Hi")}}}});
   const std::string two15 = Image1_5(1, {{580, {{"/a", "x"}}}, {581, {{"/b", "y"}}}});
   const std::string two10 = Image1_0(9, {{580, {{"/a", "x"}}}, {581, {{"/b", "y"}}}});
   ASSERT_EQ(one15, "Kolvane Binary Format\1\5\0\1\0\0\0\2\0\0\0\2\0\0\0\4\0\0\0\x44\2/aH\0i\0"s);
-  ASSERT_EQ(
-      one10,
-      "Kolvane Binary Format\1\0\0\2\0\x44\2\x26\0\0\0\0\0\x34\0\0\0\2\0\0\0/a\4\0\0\0H\0i\0"s);
+  ASSERT_EQ(one10, "Kolvane Binary Format\1\0\0\2\0\x44\2\x26\0\0\0\0\0\x34\0\0\0\2\0\0\0/a\4\0\0\0H\0i\0"s);
   const std::string line = "\"$$$/a=a line of text\"\n";
   struct {
     std::string image;
@@ -188,49 +173,38 @@ TEST(Load, TellsHowItWent) {
     uint64_t offset;
   } const cases[] = {
       {"", ImageFormat::kNone, TextEncoding::kCodePage, 0, 0, 0, LoadDamage::kTooShort, 0},
-      {LittleEndianImage(u"\"$$$/a=b\""), ImageFormat::kNone, TextEncoding::kCodePage, 0, 0, 0,
-       LoadDamage::kTooShort, 0},
-      {LittleEndianImage(u"\"$$$/a=b\"\r\n"), ImageFormat::kText, TextEncoding::kUTF16LE, 1, 0, 0,
-       LoadDamage::kNone, 0},
-      {line + line + "$x\n", ImageFormat::kText, TextEncoding::kCodePage, 2, 1, 1,
-       LoadDamage::kNone, 0},
+      {LittleEndianImage(u"\"$$$/a=b\""), ImageFormat::kNone, TextEncoding::kCodePage, 0, 0, 0, LoadDamage::kTooShort, 0},
+      {LittleEndianImage(u"\"$$$/a=b\"\r\n"), ImageFormat::kText, TextEncoding::kUTF16LE, 1, 0, 0, LoadDamage::kNone, 0},
+      {line + line + "$x\n", ImageFormat::kText, TextEncoding::kCodePage, 2, 1, 1, LoadDamage::kNone, 0},
       {line + "\0"s, ImageFormat::kText, TextEncoding::kCodePage, 1, 0, 0, LoadDamage::kNone, 0},
-      {line + "\0x"s, ImageFormat::kText, TextEncoding::kCodePage, 1, 0, 0,
-       LoadDamage::kZeroCharacter, 23},
-      {BigEndianImage(u"\"$$$/abcdef=b\"\n") + "\0\0x"s, ImageFormat::kText, TextEncoding::kUTF16BE,
-       1, 0, 0, LoadDamage::kZeroCharacter, 32},
+      {line + "\0x"s, ImageFormat::kText, TextEncoding::kCodePage, 1, 0, 0, LoadDamage::kZeroCharacter, 23},
+      {BigEndianImage(u"\"$$$/abcdef=b\"\n") + "\0\0x"s, ImageFormat::kText, TextEncoding::kUTF16BE, 1, 0, 0, LoadDamage::kZeroCharacter,
+       32},
       {one15, ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 1, 0, 0, LoadDamage::kNone, 0},
       {one10, ImageFormat::kBinary1_0, TextEncoding::kUTF16LE, 1, 0, 0, LoadDamage::kNone, 0},
-      {one15 + "behind", ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 1, 0, 0,
-       LoadDamage::kNone, 0},
+      {one15 + "behind", ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 1, 0, 0, LoadDamage::kNone, 0},
       {two15, ImageFormat::kBinary1_5, TextEncoding::kUTF8, 2, 0, 0, LoadDamage::kNone, 0},
       {two10, ImageFormat::kBinary1_0, TextEncoding::kCodePage, 2, 0, 0, LoadDamage::kNone, 0},
-      {two15.substr(0, two15.size() - 1), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 1, 0, 0,
+      {two15.substr(0, two15.size() - 1), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 1, 0, 0, LoadDamage::kShortRead, two15.size() - 1},
+      {damaged(one15, 21, "\1\7"), ImageFormat::kBinaryOther, TextEncoding::kUTF16LE, 0, 0, 0, LoadDamage::kUnsupportedVersion, 21},
+      {damaged(one15, 24, "\xFF\xFF\xFF\xFF"), ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 0, 0, 0, LoadDamage::kShortRead, 28},
+      {damaged(one15, 24, "\0\0\0\0"s), ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 0, 0, 0, LoadDamage::kNoGroups, 24},
+      {damaged(one10, 24, "\0\0"s), ImageFormat::kBinary1_0, TextEncoding::kUTF16LE, 0, 0, 0, LoadDamage::kNoGroups, 24},
+      {damaged(two15, 28, "\1"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0, LoadDamage::kBadCounts, 28},
+      {damaged(two15, 28, "\6"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0, LoadDamage::kBadCounts, 28},
+      {damaged(two15, 36, "\xFF\xFF\xFF\xFF"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0, LoadDamage::kShortRead, 56},
+      {damaged(two15, 52, "\xFD\3"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 1, 0, 0, LoadDamage::kBadBucket, 52},
+      {damaged(two10, 26, "\xFD\3"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 1, 0, 0, LoadDamage::kBadBucket, 26},
+      {damaged(two15, 52, "\x45\2"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 2, 0, 0, LoadDamage::kWrongBucket, 56},
+      {damaged(two15, 52, "\xFD\3").substr(0, two15.size() - 1), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0,
        LoadDamage::kShortRead, two15.size() - 1},
-      {damaged(one15, 21, "\1\7"), ImageFormat::kBinaryOther, TextEncoding::kUTF16LE, 0, 0, 0,
-       LoadDamage::kUnsupportedVersion, 21},
-      {damaged(one15, 24, "\xFF\xFF\xFF\xFF"), ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 0,
-       0, 0, LoadDamage::kShortRead, 28},
-      {damaged(one15, 24, "\0\0\0\0"s), ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 0, 0, 0,
-       LoadDamage::kNoGroups, 24},
-      {damaged(one10, 24, "\0\0"s), ImageFormat::kBinary1_0, TextEncoding::kUTF16LE, 0, 0, 0,
-       LoadDamage::kNoGroups, 24},
-      {damaged(two15, 28, "\1"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0,
-       LoadDamage::kBadCounts, 28},
-      {damaged(two15, 28, "\6"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0,
-       LoadDamage::kBadCounts, 28},
-      {damaged(two15, 36, "\xFF\xFF\xFF\xFF"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0,
-       0, LoadDamage::kShortRead, 56},
-      {damaged(two15, 52, "\xFD\3"), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 1, 0, 0,
-       LoadDamage::kBadBucket, 52},
-      {damaged(two10, 26, "\xFD\3"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 1, 0, 0,
-       LoadDamage::kBadBucket, 26},
-      {damaged(two10, 34, "\x2D"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 2, 0, 0,
-       LoadDamage::kBadOffset, 34},
+      {LittleEndianImage(u"\"$$$/abcdef=b\"\n") + "x", ImageFormat::kText, TextEncoding::kUTF16LE, 2, 0, 0, LoadDamage::kHalfUnit, 32},
+      {damaged(two10, 34, "\x2D"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 2, 0, 0, LoadDamage::kBadOffset, 34},
   };
   for (const auto& each : cases) {
     SCOPED_TRACE(&each - cases);
     DictionaryTable table;
+    Load(table, "\"$$$/before=something to forget\"\n$x\n");
     Load(table, each.image);
     const LoadStatus& status = table.LastLoad();
     EXPECT_EQ(status.format, each.format);
@@ -265,6 +239,7 @@ TEST(Load, KeepsWhatCameBeforeAConversionFailed) {
     }
     gConverterTable = working;
     EXPECT_EQ(table.LastLoad().damage, LoadDamage::kInterrupted);
+    EXPECT_EQ(table.LastLoad().damageOffset, image == binary ? 42u : 0u);
     EXPECT_EQ(Translated(table, "$$$/kept=none"), u"a line of text");
     Load(table, image);
     EXPECT_TRUE(table.LastLoad().Complete());

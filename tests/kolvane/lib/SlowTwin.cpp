@@ -18,8 +18,8 @@ std::u16string Converted(const std::string& bytes, bool utf8) {
     return {text.getBuffer(), static_cast<size_t>(text.length())};
   }
   std::u16string text(bytes.size(), u'\0');
-  ucnv_toUChars(windows1252.get(), text.data(), static_cast<int32_t>(text.size()), bytes.data(),
-                static_cast<int32_t>(bytes.size()), &error);
+  ucnv_toUChars(windows1252.get(), text.data(), static_cast<int32_t>(text.size()), bytes.data(), static_cast<int32_t>(bytes.size()),
+                &error);
   error = U_ZERO_ERROR;  // the text has no terminator, which ICU warns of
   return text;
 }
@@ -67,13 +67,11 @@ void SlowTwin::LoadUTF16(const std::string& image, bool swapped) {
     const uint32_t unit = Number(whole, at, 2);
     text += static_cast<char16_t>(swapped ? unit << 8 | unit >> 8 : unit);
   }
-  ForEachLine(text, std::u16string(u"\n\r\u2028\u2029"),
-              [this](const auto& line) { StoreLine(line); });
+  ForEachLine(text, std::u16string(u"\n\r\u2028\u2029"), [this](const auto& line) { StoreLine(line); });
 }
 
 void SlowTwin::LoadCodePage(const std::string& image) {
-  ForEachLine(image, std::string("\n\r"),
-              [this](const auto& line) { StoreLine(Converted(line, false)); });
+  ForEachLine(image, std::string("\n\r"), [this](const auto& line) { StoreLine(Converted(line, false)); });
 }
 
 void SlowTwin::StoreLine(const std::u16string& line) {
@@ -106,11 +104,9 @@ void SlowTwin::StoreLine(const std::u16string& line) {
 
 std::u16string SlowTwin::Decode(const std::u16string& value) {
   static const std::map<std::u16string, char16_t> kEscapes = {
-      {u"^Q", u'"'},   {u"^[", u'“'},   {u"^]", u'”'},   {u"^{", u'‘'},   {u"^}", u'’'},
-      {u"^C", u'©'},   {u"^R", u'®'},   {u"^T", u'™'},   {u"^D", u'°'},   {u"^B", u'•'},
-      {u"^#", u'⌘'},   {u"^!", u'¬'},   {u"^I", u'∆'},   {u"^S", u'∑'},   {u"^n", u'\n'},
-      {u"^r", u'\r'},  {u"\\\"", u'"'}, {u"\\n", u'\n'}, {u"\\r", u'\r'}, {u"\\t", u'\t'},
-      {u"\\b", u'\b'}, {u"^^", u'^'},   {u"\\\\", u'\\'}};
+      {u"^Q", u'"'},   {u"^[", u'“'},   {u"^]", u'”'},   {u"^{", u'‘'},   {u"^}", u'’'},   {u"^C", u'©'}, {u"^R", u'®'},   {u"^T", u'™'},
+      {u"^D", u'°'},   {u"^B", u'•'},   {u"^#", u'⌘'},   {u"^!", u'¬'},   {u"^I", u'∆'},   {u"^S", u'∑'}, {u"^n", u'\n'},  {u"^r", u'\r'},
+      {u"\\\"", u'"'}, {u"\\n", u'\n'}, {u"\\r", u'\r'}, {u"\\t", u'\t'}, {u"\\b", u'\b'}, {u"^^", u'^'}, {u"\\\\", u'\\'}};
   std::u16string text;
   for (size_t i = 0; i < value.size(); ++i) {
     const bool escape = (value[i] == u'^' || value[i] == u'\\') && i + 1 < value.size();
@@ -212,6 +208,7 @@ const SlowTwin::Entry* SlowTwin::Find(const std::string& key) const {
 }
 
 std::u16string SlowTwin::Translate(const std::string& text, const SlowTwin* fallback) const {
+  if (text.empty()) return u"";
   const bool marked = text.starts_with("$$$");
   if (!marked && text.starts_with("$")) return u"";
   const std::string rest = text.substr(marked ? 3 : 0);

@@ -93,8 +93,7 @@ std::vector<ImageGroup> Grouped(const std::vector<std::pair<std::string, std::st
 }
 
 uint32_t BucketOf(const std::string& key) {
-  return tovali_private::ByteRunKey(reinterpret_cast<const uint8_t*>(key.data()), Size(key), false)
-      .Hash(DictionaryTable::kBucketCount);
+  return tovali_private::ByteRunKey(reinterpret_cast<const uint8_t*>(key.data()), Size(key), false).Hash(DictionaryTable::kBucketCount);
 }
 
 void Load(DictionaryTable& table, const std::string& image) {

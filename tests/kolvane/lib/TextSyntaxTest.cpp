@@ -62,8 +62,7 @@ TEST(TextSyntax, DecodesEscapesAndNames) {
     const char16_t* decoded;
   } const cases[] = {
       {u"", u""},
-      {u"^Q^[^]^{^}^C^R^T^D^B^#^!^I^S^n^r",
-       u"\"\u201C\u201D\u2018\u2019\u00A9\u00AE\u2122\u00B0\u2022\u2318\u00AC\u2206\u2211\n\r"},
+      {u"^Q^[^]^{^}^C^R^T^D^B^#^!^I^S^n^r", u"\"\u201C\u201D\u2018\u2019\u00A9\u00AE\u2122\u00B0\u2022\u2318\u00AC\u2206\u2211\n\r"},
       {u"\\\"\\n\\r\\t\\b", u"\"\n\r\t\b"},
       {u"^^ and \\\\ ok", u"^ and \\ ok"},
       {u"100^", u"100^"},
@@ -92,8 +91,7 @@ TEST(TextSyntax, KnowsEveryName) {
       u"\u2013\u2014\u2018\u2019\u201A\u201C\u201D\u201E\u2020\u2021\u2030\u2039\u203A\u20AC";
   for (size_t i = 0; i < 32; ++i) EXPECT_EQ(names[100 + i].character[0], kSpecial[i]);
   for (const NamedCharacter& named : names) {
-    const std::u16string written =
-        u"#{" + std::u16string(named.name.begin(), named.name.end()) + u"}";
+    const std::u16string written = u"#{" + std::u16string(named.name.begin(), named.name.end()) + u"}";
     EXPECT_EQ(Units(Unescaped(written)), std::vector(named.Units().begin(), named.Units().end()));
   }
 }
