@@ -19,7 +19,7 @@ bool IsControlPair(unsigned char first, unsigned char second) {
 
 void Say(std::string_view message) {
   const std::string line = fmt::format("kolvane: {}\n", message);
-  std::fwrite(line.data(), 1, line.size(), stderr);
+  static_cast<void>(std::fwrite(line.data(), 1, line.size(), stderr));
 }
 
 std::string Printable(std::string_view text) {

@@ -1,0 +1,95 @@
+#include "Coercions.h"
+
+#include <algorithm>
+#include <memory>
+#include <utility>
+
+namespace varnel_kernel {
+namespace {
+
+// Keeps data alive while callbacks may release it.
+class HeldData {
+ public:
+  HeldData(Values& valueStore, VRKData heldData) noexcept : values(valueStore), data(heldData) {
+    values.Retain<Data>(data);
+  }
+  ~HeldData() { values.Release<Data>(data); }
+  HeldData(const HeldData&) = delete;
+  HeldData& operator=(const HeldData&) = delete;
+
+ private:
+  Values& values;
+  VRKData data;
+};
+
+}  // namespace
+
+Coercions::Coercions(HandleTable& handleTable, TokenTable& tokenTable, Values& valueStore,
+                     RunningCode*& innermostCode)
+    : handles(handleTable),
+      tokens(tokenTable),
+      values(valueStore),
+      running(innermostCode),
+      texts(tokenTable) {}
+
+VRKResult Coercions::Coerce(VRKData data, VRKToken toType, VRKData& outData) {
+  const Data* const source = handles.Find<Data>(data);
+  if (source == nullptr || !tokens.Holds(toType)) return kVRKInvalidHandle;
+  if (source->type != toType) return Convert(data, source->type, toType, outData);
+  handles.Retain<Data>(data);
+  outData = data;
+  return kVRKNoError;
+}
+
+VRKResult Coercions::Convert(VRKData data, VRKToken fromType, VRKToken toType, VRKData& outData) {
+  const HeldData held(values, data);
+  uint64_t before = nextNumber;
+  while (const Coercion* const coercion = LatestBefore(before, fromType, toType)) {
+    before = coercion->number;
+    const VRKResult result = CoerceThrough(coercion->callback, data, fromType, toType, outData);
+    if (result != kVRKCannotCoerce) return result;
+  }
+  std::unique_ptr<Data> coerced = texts.Coerce(*handles.Find<Data>(data), toType);
+  if (coerced == nullptr) return kVRKCannotCoerce;
+  outData = handles.Add(std::move(coerced));
+  return kVRKNoError;
+}
+
+const Coercion* Coercions::LatestBefore(uint64_t number, VRKToken fromType,
+                                        VRKToken toType) const noexcept {
+  const auto found = std::find_if(installed.rbegin(), installed.rend(), [&](const Coercion& each) {
+    return each.number < number && each.fromType == fromType && each.toType == toType;
+  });
+  return found == installed.rend() ? nullptr : &*found;
+}
+
+VRKResult Coercions::CoerceThrough(Callback<VRKDataCoercionCallback> callback, VRKData data,
+                                   VRKToken fromType, VRKToken toType, VRKData& outData) {
+  VRKData coerced{};
+  const RunningCode code(running, callback.function);
+  const VRKResult result = callback.function(data, fromType, toType, callback.context, &coerced);
+  if (result != kVRKNoError) return result;
+  if (handles.Find<Data>(coerced) == nullptr) return kVRKNoResult;
+  outData = coerced;
+  return kVRKNoError;
+}
+
+VRKResult Coercions::Install(VRKToken fromType, VRKToken toType,
+                             Callback<VRKDataCoercionCallback> callback) {
+  if (!tokens.Holds(fromType) || !tokens.Holds(toType)) return kVRKInvalidHandle;
+  const bool exists = std::any_of(installed.begin(), installed.end(), [&](const Coercion& each) {
+    return each.fromType == fromType && each.toType == toType && each.callback == callback;
+  });
+  if (exists) return kVRKAlreadyExists;
+  installed.push_back({fromType, toType, callback, nextNumber});
+  ++nextNumber;
+  return kVRKNoError;
+}
+
+VRKResult Coercions::Remove(Callback<VRKDataCoercionCallback> callback) noexcept {
+  const auto removed =
+      std::erase_if(installed, [&](const Coercion& each) { return each.callback == callback; });
+  return removed != 0 ? kVRKNoError : kVRKNotFound;
+}
+
+}  // namespace varnel_kernel

@@ -1,0 +1,108 @@
+// The kernel's handles: small integers that name what lives, and never what has lived.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+namespace varnel_kernel {
+
+enum class Kind : uint8_t { kNone, kObject, kMessageHandler, kData, kList, kDictionary, kPlugIn };
+inline constexpr size_t kKindCount = 7;
+
+// What a handle stands for. A class of items says of what kind its handles are (`kKind`) and which
+// type they have (`Handle`, an enumeration of 32 bits).
+struct Item {
+  Item() = default;
+  Item(const Item&) = delete;
+  Item& operator=(const Item&) = delete;
+  virtual ~Item() = default;
+};
+
+// Owns its items. A handle is the index of a slot and the number of times that the slot has been
+// emptied; an emptied slot is not filled again before a thousand others have been, so that a stale
+// handle is found out for at least a million handles. Every operation takes any 32 bits for a
+// handle.
+//
+// Nothing but Add allocates. Pointers to items stay valid until the item is removed.
+class HandleTable {
+ public:
+  // With a count of 1. Throws std::bad_alloc when there is no memory, or no handle left.
+  template <class Item>
+  typename Item::Handle Add(std::unique_ptr<Item> item) {
+    return typename Item::Handle{AddItem(std::move(item), Item::kKind)};
+  }
+
+  // Null for a handle that stands for no item of this class.
+  template <class Item>
+  Item* Find(typename Item::Handle handle) const noexcept {
+    const Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Item::kKind);
+    return slot != nullptr ? static_cast<Item*>(slot->item.get()) : nullptr;
+  }
+
+  // Adds 1 to the count and returns whether the handle stands for an item of this class.
+  template <class Item>
+  bool Retain(typename Item::Handle handle) noexcept {
+    Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Item::kKind);
+    if (slot != nullptr) ++slot->count;
+    return slot != nullptr;
+  }
+
+  // Takes 1 from the count of an item that exists and returns what is left. The item stays; a count
+  // of 0 stays 0.
+  template <class Item>
+  uint64_t Release(typename Item::Handle handle) noexcept {
+    Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Item::kKind);
+    return slot->count == 0 ? 0 : --slot->count;
+  }
+
+  // Ends the handle and hands its item over; null for a handle that stands for no item of this
+  // class.
+  template <class Item>
+  std::unique_ptr<Item> Remove(typename Item::Handle handle) noexcept {
+    std::unique_ptr<varnel_kernel::Item> item =
+        RemoveItem(static_cast<uint32_t>(handle), Item::kKind);
+    return std::unique_ptr<Item>(static_cast<Item*>(item.release()));
+  }
+
+  // Calls `visit` with the handle and the item of each item of this class.
+  template <class Item, class Visit>
+  void ForEach(Visit visit) const {
+    for (uint32_t index = 1; index < slots.size(); ++index) {
+      const Slot& slot = slots[index];
+      if (slot.kind == Item::kKind) {
+        visit(typename Item::Handle{HandleOf(index)}, static_cast<Item&>(*slot.item));
+      }
+    }
+  }
+
+  uint32_t Live(Kind kind) const noexcept { return live[static_cast<size_t>(kind)]; }
+
+  // Ends every handle and destroys every item.
+  void Clear() noexcept;
+
+ private:
+  struct Slot {
+    std::unique_ptr<varnel_kernel::Item> item;
+    uint64_t count = 0;
+    uint32_t generation = 0;
+    uint32_t nextFree = 0;
+    Kind kind = Kind::kNone;
+  };
+
+  uint32_t AddItem(std::unique_ptr<Item> item, Kind kind);
+  std::unique_ptr<Item> RemoveItem(uint32_t handle, Kind kind) noexcept;
+  Slot* SlotOf(uint32_t handle, Kind kind) noexcept;
+  const Slot* SlotOf(uint32_t handle, Kind kind) const noexcept;
+  uint32_t HandleOf(uint32_t index) const noexcept;
+  uint32_t TakeFreeSlot();
+
+  std::vector<Slot> slots = std::vector<Slot>(1);  // the first stays empty: no handle is 0
+  uint32_t firstFree = 0;
+  uint32_t lastFree = 0;
+  uint32_t freeCount = 0;
+  std::array<uint32_t, kKindCount> live{};
+};
+
+}  // namespace varnel_kernel

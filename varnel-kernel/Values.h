@@ -1,0 +1,110 @@
+// Data, lists and dictionaries.
+#pragma once
+
+#include <boost/unordered/unordered_flat_map.hpp>
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <vector>
+
+#include "HandleTable.h"
+#include "TokenTable.h"
+#include "VarnelKernel.h"
+
+namespace varnel_kernel {
+
+class Values;
+
+// What counts references, and may hold references to others of its like.
+struct Value : Item {
+  virtual void ReleaseReferences(Values& values) noexcept = 0;
+
+  std::unique_ptr<Value>
+      nextDying;  // on the list of values that have just lost their last reference
+};
+
+// Typed bytes, which stand behind the item itself, aligned for any type.
+struct Data final : Value {
+  using Handle = VRKData;
+  static constexpr Kind kKind = Kind::kData;
+
+  // The bytes are left to be written. Throws std::bad_alloc.
+  static std::unique_ptr<Data> Create(VRKToken type, uint32_t byteCount);
+  static void operator delete(void* block) { ::operator delete(block); }
+
+  std::byte* Bytes() noexcept;
+  void ReleaseReferences(Values& values) noexcept override;
+
+  const VRKToken type;
+  const uint32_t byteCount;
+  VRKList list{};  // these two for data of a list or a dictionary, which holds a reference
+  VRKDictionary dictionary{};
+
+ private:
+  Data(VRKToken dataType, uint32_t count) : type(dataType), byteCount(count) {}
+};
+
+struct List final : Value {
+  using Handle = VRKList;
+  static constexpr Kind kKind = Kind::kList;
+
+  void ReleaseReferences(Values& values) noexcept override;
+
+  std::vector<VRKData> entries;  // a reference to each
+};
+
+struct Dictionary final : Value {
+  using Handle = VRKDictionary;
+  static constexpr Kind kKind = Kind::kDictionary;
+
+  void ReleaseReferences(Values& values) noexcept override;
+
+  boost::unordered_flat_map<uint32_t, VRKData> entries;  // by token; a reference to each
+};
+
+// The operations on them. Handles may be any 32 bits; outs are not null. Throws std::bad_alloc, and
+// has then changed nothing.
+class Values {
+ public:
+  Values(HandleTable& handleTable, TokenTable& tokenTable);
+
+  VRKResult CreateData(VRKToken type, const void* bytes, uint32_t byteCount, VRKData& outData);
+  VRKResult CreateDictionary(VRKDictionary& outDictionary);
+  VRKResult GetEntry(VRKDictionary dictionary, VRKToken key, VRKData& outData) const;
+  VRKResult SetEntry(VRKDictionary dictionary, VRKToken key, VRKData data);
+  VRKResult CreateKeyList(VRKDictionary dictionary, VRKList& outList);
+  VRKResult CreateList(VRKList& outList);
+  VRKResult Append(VRKList list, VRKData data);
+
+  bool IsNullOrLive(VRKDictionary dictionary) const noexcept {
+    return dictionary == VRKDictionary{} || handles.Find<Dictionary>(dictionary) != nullptr;
+  }
+
+  template <class Value>
+  VRKResult Retain(typename Value::Handle handle) noexcept {
+    if (handle == typename Value::Handle{}) return kVRKNoError;
+    return handles.Retain<Value>(handle) ? kVRKNoError : kVRKInvalidHandle;
+  }
+
+  template <class Value>
+  VRKResult Release(typename Value::Handle handle) noexcept {
+    if (handle == typename Value::Handle{}) return kVRKNoError;
+    if (handles.Find<Value>(handle) == nullptr) return kVRKInvalidHandle;
+    if (handles.Release<Value>(handle) == 0) Bury(handles.Remove<Value>(handle));
+    return kVRKNoError;
+  }
+
+  const VRKToken tokenType;
+  const VRKToken listType;
+  const VRKToken dictionaryType;
+
+ private:
+  void Bury(std::unique_ptr<Value> value) noexcept;
+
+  HandleTable& handles;
+  TokenTable& tokens;
+  std::unique_ptr<Value> dying;
+  bool isBurying = false;
+};
+
+}  // namespace varnel_kernel

@@ -1,0 +1,133 @@
+/* The host's side of the embedded kernel: what a host needs beyond VarnelKernel.h. C11 and C++20.
+ *
+ * A process has one kernel. It serves one call at a time: calls from several threads wait for each
+ * other, and a call that is made from within a callback is served at once. Everything that
+ * VarnelKernel.h says of widths, handles, results and arguments holds here too.
+ */
+#ifndef VARNEL_KERNEL_HOST_H
+#define VARNEL_KERNEL_HOST_H
+
+#include "VarnelKernel.h"
+
+#ifdef __cplusplus
+enum class VRKPlugIn : uint32_t {};
+extern "C" {
+#else
+typedef uint32_t VRKPlugIn;
+#endif
+
+/* How many handles, registrations and blocks there are of each kind. */
+typedef struct VRKHostLiveCounts {
+  uint32_t objects;
+  uint32_t messageHandlers;
+  uint32_t objectFactories; /* counted once for each class they serve */
+  uint32_t dataCoercions;   /* counted once for each pair of types */
+  uint32_t data;
+  uint32_t lists;
+  uint32_t dictionaries;
+  uint32_t memoryBlocks;
+  uint32_t plugIns;
+} VRKHostLiveCounts;
+
+/* kVRKAlreadyExists: the kernel is running. */
+VRK_API VRKResult VRK_CALL VRKHostStart(void);
+
+/* Ends the kernel. *outLive, which may be null, gets what was still alive. All of it ends without a
+ * word to anybody, and its handles are stale from then on; only tokens, memory blocks and loaded
+ * libraries stay, so that code which still holds their addresses may do so. kVRKInUse, and nothing
+ * is ended: the call comes from within a callback. */
+VRK_API VRKResult VRK_CALL VRKHostShutDown(VRKHostLiveCounts* outLive);
+
+VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
+
+/* Plug-ins */
+
+/* Loads a library whose entry points are called `prefix` followed by Initialize, Terminate and
+ * Version. kVRKNotFound: there is no such library, or it lacks an entry point; VRKHostLoadError
+ * says why. A path without a separator is searched for where the system looks for libraries. */
+VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefix,
+                                             VRKPlugIn* outPlugIn);
+
+/* The reason why the calling thread's latest VRKHostPlugInLoad failed, valid until its next one. */
+VRK_API const char* VRK_CALL VRKHostLoadError(void);
+
+/* Call the entry points and return what they return. Objects that come into being while a plug-in
+ * initialises are kept alive until its VRKHostPlugInTerminate returns. */
+VRK_API VRKResult VRK_CALL VRKHostPlugInInitialize(VRKPlugIn plugIn);
+VRK_API VRKResult VRK_CALL VRKHostPlugInTerminate(VRKPlugIn plugIn);
+VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion);
+
+/* Unloads the library, whether it was terminated or not; objects that were kept for it are released
+ * first. kVRKInUse, and nothing is unloaded: one of its callbacks is installed still, or running.
+ */
+VRK_API VRKResult VRK_CALL VRKHostPlugInUnload(VRKPlugIn plugIn);
+
+/* Lists and data of handles. Outs are owned by the caller. */
+
+VRK_API VRKResult VRK_CALL VRKHostListCreate(VRKList* outList);
+
+/* The list keeps a reference of its own. */
+VRK_API VRKResult VRK_CALL VRKHostListAppend(VRKList list, VRKData data);
+
+/* Data of the types "type:orvane.vrk.token", "type:orvane.vrk.list" and
+ * "type:orvane.vrk.dictionary". */
+VRK_API VRKResult VRK_CALL VRKHostTokenDataCreate(VRKToken token, VRKData* outData);
+VRK_API VRKResult VRK_CALL VRKHostListDataCreate(VRKList list, VRKData* outData);
+VRK_API VRKResult VRK_CALL VRKHostDictionaryDataCreate(VRKDictionary dictionary, VRKData* outData);
+
+/* Trace */
+
+enum {
+  kVRKTraceNumber,  /* in `number` */
+  kVRKTraceText,    /* in `pointer` */
+  kVRKTracePointer, /* in `pointer`; bytes, callbacks, contexts, outs that hold no handle */
+  kVRKTraceObject,  /* handles and tokens, in `number` */
+  kVRKTraceHandler,
+  kVRKTraceToken,
+  kVRKTraceData,
+  kVRKTraceList,
+  kVRKTraceDictionary
+};
+
+typedef struct VRKHostTraceArgument {
+  uint32_t kind;
+  uint32_t isOut; /* `number` is what was stored there, or 0 as long as nothing was */
+  uint32_t number;
+  const void* pointer;
+} VRKHostTraceArgument;
+
+typedef struct VRKHostTraceCall {
+  const char* operation; /* its name in VarnelKernel.h */
+  const VRKHostTraceArgument* arguments;
+  uint32_t argumentCount;
+  uint32_t depth;      /* how many calls it is nested in */
+  uint32_t isFinished; /* 0 before the call runs, 1 after it; `result` is set then */
+  VRKResult result;
+} VRKHostTraceCall;
+
+/* Hears of each call of an operation of VarnelKernel.h, but for VRKTokenGetString, twice. What it
+ * returns before the call runs, if it is not 0, becomes the call's result, and the call does not
+ * run; after it the result is ignored. Calls that the hook makes itself are not traced. No
+ * exception may leave it. */
+typedef VRKResult(VRK_CALL* VRKHostTraceHook)(const VRKHostTraceCall* call, void* context);
+
+/* Installs the one trace hook; null for none. */
+VRK_API VRKResult VRK_CALL VRKHostSetTraceHook(VRKHostTraceHook hook, void* context);
+
+/* Error reports */
+
+/* Serves VRKRuntimeError, and returns what it returns. */
+typedef uint32_t(VRK_CALL* VRKHostErrorReporter)(uint32_t severity, const char* domain,
+                                                 const char* expression, const char* sourceFile,
+                                                 uint32_t line, const char* function,
+                                                 uint32_t* onceFlag, void* context);
+
+/* Installs the reporter. Null for the kernel's own, which prints a report on standard error, sets
+ * its once-flag and returns 0. */
+VRK_API VRKResult VRK_CALL VRKHostSetErrorReporter(VRKHostErrorReporter reporter, void* context);
+
+#ifdef __cplusplus
+} /* extern "C" */
+#endif
+
+#endif
