@@ -1,0 +1,85 @@
+#include "Support.h"
+
+#include <map>
+#include <utility>
+
+#include "Boundary.h"
+
+std::string Alive() {
+  VRKHostLiveCounts live{};
+  EXPECT_EQ(VRKHostGetLiveCounts(&live), 0u);
+  const std::pair<const char*, uint32_t> kinds[] = {{"objects", live.objects},
+                                                    {"handlers", live.messageHandlers},
+                                                    {"factories", live.objectFactories},
+                                                    {"coercions", live.dataCoercions},
+                                                    {"data", live.data},
+                                                    {"lists", live.lists},
+                                                    {"dictionaries", live.dictionaries},
+                                                    {"blocks", live.memoryBlocks}};
+  std::string text;
+  for (const auto& [kind, count] : kinds) {
+    if (count != 0) text += std::string(kind) + ' ' + std::to_string(count) + ' ';
+  }
+  return text;
+}
+
+KernelTest::~KernelTest() {
+  EXPECT_EQ(Alive(), "");
+  EXPECT_EQ(VRKHostShutDown(nullptr), 0u);
+}
+
+CallTrace::CallTrace() {
+  EXPECT_EQ(VRKHostSetTraceHook(&Hook, this), 0u);
+}
+
+CallTrace::~CallTrace() {
+  VRKHostSetTraceHook(nullptr, nullptr);
+  if (makeGood) makeGood();
+}
+
+std::vector<std::string> CallTrace::Take() {
+  std::erase_if(calls, [](const std::string& call) { return call.ends_with("Retain 0") || call.ends_with("Release 0"); });
+  return std::exchange(calls, {});
+}
+
+VRKResult VRK_CALL CallTrace::Hook(const VRKHostTraceCall* call, void* context) {
+  return call->isFinished != 0 ? 0 : static_cast<CallTrace*>(context)->Note(*call);
+}
+
+VRKResult CallTrace::Note(const VRKHostTraceCall& call) {
+  calls.emplace_back(call.operation);
+  for (uint32_t i = 0; i < call.argumentCount; ++i) {
+    const VRKHostTraceArgument& argument = call.arguments[i];
+    if (argument.isOut != 0 || argument.kind == kVRKTraceText) continue;
+    if (argument.kind != kVRKTracePointer) calls.back() += ' ' + std::to_string(argument.number);
+  }
+  if (calls.size() != failAt && call.operation != failNext) return 0;
+  failNext.clear();
+  failed = call.operation;
+  makeGood = Again(call);
+  return kFailure;
+}
+
+// Does later what a call is kept from giving up now.
+std::function<void()> CallTrace::Again(const VRKHostTraceCall& call) {
+  const uint32_t handle = call.arguments[0].number;
+  const auto pointer = [&call](uint32_t i) { return i < call.argumentCount ? const_cast<void*>(call.arguments[i].pointer) : nullptr; };
+  void *const first = pointer(0), *const second = pointer(1), *const third = pointer(2);
+  const std::map<std::string, std::function<void()>> giveUps = {
+      {"VRKDataRelease", [=] { VRKDataRelease(VRKData{handle}); }},
+      {"VRKListRelease", [=] { VRKListRelease(VRKList{handle}); }},
+      {"VRKDictionaryRelease", [=] { VRKDictionaryRelease(VRKDictionary{handle}); }},
+      {"VRKObjectRelease", [=] { VRKObjectRelease(VRKObject{handle}); }},
+      {"VRKMemoryDeallocate", [=] { VRKMemoryDeallocate(first); }},
+      {"VRKDataCoercionHandlerRemove", [=] { VRKDataCoercionHandlerRemove(AsCallback<VRKDataCoercionCallback>(first), second, 0, 0); }},
+      {"VRKObjectFactoryUnregister", [=] { VRKObjectFactoryUnregister(0, AsCallback<VRKObjectFactoryCallback>(second), third); }}};
+  const auto found = giveUps.find(call.operation);
+  return found != giveUps.end() ? found->second : nullptr;
+}
+
+VRKResult CodeOf(const std::function<void()>& body) {
+  return Varnel::AtBoundary({}, [&body]() -> VRKResult {
+    body();
+    return 0;
+  });
+}

@@ -1,0 +1,25 @@
+// Kernel data as values.
+#pragma once
+
+#include <cstddef>
+
+#include "Holders.h"
+#include "Values.h"
+
+namespace Varnel {
+
+// How many lists and dictionaries may be nested in each other. More, as when one contains itself,
+// are a std::length_error.
+inline constexpr size_t kNestingLimit = 100'000;
+
+// The kernel's coercions decide what becomes of data: it becomes the first of a double, a bool, a
+// byte string, the empty value, a name, an array or a dictionary that it can be coerced to. Data
+// that cannot be coerced to any of these throws std::domain_error; so does what is nested in it.
+// Nesting takes memory but no stack. Whatever is thrown, no reference stays behind.
+orvane::value_t AsValue(const DataRef& source);
+orvane::array_t AsArray(const ListRef& source);
+
+// The null dictionary, which a kernel may pass where there are no parameters, is an empty one.
+orvane::dictionary_t AsDictionary(const DictionaryRef& source);
+
+}  // namespace Varnel

@@ -1,0 +1,37 @@
+#include "DataCoercion.h"
+
+#include "Boundary.h"
+#include "Exceptions.h"
+#include "ResultCodes.h"
+
+namespace Varnel {
+
+DataCoercion::~DataCoercion() {
+  VRKDataCoercionHandlerRemove(&Callback, this, 0, 0);
+}
+
+void DataCoercion::Install(VRKToken fromType, VRKToken toType) {
+  if (fromType == VRKToken{} || toType == VRKToken{}) throw InputContractViolation();
+  ThrowIfFailed(VRKDataCoercionHandlerInstall(fromType, toType, 0, &Callback, this));
+}
+
+bool DataCoercion::HandleCoercion(VRKData source, VRKToken fromType, VRKToken toType,
+                                  VRKData* outData) {
+  if (outData == nullptr) throw InputContractViolation();
+  const DataRef heldSource(source);
+  DataRef result;
+  if (!HandleCoercionImpl(heldSource, fromType, toType, result)) return false;
+  *outData = result.Detach();
+  return true;
+}
+
+VRKResult VRK_CALL DataCoercion::Callback(VRKData source, VRKToken fromType, VRKToken toType,
+                                          void* context, VRKData* outData) {
+  return AtBoundary({}, [&] {
+    DataCoercion& coercion = *static_cast<DataCoercion*>(context);
+    const bool coerced = coercion.HandleCoercion(source, fromType, toType, outData);
+    return coerced ? kResultNoError : kResultCannotCoerce;
+  });
+}
+
+}  // namespace Varnel

@@ -1,0 +1,24 @@
+#include "ReportedCheck.h"
+
+#include "VarnelKernel.h"
+
+namespace Varnel {
+
+void ReportFailedCheck(CheckSite& site) noexcept {
+  constexpr uint32_t kFailedCheck = 2;
+  constexpr uint32_t kBreak = 0xFF;
+  const uint32_t answer =
+      VRKRuntimeError(kFailedCheck, site.domain, site.condition, 0, site.sourceFile, site.line,
+                      site.function, &site.onceFlag);
+  if ((answer & kBreak) != 0) BreakIntoDebugger();
+}
+
+void BreakIntoDebugger() noexcept {
+#if defined(__i386__) || defined(__x86_64__)
+  __asm__ volatile("int3");
+#else
+  __builtin_trap();
+#endif
+}
+
+}  // namespace Varnel
