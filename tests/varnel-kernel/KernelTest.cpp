@@ -247,6 +247,17 @@ TEST_F(Kernel, CountsReferences) {
   EXPECT_NE(VRKDataRetain(data), 0u);
 }
 
+TEST_F(Kernel, TellsStaleHandlesFromThoseThatCameAfter) {
+  const VRKData stale = MakeData("type:test", "");
+  VRKDataRelease(stale);
+  for (int i = 0; i < 5000; ++i) {
+    const VRKData later = MakeData("type:test", "");
+    ASSERT_NE(later, stale);
+    ASSERT_EQ(VRKDataRetain(stale), kVRKInvalidHandle) << i;
+    VRKDataRelease(later);
+  }
+}
+
 TEST_F(Kernel, ReleasesDeepNestsOnASmallStack) {
   VRKData inner = MakeData("type:test", "");
   for (int level = 0; level < 200000; ++level) {
