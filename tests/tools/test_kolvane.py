@@ -167,9 +167,11 @@ class Translate(unittest.TestCase):
             self.assertEqual((status, output), (2, ""), arguments)
             self.assertRegex(errors, rf"^kolvane: [^\x00-\x1f\x7f-\x9f]*\ntry '{hint} --help'\n$")
 
-    @unittest.skipUnless(hasattr(os, "openpty"), "no terminals")
     def test_terminal_without_keys(self):
-        ours, terminal = os.openpty()
+        try:
+            ours, terminal = os.openpty()
+        except (AttributeError, OSError):
+            self.skipTest("no terminals")
         done = subprocess.run([KOLVANE, "translate"], stdin=terminal, capture_output=True, timeout=10)
         os.close(ours)
         os.close(terminal)
