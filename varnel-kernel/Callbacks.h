@@ -3,6 +3,8 @@
 
 #include <cstdint>
 
+#include "VarnelKernel.h"
+
 namespace varnel_kernel {
 
 // Two callbacks are the same when both their function and their context are.
@@ -35,5 +37,18 @@ class RunningCode {
   RunningCode* outer;
   const void* address;
 };
+
+// Calls code that is not the kernel's own. Should it throw, which it must not, `onThrow` is the
+// result.
+template <class Result, class Function, class... Arguments>
+Result CallOut(RunningCode*& innermost, Result onThrow, Function function,
+               Arguments... arguments) noexcept {
+  const RunningCode code(innermost, function);
+  try {
+    return function(arguments...);
+  } catch (...) {
+    return onThrow;
+  }
+}
 
 }  // namespace varnel_kernel

@@ -49,7 +49,9 @@ VRKResult Coercions::Convert(VRKData data, VRKToken fromType, VRKToken toType, V
     const VRKResult result = CoerceThrough(coercion->callback, data, fromType, toType, outData);
     if (result != kVRKCannotCoerce) return result;
   }
-  std::unique_ptr<Data> coerced = texts.Coerce(*handles.Find<Data>(data), toType);
+  Data* const source = handles.Find<Data>(data);
+  if (source == nullptr) return kVRKInvalidHandle;  // a callback released more than was its own
+  std::unique_ptr<Data> coerced = texts.Coerce(*source, toType);
   if (coerced == nullptr) return kVRKCannotCoerce;
   outData = handles.Add(std::move(coerced));
   return kVRKNoError;
@@ -66,8 +68,8 @@ const Coercion* Coercions::LatestBefore(uint64_t number, VRKToken fromType,
 VRKResult Coercions::CoerceThrough(Callback<VRKDataCoercionCallback> callback, VRKData data,
                                    VRKToken fromType, VRKToken toType, VRKData& outData) {
   VRKData coerced{};
-  const RunningCode code(running, callback.function);
-  const VRKResult result = callback.function(data, fromType, toType, callback.context, &coerced);
+  const VRKResult result = CallOut(running, kVRKCallbackThrew, callback.function, data, fromType,
+                                   toType, callback.context, &coerced);
   if (result != kVRKNoError) return result;
   if (handles.Find<Data>(coerced) == nullptr) return kVRKNoResult;
   outData = coerced;

@@ -60,14 +60,13 @@ uint32_t HandleTable::HandleOf(uint32_t index) const noexcept {
 }
 
 uint32_t HandleTable::TakeFreeSlot() {
-  const bool full = slots.size() > kIndexMask;
-  if (freeCount > kRestingSlots || (full && freeCount > 0)) {
+  if (freeCount > kRestingSlots) {
     const uint32_t index = firstFree;
     firstFree = slots[index].nextFree;
     --freeCount;
     return index;
   }
-  if (full) throw std::bad_alloc();
+  if (slots.size() > kIndexMask) throw std::bad_alloc();
   slots.emplace_back();
   return static_cast<uint32_t>(slots.size() - 1);
 }

@@ -29,50 +29,49 @@ struct Item {
 class HandleTable {
  public:
   // With a count of 1. Throws std::bad_alloc when there is no memory, or no handle left.
-  template <class Item>
-  typename Item::Handle Add(std::unique_ptr<Item> item) {
-    return typename Item::Handle{AddItem(std::move(item), Item::kKind)};
+  template <class Kept>
+  typename Kept::Handle Add(std::unique_ptr<Kept> item) {
+    return typename Kept::Handle{AddItem(std::move(item), Kept::kKind)};
   }
 
   // Null for a handle that stands for no item of this class.
-  template <class Item>
-  Item* Find(typename Item::Handle handle) const noexcept {
-    const Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Item::kKind);
-    return slot != nullptr ? static_cast<Item*>(slot->item.get()) : nullptr;
+  template <class Kept>
+  Kept* Find(typename Kept::Handle handle) const noexcept {
+    const Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Kept::kKind);
+    return slot != nullptr ? static_cast<Kept*>(slot->item.get()) : nullptr;
   }
 
   // Adds 1 to the count and returns whether the handle stands for an item of this class.
-  template <class Item>
-  bool Retain(typename Item::Handle handle) noexcept {
-    Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Item::kKind);
+  template <class Kept>
+  bool Retain(typename Kept::Handle handle) noexcept {
+    Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Kept::kKind);
     if (slot != nullptr) ++slot->count;
     return slot != nullptr;
   }
 
   // Takes 1 from the count of an item that exists and returns what is left. The item stays; a count
   // of 0 stays 0.
-  template <class Item>
-  uint64_t Release(typename Item::Handle handle) noexcept {
-    Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Item::kKind);
+  template <class Kept>
+  uint64_t Release(typename Kept::Handle handle) noexcept {
+    Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Kept::kKind);
     return slot->count == 0 ? 0 : --slot->count;
   }
 
   // Ends the handle and hands its item over; null for a handle that stands for no item of this
   // class.
-  template <class Item>
-  std::unique_ptr<Item> Remove(typename Item::Handle handle) noexcept {
-    std::unique_ptr<varnel_kernel::Item> item =
-        RemoveItem(static_cast<uint32_t>(handle), Item::kKind);
-    return std::unique_ptr<Item>(static_cast<Item*>(item.release()));
+  template <class Kept>
+  std::unique_ptr<Kept> Remove(typename Kept::Handle handle) noexcept {
+    std::unique_ptr<Item> item = RemoveItem(static_cast<uint32_t>(handle), Kept::kKind);
+    return std::unique_ptr<Kept>(static_cast<Kept*>(item.release()));
   }
 
   // Calls `visit` with the handle and the item of each item of this class.
-  template <class Item, class Visit>
+  template <class Kept, class Visit>
   void ForEach(Visit visit) const {
     for (uint32_t index = 1; index < slots.size(); ++index) {
       const Slot& slot = slots[index];
-      if (slot.kind == Item::kKind) {
-        visit(typename Item::Handle{HandleOf(index)}, static_cast<Item&>(*slot.item));
+      if (slot.kind == Kept::kKind) {
+        visit(typename Kept::Handle{HandleOf(index)}, static_cast<Kept&>(*slot.item));
       }
     }
   }
@@ -84,7 +83,7 @@ class HandleTable {
 
  private:
   struct Slot {
-    std::unique_ptr<varnel_kernel::Item> item;
+    std::unique_ptr<Item> item;
     uint64_t count = 0;
     uint32_t generation = 0;
     uint32_t nextFree = 0;

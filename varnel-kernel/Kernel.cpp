@@ -2,19 +2,14 @@
 
 namespace varnel_kernel {
 
-Kernel& Kernel::Instance() {
-  static Kernel& kernel = *new Kernel;
-  return kernel;
-}
-
-VRKResult Kernel::Start() noexcept {
-  if (isRunning) return kVRKAlreadyExists;
-  isRunning = true;
+VRKResult Kernel::Start() {
+  if (Running() != nullptr) return kVRKAlreadyExists;
+  if (built == nullptr) built = new Kernel;
+  built->isRunning = true;
   return kVRKNoError;
 }
 
 VRKResult Kernel::ShutDown(VRKHostLiveCounts* outLive) noexcept {
-  if (!isRunning) return kVRKNotRunning;
   if (innermostCode != nullptr) return kVRKInUse;
   if (outLive != nullptr) *outLive = LiveCounts();
   isRunning = false;
@@ -22,8 +17,7 @@ VRKResult Kernel::ShutDown(VRKHostLiveCounts* outLive) noexcept {
   coercions.Clear();
   handles.Clear();
   trace.Set(nullptr, nullptr);
-  reporter = nullptr;
-  reporterContext = nullptr;
+  reports.Set(nullptr, nullptr);
   return kVRKNoError;
 }
 

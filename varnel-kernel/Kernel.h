@@ -7,6 +7,7 @@
 
 #include "Callbacks.h"
 #include "Coercions.h"
+#include "ErrorReports.h"
 #include "HandleTable.h"
 #include "Objects.h"
 #include "PlugIns.h"
@@ -21,38 +22,44 @@ namespace varnel_kernel {
 // handle's slot was used, outlive a shut-down: code that was loaded before it keeps both.
 class Kernel {
  public:
-  // Never destroyed: libraries may call into the kernel until the process's last moment.
-  static Kernel& Instance();
+  // Builds the kernel at its first start. It is never destroyed: libraries may call into it until
+  // the process's last moment.
+  static VRKResult Start();
 
-  VRKResult Start() noexcept;
   VRKResult ShutDown(VRKHostLiveCounts* outLive) noexcept;
   VRKHostLiveCounts LiveCounts() const noexcept;
 
-  std::recursive_mutex mutex;
-  bool isRunning = false;
+  // Held by whoever uses what follows.
+  static inline std::recursive_mutex mutex;
+  static inline Kernel* built = nullptr;
+
+  static Kernel* Running() noexcept {
+    return built != nullptr && built->isRunning ? built : nullptr;
+  }
+
   RunningCode* innermostCode = nullptr;
   uint32_t memoryBlocks = 0;
-  Trace trace;
-  VRKHostErrorReporter reporter = nullptr;
-  void* reporterContext = nullptr;
+  Trace trace{innermostCode};
+  ErrorReports reports{innermostCode};
 
   TokenTable tokens;
   HandleTable handles;
   Values values{handles, tokens};
   Objects objects{handles, tokens, values, innermostCode};
   Coercions coercions{handles, tokens, values, innermostCode};
-  PlugIns plugIns{handles, objects, coercions, innermostCode};
+  PlugIns plugIns{handles, objects, coercions, trace, reports, innermostCode};
+
+ private:
+  bool isRunning = false;
 };
 
-// No exception gets out: the kernel itself only runs out of memory, and callbacks should not throw.
+// No exception gets out. The kernel has none but those of memory that ran out.
 template <class Body>
 VRKResult Guarded(Body body) noexcept {
   try {
     return body();
   } catch (const std::bad_alloc&) {
     return kVRKOutOfMemory;
-  } catch (...) {
-    return kVRKCallbackThrew;
   }
 }
 
@@ -69,11 +76,11 @@ VRKResult Traced(Trace& trace, const char* operation, Body body, Arguments... ar
 // Serves one call: waits for its turn, tells the trace, runs `body` with the kernel.
 template <class Body, class... Arguments>
 VRKResult Serve(const char* operation, Body body, Arguments... arguments) noexcept {
-  Kernel& kernel = Kernel::Instance();
-  const std::lock_guard lock(kernel.mutex);
-  if (!kernel.isRunning) return kVRKNotRunning;
-  const auto run = [&] { return Guarded([&] { return body(kernel); }); };
-  return kernel.trace.IsOn() ? Traced(kernel.trace, operation, run, arguments...) : run();
+  const std::lock_guard lock(Kernel::mutex);
+  Kernel* const kernel = Kernel::Running();
+  if (kernel == nullptr) return kVRKNotRunning;
+  const auto run = [&] { return Guarded([&] { return body(*kernel); }); };
+  return kernel->trace.IsOn() ? Traced(kernel->trace, operation, run, arguments...) : run();
 }
 
 }  // namespace varnel_kernel

@@ -11,8 +11,11 @@ namespace varnel_kernel {
 // installed meanwhile are not met.
 class Objects::Delivery {
  public:
-  Delivery(HandleTable& handleTable, Object& walkedObject) noexcept
-      : handles(handleTable), object(walkedObject), left(walkedObject.handlers.size()) {
+  Delivery(HandleTable& handleTable, Object& walkedObject, bool tellsOfDeath) noexcept
+      : handles(handleTable),
+        object(walkedObject),
+        ofDeath(tellsOfDeath),
+        left(walkedObject.handlers.size()) {
     ++object.deliveries;
   }
   ~Delivery() {
@@ -29,7 +32,7 @@ class Objects::Delivery {
     while (left > 0) {
       const VRKMessageHandler registration = object.handlers[--left];
       const MessageHandler* const handler = handles.Find<MessageHandler>(registration);
-      if (handler == nullptr) continue;
+      if (handler == nullptr || (ofDeath && handler->isToldOfDeath)) continue;
       const auto& messages = handler->messages;
       if (std::find(messages.begin(), messages.end(), message) != messages.end())
         return registration;
@@ -40,6 +43,7 @@ class Objects::Delivery {
  private:
   HandleTable& handles;
   Object& object;
+  const bool ofDeath;
   size_t left;
 };
 
@@ -76,9 +80,9 @@ VRKResult Objects::CreatePlain(VRKToken objectClass, VRKObject& outObject) {
 VRKResult Objects::CreateThrough(const Factory& factory, VRKDictionary parameters,
                                  VRKObject& outObject) {
   VRKObject object{};
-  const RunningCode code(running, factory.callback.function);
   const VRKResult result =
-      factory.callback.function(factory.objectClass, parameters, factory.callback.context, &object);
+      CallOut(running, kVRKCallbackThrew, factory.callback.function, factory.objectClass,
+              parameters, factory.callback.context, &object);
   if (result != kVRKNoError) return result;
   if (handles.Find<Object>(object) == nullptr) return kVRKNoResult;
   outObject = object;
@@ -89,7 +93,7 @@ VRKResult Objects::Deliver(VRKObject object, VRKToken message, VRKDictionary par
   if (!tokens.Holds(message) || !handles.Retain<Object>(object)) return kVRKInvalidHandle;
   VRKResult result = kVRKNotHandled;
   {
-    Delivery delivery(handles, *handles.Find<Object>(object));
+    Delivery delivery(handles, *handles.Find<Object>(object), message == objectDied);
     while (result == kVRKNotHandled) {
       const VRKMessageHandler registration = delivery.Next(message);
       if (registration == VRKMessageHandler{}) break;
@@ -102,9 +106,11 @@ VRKResult Objects::Deliver(VRKObject object, VRKToken message, VRKDictionary par
 
 VRKResult Objects::Call(VRKMessageHandler registration, VRKObject object, VRKToken message,
                         VRKDictionary parameters) {
-  const auto callback = handles.Find<MessageHandler>(registration)->callback;
-  const RunningCode code(running, callback.function);
-  const VRKResult result = callback.function(object, message, parameters, callback.context);
+  MessageHandler& handler = *handles.Find<MessageHandler>(registration);
+  if (message == objectDied) handler.isToldOfDeath = true;
+  const auto callback = handler.callback;
+  const VRKResult result = CallOut(running, kVRKCallbackThrew, callback.function, object, message,
+                                   parameters, callback.context);
   if (message == objectDied) Remove(registration, object);
   return result;
 }
@@ -114,11 +120,14 @@ VRKResult Objects::Retain(VRKObject object) noexcept {
   return handles.Retain<Object>(object) ? kVRKNoError : kVRKInvalidHandle;
 }
 
+// A delivery holds a reference, so an object whose handlers release more than is theirs dies with
+// the delivery's own release.
 VRKResult Objects::Release(VRKObject object) {
   if (object == VRKObject{}) return kVRKNoError;
   const Object* const found = handles.Find<Object>(object);
   if (found == nullptr) return kVRKInvalidHandle;
-  if (handles.Release<Object>(object) == 0 && !found->isDying) Die(object);
+  const bool isLast = handles.Release<Object>(object) == 0;
+  if (isLast && !found->isDying && found->deliveries == 0) Die(object);
   return kVRKNoError;
 }
 
@@ -128,7 +137,7 @@ void Objects::Die(VRKObject object) {
   Object& dying = *handles.Find<Object>(object);
   dying.isDying = true;
   {
-    Delivery delivery(handles, dying);
+    Delivery delivery(handles, dying, true);
     for (;;) {
       const VRKMessageHandler registration = delivery.Next(objectDied);
       if (registration == VRKMessageHandler{}) break;

@@ -35,6 +35,7 @@ struct MessageHandler final : Item {
   const VRKObject object;
   const Callback<VRKMessageHandlerCallback> callback;
   std::vector<VRKToken> messages;
+  bool isToldOfDeath = false;  // of its object's; it is told once
 };
 
 struct Factory {

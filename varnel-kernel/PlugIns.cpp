@@ -23,36 +23,33 @@ const void* ModuleOf(Function function) noexcept {
 }  // namespace
 
 PlugIns::PlugIns(HandleTable& handleTable, Objects& objectStore, Coercions& coercionStore,
+                 const Trace& hostTrace, const ErrorReports& hostReports,
                  RunningCode*& innermostCode)
     : handles(handleTable),
       objects(objectStore),
       coercions(coercionStore),
+      trace(hostTrace),
+      reports(hostReports),
       running(innermostCode) {}
 
-VRKResult PlugIns::Load(const char* path, const char* prefix, VRKPlugIn& outPlugIn,
-                        std::string& reason) {
-  using Library = std::unique_ptr<void, decltype(&platform::UnloadSharedLibrary)>;
+VRKResult PlugIns::Add(platform::SharedLibrary library, const char* prefix, VRKPlugIn& outPlugIn,
+                       std::string& reason) {
   const std::string name = prefix;
   auto plugIn = std::make_unique<PlugIn>();
-  Library library(platform::LoadSharedLibrary(path, reason), &platform::UnloadSharedLibrary);
-  if (library == nullptr) return kVRKNotFound;
-  const bool complete =
-      FindEntryPoint(library.get(), name + "Initialize", plugIn->initialize, reason) &&
-      FindEntryPoint(library.get(), name + "Terminate", plugIn->terminate, reason) &&
-      FindEntryPoint(library.get(), name + "Version", plugIn->version, reason);
+  plugIn->library = library;
+  const bool complete = FindEntryPoint(library, name + "Initialize", plugIn->initialize, reason) &&
+                        FindEntryPoint(library, name + "Terminate", plugIn->terminate, reason) &&
+                        FindEntryPoint(library, name + "Version", plugIn->version, reason);
   if (!complete) return kVRKNotFound;
-  plugIn->library = library.get();
   outPlugIn = handles.Add(std::move(plugIn));
-  static_cast<void>(library.release());
   return kVRKNoError;
 }
 
 VRKResult PlugIns::Initialize(VRKPlugIn plugIn) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
-  const RunningCode code(running, found->initialize);
   PlugIn* const outer = std::exchange(initialising, found);
-  const VRKResult result = found->initialize(0);
+  const VRKResult result = CallOut(running, kVRKCallbackThrew, found->initialize, 0u);
   initialising = outer;
   return result;
 }
@@ -60,8 +57,8 @@ VRKResult PlugIns::Initialize(VRKPlugIn plugIn) {
 VRKResult PlugIns::Terminate(VRKPlugIn plugIn) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
-  const RunningCode code(running, found->terminate);
-  const VRKResult result = found->terminate(0);
+  const RunningCode code(running, found->terminate);  // until its objects are released, too
+  const VRKResult result = CallOut(running, kVRKCallbackThrew, found->terminate, 0u);
   ReleaseKept(*found, 0);
   return result;
 }
@@ -69,23 +66,25 @@ VRKResult PlugIns::Terminate(VRKPlugIn plugIn) {
 VRKResult PlugIns::Version(VRKPlugIn plugIn, uint32_t& outVersion) {
   const PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
-  const RunningCode code(running, found->version);
-  outVersion = found->version();
+  outVersion = CallOut(running, uint32_t{0}, found->version);
   return kVRKNoError;
 }
 
-// What makes objects and data would be missed by those whose objects are kept, so it is looked for
-// first. Kept objects are released before their handlers are looked for, which may end with them.
-VRKResult PlugIns::Unload(VRKPlugIn plugIn) {
+// What serves others would be missed by them, so it is looked for before anything is given up. Kept
+// objects are released before handlers are looked for, which may end with them; whoever is told of
+// their death cannot unload the library meanwhile, and may install something else.
+VRKResult PlugIns::Remove(VRKPlugIn plugIn, platform::SharedLibrary& outLibrary) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
   const void* const module = ModuleOf(found->initialize);
-  if (IsRunning(module) || MakesThings(module)) return kVRKInUse;
-  ReleaseKept(*found, 0);
-  if (HandlesMessages(module)) return kVRKInUse;
-  const platform::SharedLibrary library = found->library;
+  if (IsRunning(module) || ServesOthers(module)) return kVRKInUse;
+  {
+    const RunningCode code(running, found->initialize);
+    ReleaseKept(*found, 0);
+  }
+  if (ServesOthers(module) || HandlesMessages(module)) return kVRKInUse;
+  outLibrary = found->library;
   handles.Remove<PlugIn>(plugIn);
-  platform::UnloadSharedLibrary(library);
   return kVRKNoError;
 }
 
@@ -101,9 +100,21 @@ VRKResult PlugIns::CreateObject(VRKToken objectClass, VRKDictionary parameters,
     ReleaseKept(*keeper, keptBefore);
     return result;
   }
-  Keep(object);
+  try {
+    keeper->kept.push_back(object);
+  } catch (...) {
+    ReleaseKept(*keeper, keptBefore);
+    objects.Release(object);
+    throw;
+  }
+  objects.Retain(object);
   outObject = object;
   return kVRKNoError;
+}
+
+uint32_t PlugIns::InstalledCount() const noexcept {
+  const size_t serving = objects.Factories().size() + coercions.Installed().size();
+  return static_cast<uint32_t>(serving) + handles.Live(Kind::kMessageHandler);
 }
 
 bool PlugIns::IsRunning(const void* module) const noexcept {
@@ -113,12 +124,13 @@ bool PlugIns::IsRunning(const void* module) const noexcept {
   return false;
 }
 
-bool PlugIns::MakesThings(const void* module) const noexcept {
+bool PlugIns::ServesOthers(const void* module) const noexcept {
   const auto isIn = [&](const auto& each) { return ModuleOf(each.callback.function) == module; };
   const auto& factories = objects.Factories();
   const auto& installed = coercions.Installed();
   return std::any_of(factories.begin(), factories.end(), isIn) ||
-         std::any_of(installed.begin(), installed.end(), isIn);
+         std::any_of(installed.begin(), installed.end(), isIn) ||
+         ModuleOf(trace.Hook()) == module || ModuleOf(reports.Reporter()) == module;
 }
 
 bool PlugIns::HandlesMessages(const void* module) const noexcept {
@@ -127,16 +139,6 @@ bool PlugIns::HandlesMessages(const void* module) const noexcept {
     any = any || ModuleOf(handler.callback.function) == module;
   });
   return any;
-}
-
-void PlugIns::Keep(VRKObject object) {
-  try {
-    initialising->kept.push_back(object);
-  } catch (...) {
-    objects.Release(object);
-    throw;
-  }
-  objects.Retain(object);
 }
 
 void PlugIns::ReleaseKept(PlugIn& plugIn, size_t from) {

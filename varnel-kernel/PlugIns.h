@@ -6,9 +6,11 @@
 
 #include "Callbacks.h"
 #include "Coercions.h"
+#include "ErrorReports.h"
 #include "HandleTable.h"
 #include "Objects.h"
 #include "SharedLibrary.h"
+#include "Trace.h"
 #include "VarnelKernelHost.h"
 
 namespace varnel_kernel {
@@ -28,28 +30,36 @@ struct PlugIn final : Item {
 class PlugIns {
  public:
   PlugIns(HandleTable& handleTable, Objects& objectStore, Coercions& coercionStore,
-          RunningCode*& innermostCode);
+          const Trace& hostTrace, const ErrorReports& hostReports, RunningCode*& innermostCode);
 
-  // On kVRKNotFound `reason` says why.
-  VRKResult Load(const char* path, const char* prefix, VRKPlugIn& outPlugIn, std::string& reason);
+  // Makes a plug-in of a loaded library. On kVRKNotFound `reason` says why.
+  VRKResult Add(platform::SharedLibrary library, const char* prefix, VRKPlugIn& outPlugIn,
+                std::string& reason);
   VRKResult Initialize(VRKPlugIn plugIn);
   VRKResult Terminate(VRKPlugIn plugIn);
   VRKResult Version(VRKPlugIn plugIn, uint32_t& outVersion);
-  VRKResult Unload(VRKPlugIn plugIn);
+
+  // Ends the plug-in, whose library is then to be unloaded.
+  VRKResult Remove(VRKPlugIn plugIn, platform::SharedLibrary& outLibrary);
+
+  // How many handlers, factories and coercions there are.
+  uint32_t InstalledCount() const noexcept;
 
   // Objects::Create, and keeps the object for the plug-in that is being initialised, if one is.
   VRKResult CreateObject(VRKToken objectClass, VRKDictionary parameters, VRKObject& outObject);
 
  private:
   bool IsRunning(const void* module) const noexcept;
-  bool MakesThings(const void* module) const noexcept;
+  bool ServesOthers(const void* module) const noexcept;
   bool HandlesMessages(const void* module) const noexcept;
-  void Keep(VRKObject object);
+
   void ReleaseKept(PlugIn& plugIn, size_t from);
 
   HandleTable& handles;
   Objects& objects;
   Coercions& coercions;
+  const Trace& trace;
+  const ErrorReports& reports;
   RunningCode*& running;
   PlugIn* initialising = nullptr;
 };

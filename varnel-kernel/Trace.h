@@ -5,6 +5,7 @@
 #include <span>
 #include <type_traits>
 
+#include "Callbacks.h"
 #include "VarnelKernelHost.h"
 
 namespace varnel_kernel {
@@ -39,7 +40,10 @@ VRKHostTraceArgument Describe(Argument argument, bool stored) noexcept {
     const auto* const pointer = reinterpret_cast<const void*>(argument);
     constexpr bool kHoldsNumber =
         kTraceKind<Pointed> != kVRKTracePointer && kTraceKind<Pointed> != kVRKTraceText;
-    if constexpr (kHoldsNumber) {
+    if constexpr (std::is_pointer_v<Pointed>) {
+      const void* const kept = stored && argument != nullptr ? *argument : nullptr;
+      return {kVRKTracePointer, 1, 0, kept};
+    } else if constexpr (kHoldsNumber) {
       const uint32_t number = stored && argument != nullptr ? static_cast<uint32_t>(*argument) : 0;
       return {kTraceKind<Pointed>, 1, number, pointer};
     } else {
@@ -50,6 +54,9 @@ VRKHostTraceArgument Describe(Argument argument, bool stored) noexcept {
 
 class Trace {
  public:
+  explicit Trace(RunningCode*& innermostCode) : running(innermostCode) {}
+
+  VRKHostTraceHook Hook() const noexcept { return hook; }
   void Set(VRKHostTraceHook newHook, void* newContext) noexcept {
     hook = newHook;
     context = newContext;
@@ -68,6 +75,7 @@ class Trace {
  private:
   VRKResult Tell(const VRKHostTraceCall& call) noexcept;
 
+  RunningCode*& running;
   VRKHostTraceHook hook = nullptr;
   void* context = nullptr;
   uint32_t depth = 0;

@@ -1,6 +1,7 @@
 #include "Values.h"
 
 #include <cstring>
+#include <limits>
 #include <new>
 #include <utility>
 
@@ -23,7 +24,9 @@ constexpr size_t RoundedUp(size_t size) noexcept {
 }  // namespace
 
 std::unique_ptr<Data> Data::Create(VRKToken type, uint32_t byteCount) {
-  void* const block = ::operator new(RoundedUp(sizeof(Data)) + byteCount);
+  constexpr size_t kHeaderSize = RoundedUp(sizeof(Data));
+  if (byteCount > std::numeric_limits<size_t>::max() - kHeaderSize) throw std::bad_alloc();
+  void* const block = ::operator new(kHeaderSize + byteCount);
   return std::unique_ptr<Data>(::new (block) Data(type, byteCount));
 }
 

@@ -80,17 +80,17 @@ class Values {
     return dictionary == VRKDictionary{} || handles.Find<Dictionary>(dictionary) != nullptr;
   }
 
-  template <class Value>
-  VRKResult Retain(typename Value::Handle handle) noexcept {
-    if (handle == typename Value::Handle{}) return kVRKNoError;
-    return handles.Retain<Value>(handle) ? kVRKNoError : kVRKInvalidHandle;
+  template <class Counted>
+  VRKResult Retain(typename Counted::Handle handle) noexcept {
+    if (handle == typename Counted::Handle{}) return kVRKNoError;
+    return handles.Retain<Counted>(handle) ? kVRKNoError : kVRKInvalidHandle;
   }
 
-  template <class Value>
-  VRKResult Release(typename Value::Handle handle) noexcept {
-    if (handle == typename Value::Handle{}) return kVRKNoError;
-    if (handles.Find<Value>(handle) == nullptr) return kVRKInvalidHandle;
-    if (handles.Release<Value>(handle) == 0) Bury(handles.Remove<Value>(handle));
+  template <class Counted>
+  VRKResult Release(typename Counted::Handle handle) noexcept {
+    if (handle == typename Counted::Handle{}) return kVRKNoError;
+    if (handles.Find<Counted>(handle) == nullptr) return kVRKInvalidHandle;
+    if (handles.Release<Counted>(handle) == 0) Bury(handles.Remove<Counted>(handle));
     return kVRKNoError;
   }
 

@@ -4,7 +4,6 @@
 
 #include <cstdlib>
 
-#include "ErrorReports.h"
 #include "Kernel.h"
 
 using varnel_kernel::Data;
@@ -284,38 +283,33 @@ VRKResult VRKMemoryAllocate(uint32_t byteCount, uint32_t reserved, void** outBlo
 }
 
 const char* VRKTokenGetString(VRKToken token) {
-  Kernel& kernel = Kernel::Instance();
-  const std::lock_guard lock(kernel.mutex);
-  return kernel.isRunning ? kernel.tokens.TextOf(token) : nullptr;
+  const std::lock_guard lock(Kernel::mutex);
+  const Kernel* const kernel = Kernel::Running();
+  return kernel != nullptr ? kernel->tokens.TextOf(token) : nullptr;
 }
 
 // Blocks may outlive the kernel that gave them.
 VRKResult VRKMemoryDeallocate(void* block) {
-  Kernel& kernel = Kernel::Instance();
-  const std::lock_guard lock(kernel.mutex);
+  const std::lock_guard lock(Kernel::mutex);
   const auto agree = [](Kernel&) -> VRKResult { return kVRKNoError; };
-  const VRKResult result =
-      kernel.isRunning ? Serve("VRKMemoryDeallocate", agree, block) : kVRKNoError;
-  if (result != kVRKNoError || block == nullptr) return result;
-  --kernel.memoryBlocks;
+  const VRKResult result = Serve("VRKMemoryDeallocate", agree, block);
+  if (result != kVRKNoError && result != kVRKNotRunning) return result;
+  if (block == nullptr || Kernel::built == nullptr) return kVRKNoError;
+  --Kernel::built->memoryBlocks;
   std::free(block);
   return kVRKNoError;
 }
 
-// A report that the trace hook makes fail is lost, and asks for no debugger.
 uint32_t VRKRuntimeError(uint32_t severity, const char* domain, const char* expression,
                          uint32_t reserved, const char* sourceFile, uint32_t line,
                          const char* function, uint32_t* onceFlag) {
   uint32_t answer = 0;
-  Serve(
-      "VRKRuntimeError",
-      [&](Kernel& kernel) -> VRKResult {
-        const auto report =
-            kernel.reporter != nullptr ? kernel.reporter : varnel_kernel::PrintReport;
-        answer = report(severity, domain, expression, sourceFile, line, function, onceFlag,
-                        kernel.reporterContext);
-        return kVRKNoError;
-      },
-      severity, domain, expression, reserved, sourceFile, line, function, onceFlag);
+  const auto report = [&](Kernel& kernel) -> VRKResult {
+    answer =
+        kernel.reports.Report(severity, domain, expression, sourceFile, line, function, onceFlag);
+    return kVRKNoError;
+  };
+  Serve("VRKRuntimeError", report, severity, domain, expression, reserved, sourceFile, line,
+        function, onceFlag);
   return answer;
 }

@@ -4,6 +4,7 @@
 #include <string>
 
 #include "Kernel.h"
+#include "SharedLibrary.h"
 
 using varnel_kernel::Guarded;
 using varnel_kernel::Kernel;
@@ -15,9 +16,9 @@ thread_local std::string gLoadError;
 // Serves one of the host's calls in its turn, on a kernel that is running.
 template <class Body>
 VRKResult ServeHost(Body body) noexcept {
-  Kernel& kernel = Kernel::Instance();
-  const std::lock_guard lock(kernel.mutex);
-  return kernel.isRunning ? Guarded([&] { return body(kernel); }) : kVRKNotRunning;
+  const std::lock_guard lock(Kernel::mutex);
+  Kernel* const kernel = Kernel::Running();
+  return kernel != nullptr ? Guarded([&] { return body(*kernel); }) : kVRKNotRunning;
 }
 
 template <class Handle>
@@ -29,13 +30,12 @@ VRKResult CreateHandleData(VRKToken type, Handle handle, VRKData* outData, Kerne
 }  // namespace
 
 VRKResult VRKHostStart() {
-  const std::lock_guard lock(Kernel::Instance().mutex);
-  return Kernel::Instance().Start();
+  const std::lock_guard lock(Kernel::mutex);
+  return Guarded([] { return Kernel::Start(); });
 }
 
 VRKResult VRKHostShutDown(VRKHostLiveCounts* outLive) {
-  const std::lock_guard lock(Kernel::Instance().mutex);
-  return Kernel::Instance().ShutDown(outLive);
+  return ServeHost([=](Kernel& kernel) { return kernel.ShutDown(outLive); });
 }
 
 VRKResult VRKHostGetLiveCounts(VRKHostLiveCounts* outLive) {
@@ -46,10 +46,27 @@ VRKResult VRKHostGetLiveCounts(VRKHostLiveCounts* outLive) {
   });
 }
 
+// Libraries are loaded and unloaded out of turn: the system's loader has a lock of its own, under
+// which a library may call the kernel. One that did so and is no plug-in stays loaded.
 VRKResult VRKHostPlugInLoad(const char* path, const char* prefix, VRKPlugIn* outPlugIn) {
-  return ServeHost([=](Kernel& kernel) -> VRKResult {
-    const bool given = path != nullptr && prefix != nullptr && outPlugIn != nullptr;
-    return given ? kernel.plugIns.Load(path, prefix, *outPlugIn, gLoadError) : kVRKInvalidArgument;
+  gLoadError.clear();
+  const bool given = path != nullptr && *path != 0 && prefix != nullptr && outPlugIn != nullptr;
+  uint32_t installedBefore = 0;
+  const VRKResult ready = ServeHost([&](Kernel& kernel) -> VRKResult {
+    installedBefore = kernel.plugIns.InstalledCount();
+    return given ? kVRKNoError : kVRKInvalidArgument;
+  });
+  if (ready != kVRKNoError) return ready;
+  return Guarded([&]() -> VRKResult {
+    const platform::SharedLibrary library = platform::LoadSharedLibrary(path, gLoadError);
+    if (library == nullptr) return kVRKNotFound;
+    bool isInstalled = false;
+    const VRKResult result = ServeHost([&](Kernel& kernel) {
+      isInstalled = kernel.plugIns.InstalledCount() > installedBefore;
+      return kernel.plugIns.Add(library, prefix, *outPlugIn, gLoadError);
+    });
+    if (result != kVRKNoError && !isInstalled) platform::UnloadSharedLibrary(library);
+    return result;
   });
 }
 
@@ -73,7 +90,11 @@ VRKResult VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion) {
 }
 
 VRKResult VRKHostPlugInUnload(VRKPlugIn plugIn) {
-  return ServeHost([=](Kernel& kernel) { return kernel.plugIns.Unload(plugIn); });
+  platform::SharedLibrary library = nullptr;
+  const VRKResult result =
+      ServeHost([&](Kernel& kernel) { return kernel.plugIns.Remove(plugIn, library); });
+  if (library != nullptr) platform::UnloadSharedLibrary(library);
+  return result;
 }
 
 VRKResult VRKHostListCreate(VRKList* outList) {
@@ -113,8 +134,7 @@ VRKResult VRKHostSetTraceHook(VRKHostTraceHook hook, void* context) {
 
 VRKResult VRKHostSetErrorReporter(VRKHostErrorReporter reporter, void* context) {
   return ServeHost([=](Kernel& kernel) -> VRKResult {
-    kernel.reporter = reporter;
-    kernel.reporterContext = context;
+    kernel.reports.Set(reporter, context);
     return kVRKNoError;
   });
 }

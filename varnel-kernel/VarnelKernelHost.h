@@ -48,18 +48,21 @@ VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
 VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefix,
                                              VRKPlugIn* outPlugIn);
 
-/* The reason why the calling thread's latest VRKHostPlugInLoad failed, valid until its next one. */
+/* Why the calling thread's latest VRKHostPlugInLoad returned kVRKNotFound, else empty; valid until
+ * its next one. */
 VRK_API const char* VRK_CALL VRKHostLoadError(void);
 
-/* Call the entry points and return what they return. Objects that come into being while a plug-in
- * initialises are kept alive until its VRKHostPlugInTerminate returns. */
+/* Call the entry points and return what they return. Objects that are created
+ * while a plug-in initialises are kept alive until its VRKHostPlugInTerminate returns, but for
+ * those of a creation that fails. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInInitialize(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInTerminate(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion);
 
 /* Unloads the library, whether it was terminated or not; objects that were kept for it are released
- * first. kVRKInUse, and nothing is unloaded: one of its callbacks is installed still, or running.
- */
+ * first. kVRKInUse, and nothing is unloaded: one of its callbacks, trace hook and reporter
+ * included, is installed still, or its code is running. Code of other libraries that it brought
+ * along is not looked for. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInUnload(VRKPlugIn plugIn);
 
 /* Lists and data of handles. Outs are owned by the caller. */
@@ -80,7 +83,7 @@ VRK_API VRKResult VRK_CALL VRKHostDictionaryDataCreate(VRKDictionary dictionary,
 enum {
   kVRKTraceNumber,  /* in `number` */
   kVRKTraceText,    /* in `pointer` */
-  kVRKTracePointer, /* in `pointer`; bytes, callbacks, contexts, outs that hold no handle */
+  kVRKTracePointer, /* in `pointer`; bytes, callbacks, contexts */
   kVRKTraceObject,  /* handles and tokens, in `number` */
   kVRKTraceHandler,
   kVRKTraceToken,
@@ -91,7 +94,7 @@ enum {
 
 typedef struct VRKHostTraceArgument {
   uint32_t kind;
-  uint32_t isOut; /* `number` is what was stored there, or 0 as long as nothing was */
+  uint32_t isOut; /* the value is what was stored there, or 0 as long as nothing was */
   uint32_t number;
   const void* pointer;
 } VRKHostTraceArgument;
@@ -107,8 +110,9 @@ typedef struct VRKHostTraceCall {
 
 /* Hears of each call of an operation of VarnelKernel.h, but for VRKTokenGetString, twice. What it
  * returns before the call runs, if it is not 0, becomes the call's result, and the call does not
- * run; after it the result is ignored. Calls that the hook makes itself are not traced. No
- * exception may leave it. */
+ * run; after it the result is ignored. VRKRuntimeError has no result code: it
+ * ends with 0, and returns 0 where it did not run. Calls that the hook makes itself are not traced.
+ * No exception may leave it. */
 typedef VRKResult(VRK_CALL* VRKHostTraceHook)(const VRKHostTraceCall* call, void* context);
 
 /* Installs the one trace hook; null for none. */
