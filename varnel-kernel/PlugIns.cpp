@@ -82,7 +82,8 @@ VRKResult PlugIns::Remove(VRKPlugIn plugIn, platform::SharedLibrary& outLibrary)
     const RunningCode code(running, found->initialize);
     ReleaseKept(*found, 0);
   }
-  if (ServesOthers(module) || HandlesMessages(module)) return kVRKInUse;
+  const bool isNeeded = ServesOthers(module) || HandlesMessages(module) || !found->kept.empty();
+  if (isNeeded) return kVRKInUse;
   outLibrary = found->library;
   handles.Remove<PlugIn>(plugIn);
   return kVRKNoError;

@@ -52,17 +52,18 @@ VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefi
  * its next one. */
 VRK_API const char* VRK_CALL VRKHostLoadError(void);
 
-/* Call the entry points and return what they return. Objects that are created
- * while a plug-in initialises are kept alive until its VRKHostPlugInTerminate returns, but for
- * those of a creation that fails. */
+/* Call the entry points and return what they return. Objects that are created while a plug-in
+ * initialises are kept alive until its VRKHostPlugInTerminate returns, but for those of a creation
+ * that fails. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInInitialize(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInTerminate(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion);
 
 /* Unloads the library, whether it was terminated or not; objects that were kept for it are released
- * first. kVRKInUse, and nothing is unloaded: one of its callbacks, trace hook and reporter
- * included, is installed still, or its code is running. Code of other libraries that it brought
- * along is not looked for. */
+ * first. kVRKInUse, and nothing is unloaded: one of its callbacks is installed still, a trace hook
+ * or reporter among them, or its code is running. Code of other libraries that it brought along is
+ * not looked for. Not to be called while another thread loads a library that calls the kernel as it
+ * is loaded. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInUnload(VRKPlugIn plugIn);
 
 /* Lists and data of handles. Outs are owned by the caller. */
