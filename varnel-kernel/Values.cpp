@@ -1,7 +1,6 @@
 #include "Values.h"
 
 #include <cstring>
-#include <limits>
 #include <new>
 #include <utility>
 
@@ -24,9 +23,9 @@ constexpr size_t RoundedUp(size_t size) noexcept {
 }  // namespace
 
 std::unique_ptr<Data> Data::Create(VRKToken type, uint32_t byteCount) {
-  constexpr size_t kHeaderSize = RoundedUp(sizeof(Data));
-  if (byteCount > std::numeric_limits<size_t>::max() - kHeaderSize) throw std::bad_alloc();
-  void* const block = ::operator new(kHeaderSize + byteCount);
+  const size_t size = RoundedUp(sizeof(Data)) + byteCount;
+  if (size < byteCount) throw std::bad_alloc();  // it has wrapped, on 32 bits
+  void* const block = ::operator new(size);
   return std::unique_ptr<Data>(::new (block) Data(type, byteCount));
 }
 
