@@ -8,10 +8,10 @@
 
 namespace tovali_private {
 
-// A hash table over whole keys, seeded anew in every process, so that an image can crowd
-// its slots in a small share at most of the processes that load it. It owns none of its entries.
-// Several of them may have equal keys: the one added last hides the others, and they come to light
-// again, latest first, as those before them are removed.
+// A hash table over whole keys, seeded anew in every process, so that an image can crowd its slots
+// in a small share at most of the processes that load it. It owns none of its entries. Several of
+// them may have equal keys: the one added last hides the others, and they come to light again,
+// latest first, as those before them are removed.
 //
 // No operation allocates but Add, which grows the slots as entries come; where there is no memory
 // for that the slots stay as they are and lookups slow down.

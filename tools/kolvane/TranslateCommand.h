@@ -3,6 +3,6 @@
 
 #include "Messages.h"
 
-// `argv[0]` is the command's own name. Throws UsageError,
-// CommandLine::HelpPrinted, Failure and ClosedPipe.
+// `argv[0]` is the command's own name. Throws UsageError, CommandLine::HelpPrinted, Failure and
+// ClosedPipe.
 ExitStatus RunTranslate(int argc, const char* const* argv);
