@@ -48,6 +48,7 @@ VRKResult PlugIns::Add(platform::SharedLibrary library, const char* prefix, VRKP
 VRKResult PlugIns::Initialize(VRKPlugIn plugIn) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
+  if (IsRunning(ModuleOf(found->initialize))) return kVRKInUse;
   PlugIn* const outer = std::exchange(initialising, found);
   const VRKResult result = CallOut(running, kVRKCallbackThrew, found->initialize, 0u);
   initialising = outer;
@@ -57,6 +58,7 @@ VRKResult PlugIns::Initialize(VRKPlugIn plugIn) {
 VRKResult PlugIns::Terminate(VRKPlugIn plugIn) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
+  if (IsRunning(ModuleOf(found->initialize))) return kVRKInUse;
   const RunningCode code(running, found->terminate);  // until its objects are released, too
   const VRKResult result = CallOut(running, kVRKCallbackThrew, found->terminate, 0u);
   ReleaseKept(*found, 0);

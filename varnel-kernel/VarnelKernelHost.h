@@ -54,7 +54,8 @@ VRK_API const char* VRK_CALL VRKHostLoadError(void);
 
 /* Call the entry points and return what they return. Objects that are created while a plug-in
  * initialises are kept alive until its VRKHostPlugInTerminate returns, but for those of a creation
- * that fails. */
+ * that fails. kVRKInUse, and nothing is initialised or terminated: code of the plug-in is running.
+ */
 VRK_API VRKResult VRK_CALL VRKHostPlugInInitialize(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInTerminate(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion);

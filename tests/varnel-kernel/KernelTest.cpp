@@ -605,11 +605,14 @@ TEST_F(Kernel, LoadsPlugInsAndKeepsTheirObjects) {
   ASSERT_EQ(VRKHostSetTraceHook(RunTrace, &notesObjects), 0u);
   EXPECT_EQ(VRKHostPlugInInitialize(plugIn), 0u);
   ASSERT_EQ(VRKHostSetTraceHook(nullptr, nullptr), 0u);
-  VRKResult inner = 0;
-  OnMessage unloads = [&](VRKObject, VRKToken) { return inner = VRKHostPlugInUnload(plugIn); };
-  Install(kept, unloads, {kDied});
+  std::vector<VRKResult> inner;
+  OnMessage drives = [&](VRKObject, VRKToken) -> VRKResult {
+    inner = {VRKHostPlugInInitialize(plugIn), VRKHostPlugInTerminate(plugIn), VRKHostPlugInUnload(plugIn)};
+    return 0;
+  };
+  Install(kept, drives, {kDied});
   EXPECT_EQ(VRKHostPlugInUnload(plugIn), 0u);  // without terminate
-  EXPECT_EQ(inner, kVRKInUse);
+  EXPECT_EQ(inner, std::vector<VRKResult>(3, kVRKInUse));
 }
 
 TEST_F(Kernel, ShutsDownAndStartsAgain) {

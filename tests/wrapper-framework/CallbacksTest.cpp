@@ -218,14 +218,15 @@ TEST_F(CallbacksTest, MayDeleteThemselves) {
   EXPECT_TRUE(Varnel::DeliverMessage(object.Get(), word, EmptyDictionary(), false));
   EXPECT_EQ(Alive(), "objects 1 ");
 
-  bool takes = true;
+  VRKResult answer = 0;
   VRKToken last{};
   const auto take = [&](VRKObject, VRKToken message, const DictionaryRef&) {
     last = message;
-    return takes;
+    if (answer == CallTrace::kFailure) throw Varnel::Exception(answer);
+    return answer == 0;
   };
-  for (const VRKResult code : {0u, 256u}) {
-    takes = code == 0;
+  for (const VRKResult code : {0u, 256u, CallTrace::kFailure}) {
+    answer = code;
     new Handler(take, object.Get(), true);
     EXPECT_EQ(VRKObjectDeliverMessage(object.Get(), died, {}, 1), code);
     EXPECT_EQ(last, died);

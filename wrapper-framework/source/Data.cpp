@@ -123,4 +123,10 @@ RawPayload GetRawPayload(const DataRef& source) {
   return ReadPayload(held, nullptr);
 }
 
+VRKToken GetType(const DataRef& source) {
+  VRKToken type{};
+  ThrowIfFailed(VRKDataGetData(source.Get(), nullptr, nullptr, &type));
+  return type;
+}
+
 }  // namespace Varnel

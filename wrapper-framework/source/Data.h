@@ -43,6 +43,8 @@ struct RawPayload {
 
 RawPayload GetRawPayload(const DataRef& source);
 
+VRKToken GetType(const DataRef& source);
+
 // The first bytes of the data, whatever its type, as a T. Another number of bytes than T has is
 // reported, and what is missing is 0.
 template <class T>

@@ -70,18 +70,20 @@ void MessageHandler::Install(VRKObject newObject) {
   }
 }
 
-// The handler may be gone when HandleMessage or ObjectDied returns.
+// The handler may be gone when HandleMessage or ObjectDied returns. It hears of its object's death
+// whatever goes wrong on the way, or it would be left behind on an object that is no more.
 VRKResult VRK_CALL MessageHandler::Callback(VRKObject receiver, VRKToken message,
                                             VRKDictionary parameters, void* context) {
+  MessageHandler& handler = *static_cast<MessageHandler*>(context);
+  const VRKResult handled = AtBoundary(parameters, [&] {
+    const DictionaryRef held(parameters);
+    const bool taken = handler.HandleMessage(receiver, message, held);
+    return taken ? kResultNoError : kResultNotHandled;
+  });
+  if (message != gObjectDied) return handled;
   return AtBoundary(parameters, [&] {
-    MessageHandler& handler = *static_cast<MessageHandler*>(context);
-    bool handled = false;
-    {
-      const DictionaryRef held(parameters);
-      handled = handler.HandleMessage(receiver, message, held);
-    }
-    if (message == gObjectDied) handler.ObjectDied();
-    return handled ? kResultNoError : kResultNotHandled;
+    handler.ObjectDied();
+    return handled;
   });
 }
 

@@ -28,8 +28,7 @@ class MessageHandler : public Memory<KernelMemoryPolicy> {
   // kResultHandlerNotInstalled.
   virtual void SetObject(VRKObject newObject);
 
-  // Called when the object has died, after HandleMessage was. If HandleMessage throws then, it is
-  // not called.
+  // Called when the object has died, after HandleMessage was, also if that threw.
   virtual void ObjectDied();
 
   // Returns whether it took the message; what it throws becomes the delivery's result. It may
