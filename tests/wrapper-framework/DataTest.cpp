@@ -130,22 +130,6 @@ TEST_F(DataTest, IsCheckedWhenItIsRead) {
   }
 }
 
-struct Report {
-  std::string text;
-  uint32_t flagToSet = 0;
-  uint32_t answer = 0;
-  uint32_t count = 0;
-};
-
-uint32_t VRK_CALL NoteReport(uint32_t severity, const char* domain, const char* expression, const char* sourceFile, uint32_t line,
-                             const char* function, uint32_t* onceFlag, void* context) {
-  Report& report = *static_cast<Report*>(context);
-  report.text = std::to_string(severity) + '|' + domain + '|' + expression + '|' + sourceFile + '|' + std::to_string(line) + '|' + function;
-  ++report.count;
-  *onceFlag = report.flagToSet;
-  return report.answer;
-}
-
 #if defined(SIGTRAP) && (defined(__x86_64__) || defined(__i386__))
 volatile std::sig_atomic_t gBreaks = 0;
 #define COUNT_BREAKS() std::signal(SIGTRAP, [](int) { gBreaks = gBreaks + 1; })
@@ -153,7 +137,7 @@ volatile std::sig_atomic_t gBreaks = 0;
 
 TEST_F(DataTest, ReportsKeysOfAnotherSizeAndGoesOn) {
   Report report;
-  VRKHostSetErrorReporter(&NoteReport, &report);
+  VRKHostSetErrorReporter(&Report::Note, &report);
   struct {
     uint32_t count, reports;
     uint32_t value;
@@ -172,7 +156,7 @@ TEST_F(DataTest, ReportsKeysOfAnotherSizeAndGoesOn) {
 
 TEST_F(DataTest, ReportsUntilTheKernelHasHadEnough) {
   Report report;
-  VRKHostSetErrorReporter(&NoteReport, &report);
+  VRKHostSetErrorReporter(&Report::Note, &report);
   static Varnel::CheckSite site{"domain", "false", "file", 7, "function"};
   int evaluations = 0;
   const auto check = [&](bool holds) {

@@ -83,3 +83,13 @@ VRKResult CodeOf(const std::function<void()>& body) {
     return 0;
   });
 }
+
+uint32_t Report::Note(uint32_t severity, const char* domain, const char* expression, const char* sourceFile, uint32_t line,
+                      const char* function, uint32_t* onceFlag, void* context) {
+  Report& report = *static_cast<Report*>(context);
+  report.text = std::to_string(severity) + '|' + domain + '|' + expression + '|' + sourceFile + '|' + std::to_string(line) + '|' + function;
+  ++report.count;
+  report.flag = onceFlag;
+  *onceFlag = report.flagToSet;
+  return report.answer;
+}

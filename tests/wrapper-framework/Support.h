@@ -120,5 +120,17 @@ class Coercion : public Varnel::DataCoercion {
   Function function;
 };
 
+// What VRKRuntimeError is told, and what it answers.
+struct Report {
+  static uint32_t VRK_CALL Note(uint32_t severity, const char* domain, const char* expression, const char* sourceFile, uint32_t line,
+                                const char* function, uint32_t* onceFlag, void* context);
+
+  std::string text;
+  uint32_t flagToSet = 0;
+  uint32_t answer = 0;
+  uint32_t count = 0;
+  uint32_t* flag = nullptr;  // of the latest report
+};
+
 // What a boundary would return for what `body` throws, or 0.
 VRKResult CodeOf(const std::function<void()>& body);

@@ -1,0 +1,37 @@
+// Translators: what turns keys with their default texts into localised text.
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+namespace Varnel {
+
+// A translator is in the same process, or a kernel object behind a client. Failures are exceptions;
+// what they are depends on the translator. Nothing here is synchronised.
+class StringTranslatorInterface {
+ public:
+  // Translates from now on what other translators have no translation of, and whatever is
+  // translated by no translator in particular.
+  virtual void MakeDefault() = 0;
+
+  // Adds the entries of an image, the complete contents of a dictionary file, to those it has; a
+  // later translation of a name wins. A damaged image adds the entries before the damage, and is no
+  // failure. What the pointer points at is read during the call only; it may be null when the count
+  // is 0.
+  //
+  // How bytes are taken is up to the translator: one in the same process takes an image as it is, a
+  // client takes text in UTF-8. Units, in memory's byte order, hold the image's bytes two by two.
+  // VRKTranslationImage.h makes units of any image.
+  virtual void SetTranslations(const char* bytes, uint32_t byteCount) = 0;
+  virtual void SetTranslations(const uint16_t* units, uint32_t unitCount) = 0;
+
+  // Replaces `result` by the translation of a key such as $$$/Dialog/Ok=OK, in UTF-8, followed by
+  // one 0 unit; when it throws, `result` is as it was. `keyLength` is the key's length in bytes,
+  // with or without its terminating NUL.
+  virtual void TranslateString(const char* key, uint32_t keyLength,
+                               std::vector<uint16_t>& result) = 0;
+
+  virtual ~StringTranslatorInterface() = default;
+};
+
+}  // namespace Varnel

@@ -1,0 +1,26 @@
+#include "VRKStringTranslatorFactory.h"
+
+#include <memory>
+#include <utility>
+
+#include "Conversion.h"
+#include "Tokens.h"
+#include "VRKStringTranslatorHandler.h"
+
+namespace Varnel {
+
+StringTranslatorFactory::StringTranslatorFactory(Creator translatorCreator,
+                                                 orvane::name_t servedClass)
+    : creator(std::move(translatorCreator)) {
+  Register(MakeToken(servedClass), 0);
+}
+
+void StringTranslatorFactory::InitializeObject(VRKToken, const DictionaryRef& parameters,
+                                               const ObjectRef& newObject) {
+  const boost::shared_ptr<StringTranslatorInterface> translator = creator(AsDictionary(parameters));
+  auto handler = std::make_unique<StringTranslatorHandler>(translator);
+  handler->LiveWith(newObject.Get());
+  static_cast<void>(handler.release());  // it is its object's from here on
+}
+
+}  // namespace Varnel

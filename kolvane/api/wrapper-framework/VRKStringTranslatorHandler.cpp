@@ -1,0 +1,126 @@
+#include "VRKStringTranslatorHandler.h"
+
+#include <boost/array.hpp>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "Data.h"
+#include "ReportedCheck.h"
+#include "Tokens.h"
+#include "VRKStringTranslatorProtocol.h"
+
+namespace Varnel {
+namespace {
+
+// Shared by all handlers, and made anew after an object that a handler lived with has died: the
+// kernel may have ended since the tokens were made.
+struct HandlerTokens {
+  StaticToken makeDefault{kMessageMakeDefault};
+  StaticToken setTranslations{kMessageSetTranslations};
+  StaticToken translateString{kMessageTranslateString};
+  StaticToken messageResult{kParameterMessageResult};
+  StaticToken translations{kParameterTranslations};
+  StaticToken translationKey{kParameterTranslationKey};
+  StaticToken typeLocaleIndependentUTF8{kTypeLocaleIndependentUTF8};
+  StaticToken typeUTF8{kTypeUTF8};
+  StaticToken typeUTF16{kTypeUTF16};
+};
+
+constinit HandlerTokens gTokens;
+
+constexpr char kDomain[] = "orvane.varnel.localizable-strings.user-glue.string-translator-handler";
+constexpr char kSourceFile[] = "kolvane/api/wrapper-framework/VRKStringTranslatorHandler";
+
+CheckSite gTranslationsSite{.domain = kDomain,
+                            .condition = "translations.Coerce(gTypeUTF16, translations)",
+                            .sourceFile = kSourceFile,
+                            .line = 210,
+                            .function = "Varnel::StringTranslatorHandler::HandleSetTranslations"};
+
+CheckSite gTranslationKeySite{.domain = kDomain,
+                              .condition = "translationKey.Coerce(gTypeUTF8, translationKey)",
+                              .sourceFile = kSourceFile,
+                              .line = 236,
+                              .function = "Varnel::StringTranslatorHandler::HandleTranslateString"};
+
+// Keys end in NUL when they reach a translator, except the empty one.
+std::string KeyText(DataRef& translationKey) {
+  if (GetType(translationKey) != gTokens.typeLocaleIndependentUTF8.Get()) {
+    ReportedCheck(gTranslationKeySite,
+                  [&] { return translationKey.Coerce(gTokens.typeUTF8.Get(), translationKey); });
+  }
+  std::string text = GetUTF8(translationKey);
+  if (!text.empty() && text.back() != '\0') text.push_back('\0');
+  return text;
+}
+
+}  // namespace
+
+StringTranslatorHandler::StringTranslatorHandler(
+    boost::shared_ptr<StringTranslatorInterface> servingTranslator)
+    : MessageHandler({}, false), translator(std::move(servingTranslator)) {}
+
+void StringTranslatorHandler::SetObject(VRKObject newObject) {
+  MessageHandler::SetObject(newObject);
+  boost::array<VRKToken, 3> messages{};
+  messages.at(0) = gTokens.makeDefault.Get();
+  messages.at(1) = gTokens.setTranslations.Get();
+  messages.at(2) = gTokens.translateString.Get();
+  AddMessages(messages.data(), static_cast<uint32_t>(messages.size()));
+}
+
+void StringTranslatorHandler::LiveWith(VRKObject newObject) {
+  SetObject(newObject);
+  ownsItself = true;
+}
+
+void StringTranslatorHandler::ObjectDied() {
+  if (!ownsItself) {
+    MessageHandler::ObjectDied();
+    return;
+  }
+  gTokens = {};
+  delete this;
+}
+
+bool StringTranslatorHandler::HandleMessage(VRKObject, VRKToken message,
+                                            const DictionaryRef& parameters) {
+  if (message == gTokens.makeDefault.Get()) {
+    translator->MakeDefault();
+  } else if (message == gTokens.setTranslations.Get()) {
+    HandleSetTranslations(parameters);
+  } else if (message == gTokens.translateString.Get()) {
+    HandleTranslateString(parameters);
+  } else {
+    return false;
+  }
+  return true;
+}
+
+// The next two call coercions, which may be anybody's code and may release the object, and this
+// handler with it. So they keep the translator, and touch the handler no more.
+
+void StringTranslatorHandler::HandleSetTranslations(const DictionaryRef& parameters) {
+  const boost::shared_ptr<StringTranslatorInterface> kept = translator;
+  DataRef translations = parameters.GetEntry(gTokens.translations.Get());
+  ReportedCheck(gTranslationsSite,
+                [&] { return translations.Coerce(gTokens.typeUTF16.Get(), translations); });
+  std::vector<uint16_t> units;
+  GetUTF16(translations, units);
+  kept->SetTranslations(units.empty() ? nullptr : units.data(),
+                        static_cast<uint32_t>(units.size()));
+}
+
+void StringTranslatorHandler::HandleTranslateString(const DictionaryRef& parameters) {
+  const boost::shared_ptr<StringTranslatorInterface> kept = translator;
+  DataRef translationKey = parameters.GetEntry(gTokens.translationKey.Get());
+  const std::string key = KeyText(translationKey);
+  std::vector<uint16_t> result;
+  kept->TranslateString(key.data(), static_cast<uint32_t>(key.size()), result);
+  const uint16_t* const units = result.empty() ? nullptr : result.data();
+  const DataRef translation = MakeUTF16LEData(units, static_cast<uint32_t>(result.size()));
+  parameters.SetEntry(gTokens.messageResult.Get(), translation);
+}
+
+}  // namespace Varnel

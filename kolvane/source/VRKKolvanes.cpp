@@ -1,0 +1,112 @@
+#include "VRKKolvanes.h"
+
+#include <memory>
+#include <utility>
+
+#include "Boundary.h"
+#include "Names.h"
+#include "ResultCodes.h"
+#include "VRKDefaultStringTranslator.h"
+#include "VRKKolvaneCoercionImpl.h"
+#include "VRKStringTranslatorClient.h"
+#include "VRKStringTranslatorFactory.h"
+#include "VRKStringTranslatorImpl.h"
+#include "VRKStringTranslatorProtocol.h"
+
+namespace {
+
+using Varnel::InputContractViolation;
+using Varnel::StringTranslatorFactory;
+using Varnel::Kolvanes::CoercionImpl;
+
+// Made as the library is loaded. NOLINTBEGIN(cert-err58-cpp): no load goes on without memory.
+const orvane::name_t gStringTranslatorClass(Varnel::kClassStringTranslator);
+const orvane::name_t gDefaultStringTranslatorClass(Varnel::kClassDefaultStringTranslator);
+// NOLINTEND(cert-err58-cpp)
+
+// Should the library be unloaded while it is initialised, these unregister the classes, the default
+// one first. The coercion is left alone then.
+std::unique_ptr<StringTranslatorFactory> gStringTranslatorFactory;
+std::unique_ptr<StringTranslatorFactory> gDefaultStringTranslatorFactory;
+CoercionImpl* gKolvaneCoercion = nullptr;
+
+void RequireZero(uint32_t reserved) {
+  if (reserved != 0) throw InputContractViolation();
+}
+
+void RegisterTranslatorClasses() {
+  using namespace Varnel::LocalizableStrings;
+  gStringTranslatorFactory =
+      std::make_unique<StringTranslatorFactory>(CreateStringTranslatorImpl, gStringTranslatorClass);
+  const auto firstTranslator = Varnel::CreateStringTranslator();
+  firstTranslator->MakeDefault();
+  gDefaultStringTranslatorFactory = std::make_unique<StringTranslatorFactory>(
+      GetDefaultStringTranslator, gDefaultStringTranslatorClass);
+}
+
+void UnregisterTranslatorClasses() noexcept {
+  gStringTranslatorFactory.reset();
+  gDefaultStringTranslatorFactory.reset();
+}
+
+void InitializeTranslatorClasses(uint32_t reserved) {
+  RequireZero(reserved);
+  try {
+    RegisterTranslatorClasses();
+  } catch (...) {
+    UnregisterTranslatorClasses();
+    throw;
+  }
+}
+
+void ReplaceCoercion(std::unique_ptr<CoercionImpl> replacement) noexcept {
+  const std::unique_ptr<CoercionImpl> replaced(
+      std::exchange(gKolvaneCoercion, replacement.release()));
+}
+
+void RemoveCoercion() noexcept {
+  ReplaceCoercion(nullptr);
+  Varnel::Kolvanes::ResetTypeTokens();
+}
+
+void InitializeCoercion(uint32_t reserved) {
+  RequireZero(reserved);
+  try {
+    ReplaceCoercion(std::make_unique<CoercionImpl>());
+  } catch (...) {
+    RemoveCoercion();
+    throw;
+  }
+}
+
+void TerminateCoercion(uint32_t reserved) {
+  RequireZero(reserved);
+  RemoveCoercion();
+}
+
+void TerminateTranslatorClasses(uint32_t reserved) {
+  RequireZero(reserved);
+  UnregisterTranslatorClasses();
+}
+
+}  // namespace
+
+VRKResult VRKKolvanesInitialize(uint32_t reserved) {
+  return Varnel::AtBoundary({}, [=] {
+    InitializeTranslatorClasses(reserved);
+    InitializeCoercion(reserved);
+    return Varnel::kResultNoError;
+  });
+}
+
+VRKResult VRKKolvanesTerminate(uint32_t reserved) {
+  return Varnel::AtBoundary({}, [=] {
+    TerminateCoercion(reserved);
+    TerminateTranslatorClasses(reserved);
+    return Varnel::kResultNoError;
+  });
+}
+
+uint32_t VRKKolvanesVersion() {
+  return 0x00010000;
+}

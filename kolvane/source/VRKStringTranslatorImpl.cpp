@@ -1,0 +1,48 @@
+#include "VRKStringTranslatorImpl.h"
+
+#include <boost/interprocess/streams/bufferstream.hpp>
+#include <cstring>
+
+#include "Exceptions.h"
+#include "TranslatedString.h"
+#include "VRKDefaultStringTranslator.h"
+
+namespace Varnel::LocalizableStrings {
+namespace {
+
+constexpr uint32_t kMostBytes = 0x7FFFFFFF;
+
+}  // namespace
+
+void StringTranslatorImpl::MakeDefault() noexcept {
+  dictionary.MakeDefault();
+  gDefaultStringTranslator = weak_from_this();
+}
+
+void StringTranslatorImpl::SetTranslations(const char* bytes, uint32_t byteCount) {
+  if (byteCount > kMostBytes) throw InvariantViolation();
+  const bool endsAtZero = byteCount == 0 && bytes != nullptr;
+  boost::interprocess::ibufferstream image(bytes, endsAtZero ? std::strlen(bytes) : byteCount);
+  dictionary.Load(image);
+}
+
+void StringTranslatorImpl::SetTranslations(const uint16_t* units, uint32_t unitCount) {
+  if (unitCount > kMostBytes / 2) throw InvariantViolation();
+  SetTranslations(reinterpret_cast<const char*>(units), unitCount * 2);
+}
+
+void StringTranslatorImpl::TranslateString(const char* key, uint32_t,
+                                           std::vector<uint16_t>& result) {
+  constexpr int kUTF8 = 1;
+  const TranslatedString translation = dictionary.Translate(key, &kUTF8);
+  const uint32_t size = translation.BufferSize();
+  result.resize(size);
+  translation.CopyTo(result.data(), size, true);
+}
+
+boost::shared_ptr<StringTranslatorInterface> CreateStringTranslatorImpl(
+    orvane::dictionary_t const&) {
+  return boost::shared_ptr<StringTranslatorInterface>(new StringTranslatorImpl);
+}
+
+}  // namespace Varnel::LocalizableStrings

@@ -1,0 +1,274 @@
+// Messages between a client and a handler, with a translator that notes what reaches it.
+
+#include <boost/smart_ptr/make_shared.hpp>
+#include <memory>
+
+#include "Data.h"
+#include "ResultCodes.h"
+#include "Support.h"
+#include "Tokens.h"
+#include "VRKStringTranslatorClient.h"
+#include "VRKStringTranslatorFactory.h"
+#include "VRKStringTranslatorHandler.h"
+#include "VRKStringTranslatorProtocol.h"
+#include "VRKTranslationImage.h"
+
+namespace {
+
+using namespace Varnel;
+using Units = std::vector<uint16_t>;
+
+struct NotingTranslator : StringTranslatorInterface {
+  void MakeDefault() override { heard = "default"; }
+  void SetTranslations(const char*, uint32_t) override { FAIL() << "bytes never reach a handler's translator"; }
+  void SetTranslations(const uint16_t* units, uint32_t unitCount) override {
+    heard = units == nullptr ? "set null" : "set";
+    for (uint32_t i = 0; i < unitCount; ++i) heard += ' ' + std::to_string(units[i]);
+  }
+  void TranslateString(const char* key, uint32_t keyLength, Units& result) override {
+    EXPECT_TRUE(result.empty());
+    heard = "translate " + std::to_string(keyLength) + ' ' + std::string(key, keyLength);
+    if (failure != 0) ThrowResultCode(failure);
+    result = answer;
+  }
+
+  std::string heard;
+  Units answer = {'x', 0};
+  uint32_t failure = 0;
+};
+
+class MessagingTest : public KernelTest {
+ protected:
+  boost::shared_ptr<NotingTranslator> translator = boost::make_shared<NotingTranslator>();
+  std::unique_ptr<StringTranslatorFactory> factory = std::make_unique<StringTranslatorFactory>(
+      [this](orvane::dictionary_t const& parameters) {
+        createdWith = parameters.use_count() == 0 ? 0 : parameters.elements().size();
+        return translator;
+      },
+      orvane::name_t(kClassStringTranslator));
+  size_t createdWith = 0;
+
+  static ObjectRef NewObject() {
+    ObjectRef object;
+    object.Create(MakeToken(kClassStringTranslator), {});
+    return object;
+  }
+  static DictionaryRef With(const char* parameter, const char* type, const std::string& bytes) {
+    DictionaryRef parameters;
+    parameters.Create();
+    if (parameter != nullptr) parameters.SetEntry(MakeToken(parameter), MakeData(type, bytes.data(), static_cast<uint32_t>(bytes.size())));
+    return parameters;
+  }
+  static VRKResult Send(const ObjectRef& object, const char* message, const DictionaryRef& parameters) {
+    return VRKObjectDeliverMessage(object.Get(), MakeToken(message), parameters.Get(), 1);
+  }
+};
+
+TEST_F(MessagingTest, CarriesEachOperationToTheTranslatorAndTheAnswerBack) {
+  const auto client = CreateStringTranslator();
+  const uint16_t units[] = {0xFEFF, 'a'};
+  const std::string key = "k";
+  Units result(10, 7);
+  const auto translate = [&](uint32_t length) { client->TranslateString(key.c_str(), length, result); };
+  const struct {
+    std::function<void()> operation;
+    std::string heard;
+  } cases[] = {{[&] { client->MakeDefault(); }, "default"},
+               {[&] { client->SetTranslations(units, 2); }, "set 65279 97"},
+               {[&] { client->SetTranslations(units + 1, 1); }, "set 97"},
+               {[&] { client->SetTranslations(units, 0); }, "set null"},
+               {[&] { client->SetTranslations("\xC3\xA9", 2); }, "set 65279 233"},
+               {[&] { translate(1); }, {"translate 2 k\0", 14}},
+               {[&] { translate(2); }, {"translate 2 k\0", 14}},
+               {[&] { translate(0); }, "translate 0 "}};
+  for (const auto& each : cases) {
+    each.operation();
+    EXPECT_EQ(translator->heard, each.heard);
+  }
+  EXPECT_EQ(result, translator->answer);
+  for (const Units& answer : {Units{}, Units{'n', 'o', ' ', 'n', 'u', 'l'}, Units(1000, 0xD800)}) {
+    translator->answer = answer;
+    translate(1);
+    EXPECT_EQ(result, answer);
+  }
+  translator->failure = 77;
+  EXPECT_EQ(CodeOf([&] { translate(1); }), 77u);
+  EXPECT_EQ(result, Units(1000, 0xD800));
+  EXPECT_EQ(Alive(), "objects 1 handlers 1 factories 1 blocks 2 ");
+}
+
+TEST_F(MessagingTest, ClientsHoldTheirObjectsAndMissNothingElse) {
+  StringTranslatorClient client;
+  Units result(3, 3);
+  EXPECT_EQ(CodeOf([&] { client.MakeDefault(); }), VRKResult{kVRKInvalidHandle}) << "without an object";
+  ObjectRef plain;
+  plain.Create({}, {});
+  client.SetObject(plain);
+  client.MakeDefault();
+  client.SetTranslations("x", 1);
+  EXPECT_EQ(CodeOf([&] { client.TranslateString("k", 1, result); }), VRKResult{kVRKNotFound});
+  EXPECT_EQ(result, Units(3, 3));
+
+  CallTrace trace;
+  ObjectRef object = NewObject();
+  trace.Take();
+  trace.FailNext("VRKObjectRelease");
+  EXPECT_EQ(CodeOf([&] { client.SetObject(object); }), CallTrace::kFailure);
+  EXPECT_EQ(trace.Take(), (std::vector<std::string>{Call("VRKObjectRetain", object.Get()), Call("VRKObjectRelease", plain.Get()),
+                                                    Call("VRKObjectRelease", object.Get())}));
+  client.SetObject(object);
+  object.Reset();
+  { const StringTranslatorClient copy = client; }
+  client.TranslateString("k", 1, result);
+  EXPECT_EQ(result, translator->answer);
+}
+
+TEST_F(MessagingTest, LeavesAloneWhatItDoesNotServe) {
+  const ObjectRef object = NewObject();
+  const struct {
+    const char *message, *parameter, *type;
+    VRKResult result;
+    const char* heard;
+  } cases[] = {{"message:test", kParameterTranslations, kTypeUTF16, kVRKNotHandled, ""},
+               {kMessageSetTranslations, nullptr, nullptr, kVRKNotFound, ""},
+               {kMessageTranslateString, kParameterTranslations, kTypeUTF16, kVRKNotFound, ""},
+               {kMessageMakeDefault, kParameterTranslations, kTypeUTF16, 0, "default"}};
+  for (const auto& each : cases) {
+    translator->heard.clear();
+    const DictionaryRef parameters = With(each.parameter, each.type, "ab");
+    EXPECT_EQ(Send(object, each.message, parameters), each.result) << each.message;
+    EXPECT_EQ(translator->heard, each.heard);
+    EXPECT_EQ(parameters.CreateKeyList().GetSize(), each.parameter == nullptr ? 0u : 1u);
+  }
+}
+
+// What cannot be coerced is coerced twice and reported, and only once when the kernel has heard
+// enough.
+TEST_F(MessagingTest, ReportsWhatItCannotCoerce) {
+  const ObjectRef object = NewObject();
+  const std::string start = "2|orvane.varnel.localizable-strings.user-glue.string-translator-handler|";
+  const std::string file = "|kolvane/api/wrapper-framework/VRKStringTranslatorHandler|";
+  const struct {
+    const char *message, *parameter, *type;
+    std::string report;
+  } cases[] = {{kMessageSetTranslations, kParameterTranslations, kTypeUTF16,
+                "translations.Coerce(gTypeUTF16, translations)" + file + "210|Varnel::StringTranslatorHandler::HandleSetTranslations"},
+               {kMessageTranslateString, kParameterTranslationKey, kTypeUTF8,
+                "translationKey.Coerce(gTypeUTF8, translationKey)" + file + "236|Varnel::StringTranslatorHandler::HandleTranslateString"}};
+  for (const auto& each : cases) {
+    Report report;
+    VRKHostSetErrorReporter(&Report::Note, &report);
+    int coercions = 0;
+    Coercion coercion([&](auto&&...) { return ++coercions, false; });
+    coercion.Install(MakeToken("type:test"), MakeToken(each.type));
+    coercion.Install(MakeToken(kTypeLocaleIndependentUTF8), MakeToken(each.type));
+    const DictionaryRef parameters = With(each.parameter, "type:test", "ab");
+    for (const int expected : {2, 2, 1, 1}) {
+      coercions = 0;
+      report.flagToSet = report.count;
+      EXPECT_EQ(Send(object, each.message, parameters), kResultInputContractViolation);
+      EXPECT_EQ(coercions, expected);
+    }
+    EXPECT_EQ(report.text, start + each.report);
+    EXPECT_EQ(report.count, 2u);
+    *report.flag = 0;
+    EXPECT_EQ(Send(object, each.message, With(each.parameter, kTypeLocaleIndependentUTF8, "k")), kResultInputContractViolation);
+    EXPECT_EQ(report.count, each.type == kTypeUTF8 ? 2u : 3u) << "a key is expected to be what it is";
+    *report.flag = 0;
+  }
+  EXPECT_EQ(translator->heard, "");
+}
+
+TEST_F(MessagingTest, TranslatesWhatTheKernelMakesOfAKey) {
+  Coercion coercion([](const DataRef&, VRKToken, VRKToken, DataRef& result) { return result = MakeUTF8Data("coerced", 7), true; });
+  coercion.Install(MakeToken(kTypeLocaleIndependentUTF8), MakeToken(kTypeUTF8));
+  const DictionaryRef parameters = With(kParameterTranslationKey, kTypeLocaleIndependentUTF8, "$$$/a=b");
+  EXPECT_EQ(Send(NewObject(), kMessageTranslateString, parameters), 0u);
+  EXPECT_EQ(translator->heard, std::string("translate 8 coerced\0", 20));
+  const DataRef result = parameters.GetEntry(MakeToken(kParameterMessageResult));
+  EXPECT_EQ(GetType(result), MakeToken(kTypeUTF16LE));
+  EXPECT_EQ(GetRawPayload(result).byteCount, 4u);
+}
+
+TEST_F(MessagingTest, HandlersLiveWithTheirObjects) {
+  ObjectRef first = NewObject();
+  const ObjectRef second = NewObject();
+  EXPECT_EQ(translator.use_count(), 3);
+  first.Reset();
+  EXPECT_EQ(translator.use_count(), 2);
+  CallTrace trace;
+  EXPECT_EQ(Send(second, kMessageMakeDefault, {}), 0u);
+  const auto madeAnew = [&] { return std::ranges::count(trace.Take(), "VRKTokenCreate 1"); };
+  EXPECT_EQ(madeAnew(), 1);
+  EXPECT_EQ(Send(second, kMessageMakeDefault, {}), 0u);
+  EXPECT_EQ(madeAnew(), 0);
+
+  StringTranslatorHandler handler(translator);
+  for (int i = 0; i < 2; ++i) {
+    ObjectRef object;
+    object.Create({}, {});
+    handler.SetObject(object.Get());
+    translator->heard.clear();
+    EXPECT_EQ(Send(object, kMessageMakeDefault, {}), 0u);
+    EXPECT_EQ(translator->heard, "default");
+  }
+  EXPECT_EQ(translator.use_count(), 3);
+  EXPECT_EQ(CodeOf([&] { handler.SetObject({}); }), kResultInputContractViolation);
+}
+
+// A coercion may be anybody's code, and end the object whose message is being served.
+TEST_F(MessagingTest, OutlivesItsObjectUntilTheMessageIsServed) {
+  for (const auto& [message, parameter, type] : {std::tuple{kMessageSetTranslations, kParameterTranslations, kTypeUTF16},
+                                                 {kMessageTranslateString, kParameterTranslationKey, kTypeUTF8}}) {
+    translator->heard.clear();
+    ObjectRef object = NewObject();
+    const VRKObject handle = object.Get();
+    const auto end = [&](const DataRef&, VRKToken, VRKToken toType, DataRef& result) {
+      if (object) {
+        VRKObjectDeliverMessage(handle, MakeToken("message:orvane.vrk.object-died"), {}, 1);
+        object.Reset();
+      }
+      result.Create(toType, "ab", 2);
+      return true;
+    };
+    Coercion coercion(end);
+    coercion.Install(MakeToken("type:test"), MakeToken(type));
+    const DictionaryRef parameters = With(parameter, "type:test", "ab");
+    EXPECT_EQ(VRKObjectDeliverMessage(handle, MakeToken(message), parameters.Get(), 1), 0u);
+    EXPECT_NE(translator->heard, "");
+    EXPECT_EQ(translator.use_count(), 1);
+    EXPECT_EQ(VRKObjectRetain(handle), VRKResult{kVRKInvalidHandle});
+  }
+}
+
+TEST_F(MessagingTest, CreationFailsAsTheCreatorDoes) {
+  DictionaryRef parameters = With("parameter:test", kTypeUTF8, "x");
+  VRKObject object{};
+  EXPECT_EQ(VRKObjectCreate(MakeToken(kClassStringTranslator), parameters.Get(), &object), 0u);
+  EXPECT_EQ(createdWith, 1u);
+  VRKObjectRelease(object);
+  parameters.Reset();
+  using Creator = StringTranslatorFactory::Creator;
+  using Shared = boost::shared_ptr<StringTranslatorInterface>;
+  const std::pair<Creator, VRKResult> cases[] = {{Creator(), kResultOtherException},
+                                                 {[](auto&) -> Shared { throw std::bad_alloc(); }, kResultOutOfMemory},
+                                                 {[](auto&) -> Shared { throw InvariantViolation(); }, kResultInvariantViolation}};
+  for (const auto& [creator, result] : cases) {
+    factory = std::make_unique<StringTranslatorFactory>(creator, orvane::name_t(kClassStringTranslator));
+    EXPECT_EQ(CodeOf([] { NewObject(); }), result);
+    EXPECT_EQ(Alive(), "factories 1 blocks 1 ");
+  }
+}
+
+TEST(TranslationImage, HoldsEveryByte) {
+  const std::string bytes = "\x01\x02\xFF\x04\x05";
+  const Units expected[] = {{}, {0x0001}, {0x0201}, {0x0201, 0x00FF}, {0x0201, 0x04FF}, {0x0201, 0x04FF, 0x0005}};
+  for (uint32_t count = 0; count <= bytes.size(); ++count) {
+    const std::string exact(bytes, 0, count);
+    const auto image = PackTranslationImage(exact.data(), count);
+    EXPECT_EQ(Units(image.units.get(), image.units.get() + image.unitCount), expected[count]);
+    EXPECT_EQ(image.units == nullptr, count == 0);
+  }
+}
+
+}  // namespace
