@@ -1,4 +1,4 @@
-"""Runs the kolvane command as its users do: test_kolvane.py COMMAND SAMPLES."""
+"""Runs the kolvane command as its users do: test_kolvane.py COMMAND SAMPLES STUBBORN-PLUG-IN."""
 
 import contextlib
 import os
@@ -11,6 +11,7 @@ import unittest
 
 KOLVANE = sys.argv.pop(1)
 SAMPLES = pathlib.Path(sys.argv.pop(1))
+STUBBORN = pathlib.Path(sys.argv.pop(1))
 CANCEL = "$$$/Dialog/Cancel=Cancel"
 
 
@@ -166,6 +167,46 @@ class Translate(unittest.TestCase):
             status, output, errors = run(*arguments)
             self.assertEqual((status, output), (2, ""), arguments)
             self.assertRegex(errors, rf"^kolvane: [^\x00-\x1f\x7f-\x9f]*\ntry '{hint} --help'\n$")
+
+    def test_plug_ins(self):
+        dictionary = SAMPLES / "de.txt"
+        relative = os.path.relpath(STUBBORN, STUBBORN.parent)
+        self.assertEqual(translate("--plugin", relative, "--dictionary", dictionary, CANCEL, CANCEL, cwd=STUBBORN.parent),
+                         (0, "no\nno\n", ""))
+        for step, message, answer in [("initialize", "the plug-in cannot be initialised", ""),
+                                      ("create", "cannot create a translator", ""),
+                                      ("make-default", "cannot make a translator the default", ""),
+                                      ("set-translations", f"{dictionary}: cannot be loaded", ""),
+                                      ("translate-string", f"cannot translate '{CANCEL}'", ""),
+                                      ("terminate", "the plug-in cannot be terminated", "no\n")]:
+            with self.subTest(step):
+                done = translate("--plugin", STUBBORN, "--dictionary", dictionary, CANCEL,
+                                 env={**os.environ, "STUBBORN": step})
+                self.assertEqual(done, (2, answer, f"kolvane: {message}: result 15 (kResultInvariantViolation)\n"))
+        for plug_in, reason in [(dictionary, ".+"), (SAMPLES / "none.so", ".+"),
+                                (pathlib.Path(KOLVANE).parent / "../lib/libVarnelKernel.so",
+                                 "it has no entry point VRKKolvanesInitialize")]:
+            status, output, errors = translate("--plugin", plug_in, "x=y")
+            self.assertEqual((status, output), (2, ""))
+            self.assertRegex(errors, rf"\Akolvane: cannot load the plug-in {plug_in}: {reason}\n\Z")
+
+    def test_trace(self):
+        plain = translate("--dictionary", SAMPLES / "de.txt", CANCEL)
+        status, output, trace = translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)
+        self.assertEqual((status, output), plain[:2])
+        self.assertEqual(trace, translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)[2])
+        lines = trace.split("\n")
+        deliveries = [at for at, line in enumerate(lines)
+                      if line.startswith("VRKObjectDeliverMessage(") and "translate-string" in line]
+        self.assertEqual(len(deliveries), 1)
+        self.assertTrue(lines[deliveries[0]].endswith(", 1) {"))
+        served = lines[deliveries[0] + 1:lines.index("}", deliveries[0])]
+        self.assertTrue(all(line.startswith("  VRK") for line in served), served)
+        self.assertRegex("\n".join(served), r'VRKDictionaryGetEntry\(dictionary 0x\w+, "parameter:[\w.-]+translation-key"\) -> '
+                                            r'data 0x\w+ \(type:orvane.vrk.utf8, 24 bytes "\$\$\$/Dialog/Cancel=Cancel"\)')
+        self.assertIn('20 bytes "Abbrechen\\x00")', "\n".join(served))
+        failing = translate("--trace", "--plugin", STUBBORN, CANCEL, env={**os.environ, "STUBBORN": "translate-string"})[2]
+        self.assertIn("\n} -> result 15 (kResultInvariantViolation)\n", failing)
 
     def test_terminal_without_keys(self):
         try:

@@ -5,20 +5,30 @@
 #include <algorithm>
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <iostream>
+#include <limits>
 #include <map>
 #include <new>
+#include <optional>
 #include <string>
 #include <vector>
 
 #include "CommandLine.h"
 #include "Console.h"
+#include "Exceptions.h"
 #include "ImageFile.h"
+#include "KernelTrace.h"
 #include "KolvaneDictionary.h"
 #include "LoadWarnings.h"
+#include "ResultText.h"
 #include "StandardOutput.h"
 #include "Text.h"
+#include "TranslatorHost.h"
+#include "VRKStringTranslatorClient.h"
+#include "VRKTranslationImage.h"
 
 namespace {
+
+using Translator = Varnel::StringTranslatorInterface;
 
 constexpr const char* kAbout =
     R"(Translate keys with dictionaries, and print each translation on a line of its own.
@@ -38,6 +48,8 @@ struct Request {
   std::vector<std::string> defaultDictionaries;
   FileEncoding encoding = FileEncoding::kAuto;
   bool nul = false;
+  bool trace = false;
+  std::string plugIn;
   std::vector<std::string> keys;
 };
 
@@ -64,6 +76,11 @@ void AddOptions(CLI::App& options, Request& request) {
       ->group("Dictionaries");
   options.add_flag("--nul", request.nul, "Keys and translations end in NUL, not in a line end")
       ->group("Input and output");
+  options.add_flag("--trace", request.trace, "Print the calls to the kernel on standard error")
+      ->group("Kernel");
+  options.add_option("--plugin", request.plugIn, "Translate with the plug-in FILE")
+      ->type_name("FILE")
+      ->group("Kernel");
 }
 
 // Standard input is read once: for one dictionary, or for the keys.
@@ -77,33 +94,64 @@ void CheckStandardInput(const Request& request) {
   }
 }
 
-// Loads the files in order, with their warnings. Returns whether all of them could be read.
-bool LoadAll(const std::vector<std::string>& names, FileEncoding encoding,
-             KolvaneDictionary& dictionary) {
-  bool readAll = true;
+// Calls the translator. `doing` says on failure what could not be done, and names its subject as
+// {}.
+template <class Action>
+void Call(const char* doing, const std::string& subject, Action action) {
+  try {
+    action();
+  } catch (const Varnel::Exception& failure) {
+    throw Failure(fmt::format("{}: {}", fmt::format(fmt::runtime(doing), Printable(subject)),
+                              ResultText(failure.GetResultCode())));
+  }
+}
+
+boost::shared_ptr<Translator> NewTranslator() {
+  boost::shared_ptr<Translator> translator;
+  Call("cannot create {}", "a translator", [&] { translator = Varnel::CreateStringTranslator(); });
+  return translator;
+}
+
+void Load(const ImageFile& file, Translator& translator) {
+  const Varnel::TranslationImage image =
+      Varnel::PackTranslationImage(file.bytes.data(), static_cast<uint32_t>(file.bytes.size()));
+  Call("{}: cannot be loaded", file.name,
+       [&] { translator.SetTranslations(image.units.get(), image.unitCount); });
+}
+
+// A translator does not tell how the loading of an image went; a dictionary does.
+void Warn(const ImageFile& file) {
+  KolvaneDictionary dictionary;
+  boost::interprocess::ibufferstream image(file.bytes.data(), file.bytes.size());
+  dictionary.Load(image);
+  for (const std::string& warning : WarningsOf(file, dictionary.LastLoad())) Say(warning);
+}
+
+// Loads the files in order, with their warnings. Returns whether all of them could be loaded.
+bool LoadAll(const std::vector<std::string>& names, FileEncoding encoding, Translator& translator) {
+  bool loadedAll = true;
   for (const std::string& name : names) {
     try {
       const ImageFile file = ReadImageFile(name, encoding);
-      boost::interprocess::ibufferstream image(file.bytes.data(), file.bytes.size());
-      dictionary.Load(image);
-      for (const std::string& warning : WarningsOf(file, dictionary.LastLoad())) Say(warning);
+      Load(file, translator);
+      Warn(file);
     } catch (const Failure& failure) {
       Say(failure.what());
-      readAll = false;
+      loadedAll = false;
     } catch (const std::bad_alloc&) {
       Say(fmt::format("{}: out of memory", Printable(name)));
-      readAll = false;
+      loadedAll = false;
     }
   }
-  return readAll;
+  return loadedAll;
 }
 
-std::string Translation(KolvaneDictionary& dictionary, const std::string& key) {
-  constexpr int kUTF8 = 1;
-  const TranslatedString translated = dictionary.Translate(key.c_str(), &kUTF8);
-  std::vector<uint16_t> units(translated.BufferSize());
-  translated.CopyTo(units.data(), translated.BufferSize(), true);
-  units.pop_back();
+std::string Translation(Translator& translator, const std::string& key) {
+  if (key.size() > std::numeric_limits<uint32_t>::max()) throw Failure("a key is too long");
+  std::vector<uint16_t> units;
+  Call("cannot translate '{}'", key,
+       [&] { translator.TranslateString(key.data(), static_cast<uint32_t>(key.size()), units); });
+  if (!units.empty()) units.pop_back();  // the 0 that ends it
   return ToUTF8(units);
 }
 
@@ -124,15 +172,30 @@ bool ReadKey(std::streambuf& input, bool nul, std::string& key) {
   return true;
 }
 
-void TranslateInput(KolvaneDictionary& dictionary, bool nul, char ending) {
+void TranslateInput(Translator& translator, bool nul, char ending) {
   std::ios::sync_with_stdio(false);
   try {
     for (std::string key; ReadKey(*std::cin.rdbuf(), nul, key);) {
-      WriteOutput(Translation(dictionary, key) + ending);
+      WriteOutput(Translation(translator, key) + ending);
     }
   } catch (const std::ios_base::failure&) {
     throw Failure("cannot read standard input");
   }
+}
+
+ExitStatus Translate(const Request& request) {
+  const boost::shared_ptr<Translator> defaultTranslator = NewTranslator();
+  const boost::shared_ptr<Translator> translator = NewTranslator();
+  Call("cannot make {} the default", "a translator", [&] { defaultTranslator->MakeDefault(); });
+  const bool loadedDefaults =
+      LoadAll(request.defaultDictionaries, request.encoding, *defaultTranslator);
+  const bool loadedOwn = LoadAll(request.dictionaries, request.encoding, *translator);
+  if (!loadedDefaults || !loadedOwn) return ExitStatus::kNotDone;
+
+  const char ending = request.nul ? '\0' : '\n';
+  for (const std::string& key : request.keys) WriteOutput(Translation(*translator, key) + ending);
+  if (request.keys.empty()) TranslateInput(*translator, request.nul, ending);
+  return ExitStatus::kDone;
 }
 
 }  // namespace
@@ -147,16 +210,11 @@ ExitStatus RunTranslate(int argc, const char* const* argv) {
     throw UsageError("no KEY, and nothing to read on standard input");
   }
 
-  KolvaneDictionary defaultDictionary;
-  KolvaneDictionary dictionary;
-  defaultDictionary.MakeDefault();
-  const bool readDefaults =
-      LoadAll(request.defaultDictionaries, request.encoding, defaultDictionary);
-  const bool readOwn = LoadAll(request.dictionaries, request.encoding, dictionary);
-  if (!readDefaults || !readOwn) return ExitStatus::kNotDone;
-
-  const char ending = request.nul ? '\0' : '\n';
-  for (const std::string& key : request.keys) WriteOutput(Translation(dictionary, key) + ending);
-  if (request.keys.empty()) TranslateInput(dictionary, request.nul, ending);
-  return ExitStatus::kDone;
+  TranslatorHost host;
+  std::optional<KernelTrace> trace;
+  if (request.trace) trace.emplace();
+  host.LoadPlugIn(request.plugIn);
+  const ExitStatus status = Translate(request);
+  host.Close();
+  return status;
 }

@@ -1,0 +1,45 @@
+"""Runs the minimal hosts: test_hosts.py GUIDE FOLDER PLUG-IN SAMPLES HOST..."""
+
+import pathlib
+import re
+import subprocess
+import sys
+import unittest
+
+GUIDE, FOLDER, PLUG_IN, SAMPLES = map(pathlib.Path, sys.argv[1:5])
+HOSTS = sys.argv[5:]
+del sys.argv[1:]
+
+
+def run(host, *arguments):
+    done = subprocess.run([host, *map(str, arguments)], capture_output=True, timeout=60)
+    return done.returncode, done.stdout.decode(), done.stderr.decode()
+
+
+class Hosts(unittest.TestCase):
+    def test_translate_in_both_ways(self):
+        self.assertEqual(len(HOSTS), 2)
+        for host in HOSTS:
+            for name, cancel in [("de.txt", "Abbrechen"), ("ja.txt", "キャンセル"), ("it.bin", "Annulla")]:
+                with self.subTest(host=host, name=name):
+                    self.assertEqual(run(host, PLUG_IN, SAMPLES / name, "$$$/Dialog/Cancel=Cancel"),
+                                     (0, f"message: {cancel}\ncoercion: {cancel}\n", ""))
+
+    def test_say_what_is_wrong(self):
+        for host in HOSTS:
+            for arguments, reason in [([PLUG_IN], "usage"), (["none.so", SAMPLES / "de.txt", "x"], "none.so"),
+                                      ([PLUG_IN, "none.txt", "x"], "none.txt")]:
+                status, output, errors = run(host, *arguments)
+                self.assertNotEqual(status, 0)
+                self.assertEqual(output, "")
+                self.assertIn(reason, errors)
+
+    def test_are_what_the_guide_quotes(self):
+        quotes = re.findall(r"^```(cpp|c)\n(.*?)^```$", GUIDE.read_text(), re.M | re.S)
+        self.assertGreater(len(quotes), 4)
+        for language, quote in quotes:
+            self.assertIn(quote, (FOLDER / f"host.{language}").read_text())
+
+
+if __name__ == "__main__":
+    unittest.main()
