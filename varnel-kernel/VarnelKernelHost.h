@@ -44,7 +44,8 @@ VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
 
 /* Loads a library whose entry points are called `prefix` followed by Initialize, Terminate and
  * Version. kVRKNotFound: there is no such library, or it lacks an entry point; VRKHostLoadError
- * says why. A path without a separator is searched for where the system looks for libraries. */
+ * says why. A path without a separator is searched for where the system looks for libraries, among
+ * them the folder of the kernel's own. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefix,
                                              VRKPlugIn* outPlugIn);
 

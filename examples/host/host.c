@@ -28,8 +28,8 @@ static VRKToken Token(const char* text) {
 static char* ReadUnits(const char* name, uint32_t* outByteCount) {
   static char bytes[1 << 20];
   FILE* const file = fopen(name, "rb");
-  const size_t size = file != NULL ? fread(bytes, 1, sizeof bytes - 1, file) : 0;
-  Check(file != NULL && feof(file) ? 0 : kVRKNotFound, name);
+  const size_t size = file != NULL ? fread(bytes, 1, sizeof bytes, file) : 0;
+  Check(file != NULL && feof(file) && !ferror(file) ? 0 : kVRKNotFound, name);
   fclose(file);
   *outByteCount = (uint32_t)(size + size % 2);
   return bytes;
@@ -101,7 +101,7 @@ int main(int argc, char** argv) {
   if (argc != 4) return fputs("usage: host PLUG-IN DICTIONARY KEY\n", stderr), 2;
   Check(VRKHostStart(), "start");
   loaded = VRKHostPlugInLoad(argv[1], "VRKKolvanes", &plugIn);
-  Check(loaded, VRKHostLoadError());
+  Check(loaded, loaded == kVRKNotFound ? VRKHostLoadError() : argv[1]);
   Check(VRKHostPlugInInitialize(plugIn), "initialise");
   Check(VRKObjectCreate(Token("class:" TRANSLATOR "string-translator"), 0, &translator), "create");
   Translate(translator, argv[2], argv[3]);

@@ -10,14 +10,15 @@ namespace Varnel {
 // what they are depends on the translator. Nothing here is synchronised.
 class StringTranslatorInterface {
  public:
-  // Translates from now on what other translators have no translation of, and whatever is
-  // translated by no translator in particular.
+  // Becomes the default translator: the one whose translations stand in where another translator
+  // has none, and which translates what is not sent to any translator in particular.
   virtual void MakeDefault() = 0;
 
   // Adds the entries of an image, the complete contents of a dictionary file, to those it has; a
   // later translation of a name wins. A damaged image adds the entries before the damage, and is no
-  // failure. What the pointer points at is read during the call only; it may be null when the count
-  // is 0.
+  // failure. What the pointer points at is read during the call only. Of an image without bytes the
+  // pointer is null: with a count of 0 and a pointer that is not null, a translator in the same
+  // process reads up to the first 0 byte.
   //
   // How bytes are taken is up to the translator: one in the same process takes an image as it is, a
   // client takes text in UTF-8. Units, in memory's byte order, hold the image's bytes two by two.

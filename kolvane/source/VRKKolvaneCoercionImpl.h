@@ -6,7 +6,7 @@
 
 namespace Varnel::Kolvanes {
 
-// The coercion's own. An installed coercion gets data of the first, and is asked for the others.
+// The types of what is coerced, a key, and of the texts that it is coerced to.
 extern StaticToken gTypeLocaleIndependentUTF8;
 extern StaticToken gTypeUTF8;
 extern StaticToken gTypeUTF16LE;

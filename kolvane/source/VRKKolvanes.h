@@ -1,8 +1,8 @@
 /* What the host's kernel calls of the plug-in. C11 and C++20.
  *
- * One at a time, and not while it delivers messages to the plug-in's objects or coerces through it.
- * `reserved` is 0, or 13 is the result and nothing is done. Other results are 0, the kernel's, 18
- * where there is no memory, and 20 for any other failure.
+ * One at a time, and not while it creates the plug-in's objects, delivers messages to them or
+ * coerces through the plug-in. `reserved` is 0, or 13 is the result and nothing is done. Other
+ * results are 0, the kernel's, 18 where there is no memory, and those of ResultCodes.h.
  */
 #ifndef VRK_KOLVANES_H
 #define VRK_KOLVANES_H
@@ -29,7 +29,8 @@ extern "C" {
 VRK_KOLVANES_API VRKResult VRK_CALL VRKKolvanesInitialize(uint32_t reserved);
 
 /* Removes what was registered and installed. Translators stay, the default one among them. The
- * plug-in can be initialised again. */
+ * plug-in can be initialised again. A library that is unloaded without it unregisters the classes
+ * by itself, but not the coercion; nor must it be unloaded while there are translators. */
 VRK_KOLVANES_API VRKResult VRK_CALL VRKKolvanesTerminate(uint32_t reserved);
 
 /* 0x00010000. */

@@ -10,10 +10,10 @@
 
 namespace Varnel::LocalizableStrings {
 
-// Translates with a dictionary of its own. It is made by CreateStringTranslatorImpl and owned by
-// shared pointers, so that it is known of the default translator whether it is alive. Besides what
-// is said below, throws std::bad_alloc, and OVErrException where a text is too long to be
-// converted.
+// Translates with a dictionary of its own. It is to be owned by a shared pointer, as one that
+// CreateStringTranslatorImpl makes: from that others tell whether the default translator is alive.
+// Besides what is said below, throws std::bad_alloc, and OVErrException where a text is too long to
+// be converted.
 class StringTranslatorImpl final : public StringTranslatorInterface,
                                    public boost::enable_shared_from_this<StringTranslatorImpl> {
  public:

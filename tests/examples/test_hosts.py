@@ -27,12 +27,12 @@ class Hosts(unittest.TestCase):
 
     def test_say_what_is_wrong(self):
         for host in HOSTS:
-            for arguments, reason in [([PLUG_IN], "usage"), (["none.so", SAMPLES / "de.txt", "x"], "none.so"),
-                                      ([PLUG_IN, "none.txt", "x"], "none.txt")]:
+            for arguments, expected, reason in [([PLUG_IN], 2, "usage: host PLUG-IN DICTIONARY KEY"),
+                                                (["./none.so", SAMPLES / "de.txt", "x"], 1, r"host: \./none.so: .*"),
+                                                ([PLUG_IN, "none.txt", "x"], 1, "host: .*none.txt.*")]:
                 status, output, errors = run(host, *arguments)
-                self.assertNotEqual(status, 0)
-                self.assertEqual(output, "")
-                self.assertIn(reason, errors)
+                self.assertEqual((status, output), (expected, ""))
+                self.assertRegex(errors, rf"\A{reason}\n\Z")
 
     def test_are_what_the_guide_quotes(self):
         quotes = re.findall(r"^```(cpp|c)\n(.*?)^```$", GUIDE.read_text(), re.M | re.S)

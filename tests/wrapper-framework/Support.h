@@ -46,6 +46,12 @@ class CallTrace {
   void FailAt(size_t n) { failAt = calls.size() + n; }
   void FailNext(std::string operation) { failNext = std::move(operation); }
 
+  // Whether an operation gives up what the caller has.
+  static bool GivesUp(const std::string& operation) {
+    const auto endsWith = [&](const char* end) { return operation.ends_with(end); };
+    return endsWith("Release") || endsWith("Deallocate") || endsWith("Remove") || endsWith("Unregister");
+  }
+
   // The operation that was made to fail, or empty.
   const std::string& Failed() const { return failed; }
 

@@ -18,7 +18,7 @@
 
 namespace {
 
-constexpr size_t kMostBytes = std::numeric_limits<int32_t>::max();
+constexpr size_t kMostBytes = std::numeric_limits<int32_t>::max() - 1;  // in whole units
 constexpr uint16_t kByteOrderMark = 0xFEFF;
 
 [[noreturn]] void Fail(const std::string& name, std::string_view reason) {

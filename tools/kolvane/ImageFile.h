@@ -17,5 +17,5 @@ struct ImageFile {
 };
 
 // Throws Failure, with the file's name and the system's reason, for a file that cannot be read, and
-// for one whose image would exceed the 2^31 - 1 bytes that a translator takes.
+// for one whose image would exceed the 2^31 - 2 bytes that a translator takes.
 ImageFile ReadImageFile(const std::string& name, FileEncoding encoding);

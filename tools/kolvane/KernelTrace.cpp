@@ -18,13 +18,10 @@ std::span<const VRKHostTraceArgument> Arguments(const VRKHostTraceCall& call) {
   return {call.arguments, call.argumentCount};
 }
 
-// The beginning of a text, cut between two characters.
 std::string Quoted(std::string_view text) {
-  constexpr size_t kGlimpse = 60;
-  const auto isInside = [](char byte) { return (static_cast<unsigned char>(byte) & 0xC0) == 0x80; };
-  size_t size = std::min(text.size(), kGlimpse);
-  while (size > 0 && size < text.size() && isInside(text[size])) --size;
-  return fmt::format("\"{}\"{}", Printable(text.substr(0, size)), size < text.size() ? "..." : "");
+  constexpr size_t kEnough =
+      256;  // for an excerpt, so that what is repaired is not all of a long text
+  return '"' + Excerpt(ToUTF8(ToUTF16(text.substr(0, kEnough)))) + '"';
 }
 
 std::string TokenText(uint32_t token) {
@@ -32,14 +29,12 @@ std::string TokenText(uint32_t token) {
   return text != nullptr ? Quoted(text) : fmt::format("token {:#x}", token);
 }
 
-// Enough of the bytes of a text for a glimpse of it.
 std::string Text(std::string_view type, std::string_view bytes) {
-  constexpr size_t kEnough = 256;
-  const std::string_view begin = bytes.substr(0, kEnough);
-  if (type.ends_with("utf8")) return ' ' + Quoted(ToUTF8(ToUTF16(begin)));
+  if (type.ends_with("utf8")) return ' ' + Quoted(bytes);
   if (!type.ends_with("utf16") && !type.ends_with("utf16le")) return {};
-  std::vector<uint16_t> units(begin.size() / 2);
-  std::copy_n(begin.begin(), units.size() * 2, reinterpret_cast<char*>(units.data()));
+  constexpr size_t kEnough = 128;
+  std::vector<uint16_t> units(std::min(bytes.size() / 2, kEnough));
+  std::copy_n(bytes.begin(), units.size() * 2, reinterpret_cast<char*>(units.data()));
   return ' ' + Quoted(ToUTF8(units));
 }
 
@@ -54,21 +49,38 @@ std::string Glimpse(uint32_t data) {
   return fmt::format(" ({}, {} bytes{})", name, byteCount, Text(name, payload));
 }
 
+const char* KindOf(const VRKHostTraceArgument& handle) {
+  switch (handle.kind) {
+    case kVRKTraceObject:
+      return "object";
+    case kVRKTraceHandler:
+      return "handler";
+    case kVRKTraceData:
+      return "data";
+    case kVRKTraceList:
+      return "list";
+    case kVRKTraceDictionary:
+      return "dictionary";
+    default:
+      return "handle";
+  }
+}
+
 std::string Described(const VRKHostTraceArgument& argument) {
-  const char* const kinds[] = {"", "", "", "object", "handler", "", "data", "list", "dictionary"};
+  const auto unlessNull = [](bool isNull, const auto& text) { return isNull ? "null" : text(); };
   switch (argument.kind) {
     case kVRKTraceNumber:
       return std::to_string(argument.number);
-    case kVRKTraceText:
-      return argument.pointer != nullptr ? Quoted(static_cast<const char*>(argument.pointer))
-                                         : "null";
     case kVRKTracePointer:
-      return argument.pointer != nullptr ? "*" : "null";
+      return argument.pointer == nullptr ? "null" : "*";
+    case kVRKTraceText:
+      return unlessNull(argument.pointer == nullptr,
+                        [&] { return Quoted(static_cast<const char*>(argument.pointer)); });
     case kVRKTraceToken:
-      return argument.number != 0 ? TokenText(argument.number) : "null";
+      return unlessNull(argument.number == 0, [&] { return TokenText(argument.number); });
     default:
-      return argument.number != 0 ? fmt::format("{} {:#x}", kinds[argument.kind], argument.number)
-                                  : "null";
+      return unlessNull(argument.number == 0,
+                        [&] { return fmt::format("{} {:#x}", KindOf(argument), argument.number); });
   }
 }
 

@@ -5,10 +5,10 @@
 
 #include "VarnelKernelHost.h"
 
-// Prints each call to the kernel on standard error while it lives, but for those that retain or
-// release the null handle: the operation, what goes in and,
-// after an arrow, what comes out; in braces the calls that were made meanwhile. Data come with a
-// glimpse of what is in them. One at a time, with the kernel running.
+// Prints each call of a kernel operation on standard error while it lives, but for those that
+// retain or release the null handle: the operation, what goes in and, after an arrow, what comes
+// out; in braces the calls that were made meanwhile. Data come with a glimpse of what is in them.
+// One at a time, with the kernel running.
 class KernelTrace {
  public:
   KernelTrace();

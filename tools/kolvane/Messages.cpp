@@ -2,6 +2,7 @@
 
 #include <fmt/format.h>
 
+#include <algorithm>
 #include <cstdio>
 
 namespace {
@@ -38,4 +39,12 @@ std::string Printable(std::string_view text) {
     }
   }
   return printable;
+}
+
+std::string Excerpt(std::string_view text) {
+  constexpr size_t kMost = 60;
+  const auto isInside = [](char byte) { return (static_cast<unsigned char>(byte) & 0xC0) == 0x80; };
+  size_t size = std::min(text.size(), kMost);
+  while (size > 0 && size < text.size() && isInside(text[size])) --size;
+  return Printable(text.substr(0, size)) + (size < text.size() ? "..." : "");
 }

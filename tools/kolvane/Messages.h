@@ -18,3 +18,6 @@ void Say(std::string_view message);
 
 // The text with its control characters written as escapes, so that a message stays one line.
 std::string Printable(std::string_view text);
+
+// The beginning of a text that may be long, printable, with dots for what is left out.
+std::string Excerpt(std::string_view text);

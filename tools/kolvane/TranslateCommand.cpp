@@ -49,7 +49,7 @@ struct Request {
   FileEncoding encoding = FileEncoding::kAuto;
   bool nul = false;
   bool trace = false;
-  std::string plugIn;
+  std::optional<std::string> plugIn;
   std::vector<std::string> keys;
 };
 
@@ -101,7 +101,7 @@ void Call(const char* doing, const std::string& subject, Action action) {
   try {
     action();
   } catch (const Varnel::Exception& failure) {
-    throw Failure(fmt::format("{}: {}", fmt::format(fmt::runtime(doing), Printable(subject)),
+    throw Failure(fmt::format("{}: {}", fmt::format(fmt::runtime(doing), Excerpt(subject)),
                               ResultText(failure.GetResultCode())));
   }
 }

@@ -3,6 +3,7 @@
 #include <fmt/format.h>
 
 #include <filesystem>
+#include <system_error>
 #include <utility>
 
 #include "Messages.h"
@@ -10,13 +11,15 @@
 
 namespace {
 
-void Require(VRKResult result, const char* what) {
+void Require(VRKResult result, const std::string& what) {
   if (result != 0) throw Failure(fmt::format("{}: {}", what, ResultText(result)));
 }
 
 // A name alone would be searched for.
 std::string PathOf(const std::string& file) {
-  return file.empty() ? KOLVANE_PLUG_IN : std::filesystem::absolute(file).string();
+  std::error_code failed;
+  const std::filesystem::path path = std::filesystem::absolute(file, failed);
+  return failed ? file : path.string();
 }
 
 }  // namespace
@@ -31,17 +34,20 @@ TranslatorHost::~TranslatorHost() {
   VRKHostShutDown(nullptr);
 }
 
-void TranslatorHost::LoadPlugIn(const std::string& file) {
-  const std::string path = PathOf(file);
-  if (VRKHostPlugInLoad(path.c_str(), "VRKKolvanes", &plugIn) == kVRKNotFound) {
-    throw Failure(fmt::format("cannot load the plug-in {}: {}",
-                              Printable(file.empty() ? path : file),
-                              Printable(VRKHostLoadError())));
+void TranslatorHost::LoadPlugIn(const std::optional<std::string>& file) {
+  const std::string path = file ? PathOf(*file) : KOLVANE_PLUG_IN;
+  const std::string failure =
+      fmt::format("cannot load the plug-in {}", Printable(file.value_or(path)));
+  const VRKResult loaded = VRKHostPlugInLoad(path.c_str(), "VRKKolvanes", &plugIn);
+  if (loaded == kVRKNotFound) {
+    throw Failure(fmt::format("{}: {}", failure, Printable(VRKHostLoadError())));
   }
+  Require(loaded, failure);
   Require(VRKHostPlugInInitialize(plugIn), "the plug-in cannot be initialised");
 }
 
 void TranslatorHost::Close() {
-  Require(VRKHostPlugInTerminate(plugIn), "the plug-in cannot be terminated");
-  Require(VRKHostPlugInUnload(std::exchange(plugIn, {})), "the plug-in cannot be unloaded");
+  const VRKPlugIn closing = std::exchange(plugIn, {});
+  Require(VRKHostPlugInTerminate(closing), "the plug-in cannot be terminated");
+  Require(VRKHostPlugInUnload(closing), "the plug-in cannot be unloaded");
 }

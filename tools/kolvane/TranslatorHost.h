@@ -1,6 +1,7 @@
 // The kernel that the command runs, and the plug-in in it.
 #pragma once
 
+#include <optional>
 #include <string>
 
 #include "VarnelKernelHost.h"
@@ -13,9 +14,9 @@ class TranslatorHost {
   TranslatorHost& operator=(const TranslatorHost&) = delete;
   ~TranslatorHost();  // ends quietly what Close has not ended
 
-  // Loads and initialises the plug-in. Without a file it is the command's own, from where the
-  // kernel's library lies or the system looks for libraries.
-  void LoadPlugIn(const std::string& file);
+  // Loads and initialises the plug-in. Without a file it is the command's own, searched for as the
+  // kernel does.
+  void LoadPlugIn(const std::optional<std::string>& file);
 
   void Close();
 

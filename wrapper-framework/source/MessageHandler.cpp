@@ -2,6 +2,7 @@
 
 #include "Boundary.h"
 #include "Exceptions.h"
+#include "Farewell.h"
 #include "ResultCodes.h"
 #include "Tokens.h"
 
@@ -19,6 +20,39 @@ void MakeObjectDied() {
 
 }  // namespace
 
+// A call of a handler that is running, in a chain from the innermost outwards.
+struct MessageHandler::RunningCall {
+  explicit RunningCall(MessageHandler* calledHandler) noexcept
+      : handler(calledHandler), outer(innermost) {
+    innermost = this;
+  }
+  ~RunningCall() {
+    innermost = outer;
+    if (deletesHandler) delete handler;
+  }
+  RunningCall(const RunningCall&) = delete;
+  RunningCall& operator=(const RunningCall&) = delete;
+
+  static RunningCall* OutermostOf(const MessageHandler* handler) noexcept {
+    RunningCall* outermost = nullptr;
+    for (RunningCall* each = innermost; each != nullptr; each = each->outer) {
+      if (each->handler == handler) outermost = each;
+    }
+    return outermost;
+  }
+
+  void Forget() noexcept {
+    handler = nullptr;
+    deletesHandler = false;
+  }
+
+  static inline RunningCall* innermost = nullptr;
+
+  MessageHandler* handler;
+  RunningCall* outer;
+  bool deletesHandler = false;
+};
+
 MessageHandler::MessageHandler(VRKObject attachTo, bool deletesItself)
     : deleteWhenObjectDies(deletesItself) {
   MakeObjectDied();
@@ -26,6 +60,8 @@ MessageHandler::MessageHandler(VRKObject attachTo, bool deletesItself)
 }
 
 MessageHandler::~MessageHandler() {
+  const Farewell farewell(this);
+  while (RunningCall* const call = RunningCall::OutermostOf(this)) call->Forget();
   if (registration != VRKMessageHandler{}) VRKMessageHandlerRemove(registration, object);
 }
 
@@ -42,11 +78,19 @@ void MessageHandler::SetObject(VRKObject newObject) {
 
 void MessageHandler::ObjectDied() {
   if (deleteWhenObjectDies) {
-    delete this;
+    DeleteSelf();
     return;
   }
   object = {};
   registration = {};
+}
+
+void MessageHandler::DeleteSelf() {
+  if (RunningCall* const call = RunningCall::OutermostOf(this)) {
+    call->deletesHandler = true;
+  } else {
+    delete this;
+  }
 }
 
 void MessageHandler::AddMessages(const VRKToken* messages, uint32_t count) {
@@ -70,11 +114,14 @@ void MessageHandler::Install(VRKObject newObject) {
   }
 }
 
-// The handler may be gone when HandleMessage or ObjectDied returns. It hears of its object's death
-// whatever goes wrong on the way, or it would be left behind on an object that is no more.
+// HandleMessage may delete the handler, except when the object has died. A handler hears of its
+// object's death whatever goes wrong on the way, or it would be left behind on an object that is no
+// more.
 VRKResult VRK_CALL MessageHandler::Callback(VRKObject receiver, VRKToken message,
                                             VRKDictionary parameters, void* context) {
   MessageHandler& handler = *static_cast<MessageHandler*>(context);
+  if (Farewell::IsSaidBy(&handler)) return kResultNotHandled;
+  RunningCall call(&handler);
   const VRKResult handled = AtBoundary(parameters, [&] {
     const DictionaryRef held(parameters);
     const bool taken = handler.HandleMessage(receiver, message, held);

@@ -41,11 +41,17 @@ class MessageHandler : public Memory<KernelMemoryPolicy> {
   void AddMessages(const VRKToken* messages, uint32_t count);
 
  protected:
+  // Deletes the handler, which was made with new: at once, or when the calls of it that are running
+  // have returned.
+  void DeleteSelf();
+
   VRKObject object{};
   VRKMessageHandler registration{};
   bool deleteWhenObjectDies;
 
  private:
+  struct RunningCall;
+
   static VRKResult VRK_CALL Callback(VRKObject receiver, VRKToken message, VRKDictionary parameters,
                                      void* context);
   void Install(VRKObject newObject);

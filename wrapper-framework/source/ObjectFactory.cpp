@@ -4,6 +4,7 @@
 
 #include "Boundary.h"
 #include "Exceptions.h"
+#include "Farewell.h"
 #include "ResultCodes.h"
 
 namespace Varnel {
@@ -24,6 +25,7 @@ struct ObjectInTheMaking {
 }  // namespace
 
 ObjectFactory::~ObjectFactory() {
+  const Farewell farewell(this);
   VRKObjectFactoryUnregister(0, &Callback, this);
 }
 
@@ -44,6 +46,7 @@ VRKResult VRK_CALL ObjectFactory::Callback(VRKToken objectClass, VRKDictionary p
                                            void* context, VRKObject* outObject) {
   return AtBoundary({}, [&] {
     if (context == nullptr || outObject == nullptr) throw InputContractViolation();
+    if (Farewell::IsSaidBy(context)) throw InvariantViolation();
     ObjectInTheMaking making;
     static_cast<ObjectFactory*>(context)->CreateObject(objectClass, parameters, &making.object);
     if (making.object == VRKObject{}) throw OutputContractViolation();

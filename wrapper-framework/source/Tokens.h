@@ -26,7 +26,7 @@ VRKToken MakeToken(orvane::name_t name);
 // The name whose text is the token's. Tokens' texts last, as names need it.
 orvane::name_t TokenName(VRKToken token);
 
-// A token that is made when it is first asked for. A static object; its text outlives the kernel.
+// A token that is made when it is first asked for. A static object, of a text that is one, too.
 struct StaticToken {
   // Throws OutputContractViolation when the kernel made none.
   VRKToken Get();

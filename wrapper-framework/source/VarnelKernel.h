@@ -144,11 +144,12 @@ VRK_API VRKResult VRK_CALL VRKMessageHandlerRemove(VRKMessageHandler registratio
 /* Tokens */
 
 /* Stores the token of a text: equal texts give equal tokens, and no two texts the same. A token is
- * never null and lasts as long as the kernel. `flag` is 0, or 1 where the text outlives the kernel.
- */
+ * never null. It lasts, with its text, until the process ends, also when the kernel is ended and
+ * started again meanwhile: code that was loaded before keeps both. `flag` is 0, or 1 where the text
+ * lasts as long as the library that passes it. */
 VRK_API VRKResult VRK_CALL VRKTokenCreate(const char* text, uint32_t flag, VRKToken* outToken);
 
-/* The token's text, valid as long as the kernel runs; null for what is no token. */
+/* The token's text; null for what is no token. */
 VRK_API const char* VRK_CALL VRKTokenGetString(VRKToken token);
 
 /* Data: immutable bytes with a type */
@@ -164,7 +165,9 @@ VRK_API VRKResult VRK_CALL VRKDataCreate(VRKToken type, const void* bytes, uint3
 VRK_API VRKResult VRK_CALL VRKDataGetData(VRKData data, const void** outBytes,
                                           uint32_t* outByteCount, VRKToken* outType);
 
-/* Stores the data as data of another type, owned by the caller. kVRKCannotCoerce: impossible. */
+/* Stores the data as data of another type, owned by the caller; of its own type, the data itself or
+ * a copy. Text that becomes "type:orvane.vrk.utf16" begins with a byte-order mark.
+ * kVRKCannotCoerce: impossible. */
 VRK_API VRKResult VRK_CALL VRKDataCoerce(VRKData data, VRKToken toType, VRKData* outData);
 
 /* Null is accepted and does nothing. */

@@ -10,8 +10,9 @@ namespace Varnel {
 
 // Turns each operation into a message to a translator object, to which it holds a reference; copies
 // hold one each. Throws the kernel's failures, and those of whatever serves the object, as
-// Exception; what it made for the message is released. An object that takes no such message is no
-// failure, except that there is no translation then.
+// Exception; what it made for the message is released. When the object takes no such message
+// nothing happens, but that TranslateString misses the result and throws the kernel's code for
+// that.
 class StringTranslatorClient : public StringTranslatorInterface {
  public:
   StringTranslatorClient() = default;  // has no object; messages go to the null object

@@ -17,7 +17,8 @@ StringTranslatorFactory::StringTranslatorFactory(Creator translatorCreator,
 
 void StringTranslatorFactory::InitializeObject(VRKToken, const DictionaryRef& parameters,
                                                const ObjectRef& newObject) {
-  const boost::shared_ptr<StringTranslatorInterface> translator = creator(AsDictionary(parameters));
+  const Creator kept = creator;  // the host's coercions, called next, may end the factory
+  const boost::shared_ptr<StringTranslatorInterface> translator = kept(AsDictionary(parameters));
   auto handler = std::make_unique<StringTranslatorHandler>(translator);
   handler->LiveWith(newObject.Get());
   static_cast<void>(handler.release());  // it is its object's from here on

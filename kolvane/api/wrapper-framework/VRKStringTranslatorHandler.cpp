@@ -6,15 +6,17 @@
 #include <vector>
 
 #include "Data.h"
+#include "Exceptions.h"
 #include "ReportedCheck.h"
+#include "ResultCodes.h"
 #include "Tokens.h"
 #include "VRKStringTranslatorProtocol.h"
 
 namespace Varnel {
 namespace {
 
-// Shared by all handlers, and made anew after an object that a handler lived with has died: the
-// kernel may have ended since the tokens were made.
+// Shared by all handlers. They are forgotten whenever an object dies that a handler lived with, and
+// made anew when they are next used.
 struct HandlerTokens {
   StaticToken makeDefault{kMessageMakeDefault};
   StaticToken setTranslations{kMessageSetTranslations};
@@ -72,6 +74,7 @@ void StringTranslatorHandler::SetObject(VRKObject newObject) {
 
 void StringTranslatorHandler::LiveWith(VRKObject newObject) {
   SetObject(newObject);
+  if (registration == VRKMessageHandler{}) ThrowResultCode(kResultHandlerNotInstalled);
   ownsItself = true;
 }
 
@@ -81,7 +84,7 @@ void StringTranslatorHandler::ObjectDied() {
     return;
   }
   gTokens = {};
-  delete this;
+  DeleteSelf();
 }
 
 bool StringTranslatorHandler::HandleMessage(VRKObject, VRKToken message,
@@ -98,26 +101,21 @@ bool StringTranslatorHandler::HandleMessage(VRKObject, VRKToken message,
   return true;
 }
 
-// The next two call coercions, which may be anybody's code and may release the object, and this
-// handler with it. So they keep the translator, and touch the handler no more.
-
 void StringTranslatorHandler::HandleSetTranslations(const DictionaryRef& parameters) {
-  const boost::shared_ptr<StringTranslatorInterface> kept = translator;
   DataRef translations = parameters.GetEntry(gTokens.translations.Get());
   ReportedCheck(gTranslationsSite,
                 [&] { return translations.Coerce(gTokens.typeUTF16.Get(), translations); });
   std::vector<uint16_t> units;
   GetUTF16(translations, units);
-  kept->SetTranslations(units.empty() ? nullptr : units.data(),
-                        static_cast<uint32_t>(units.size()));
+  translator->SetTranslations(units.empty() ? nullptr : units.data(),
+                              static_cast<uint32_t>(units.size()));
 }
 
 void StringTranslatorHandler::HandleTranslateString(const DictionaryRef& parameters) {
-  const boost::shared_ptr<StringTranslatorInterface> kept = translator;
   DataRef translationKey = parameters.GetEntry(gTokens.translationKey.Get());
   const std::string key = KeyText(translationKey);
   std::vector<uint16_t> result;
-  kept->TranslateString(key.data(), static_cast<uint32_t>(key.size()), result);
+  translator->TranslateString(key.data(), static_cast<uint32_t>(key.size()), result);
   const uint16_t* const units = result.empty() ? nullptr : result.data();
   const DataRef translation = MakeUTF16LEData(units, static_cast<uint32_t>(result.size()));
   parameters.SetEntry(gTokens.messageResult.Get(), translation);

@@ -20,7 +20,7 @@ class StringTranslatorHandler : public MessageHandler {
   void SetObject(VRKObject newObject) override;
 
   // Attaches the handler, which was made with new, to an object, with which it dies. When it
-  // throws, the handler is the caller's still.
+  // throws, as it does when the object dies meanwhile, the handler is the caller's still.
   void LiveWith(VRKObject newObject);
 
   void ObjectDied() override;

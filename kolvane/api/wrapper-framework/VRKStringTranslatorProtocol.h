@@ -1,7 +1,7 @@
 // How translators are spoken to through the kernel. A translator is a kernel object of one of two
 // classes, which takes three messages. Parameters and results are in the dictionary that is
 // delivered with the message. 0 is the result of a message that was taken, kVRKNotHandled that of
-// one that no translator took; with any other result nothing was loaded and nothing is written.
+// one that no translator took, and with any other no result is written.
 #pragma once
 
 namespace Varnel {

@@ -1,6 +1,7 @@
 #include "VRKTranslationImage.h"
 
 #include <cstring>
+#include <utility>
 
 namespace Varnel {
 

@@ -40,45 +40,100 @@ TEST_F(PlugInTest, GoesThroughItsStates) {
   }
 }
 
-// Hears which classes lose their factory, and where the coercion lives.
-struct Registrations {
+// Notes what is registered, installed, sent, released and ended, in order, and what tokens are made of
+// constants.
+class Notes {
+ public:
+  Notes() { VRKHostSetTraceHook(&Hook, this); }
+  ~Notes() { VRKHostSetTraceHook(nullptr, nullptr); }
+  Notes(const Notes&) = delete;
+  Notes& operator=(const Notes&) = delete;
+
+  std::string Take() { return std::exchange(text, {}); }
+
+  VRKDataCoercionCallback coercionCallback = nullptr;
+  void* coercion = nullptr;
+
+ private:
   static VRKResult VRK_CALL Hook(const VRKHostTraceCall* call, void* context) {
-    auto& self = *static_cast<Registrations*>(context);
-    const auto* const arguments = call->arguments;
-    if (call->isFinished != 0) return 0;
-    if (call->operation == "VRKObjectFactoryRegister"s)
-      self.classes[arguments[3].pointer] = VRKTokenGetString(VRKToken{arguments[0].number});
-    if (call->operation == "VRKObjectFactoryUnregister"s) self.unregistered.push_back(self.classes[arguments[2].pointer]);
-    if (call->operation == "VRKDataCoercionHandlerInstall"s) {
-      self.coercionCallback = AsCallback<VRKDataCoercionCallback>(arguments[3].pointer);
-      self.coercion = const_cast<void*>(arguments[4].pointer);
-    }
+    if (call->isFinished == 0) static_cast<Notes*>(context)->Note(call->operation, call->arguments);
     return 0;
   }
 
+  // A token's text, without what all have in common.
+  static std::string Short(const VRKHostTraceArgument& token) {
+    const std::string name = VRKTokenGetString(VRKToken{token.number});
+    return name.substr(name.find_last_of(".:") + 1);
+  }
+
+  void Note(const std::string& operation, const VRKHostTraceArgument* arguments) {
+    if (operation == "VRKTokenCreate" && arguments[1].number == 1) {
+      const std::string name = static_cast<const char*>(arguments[0].pointer);
+      text += "token " + name.substr(name.find_last_of(".:") + 1) + '\n';
+    } else if (operation == "VRKObjectFactoryRegister") {
+      text += "register " + (classes[arguments[3].pointer] = Short(arguments[0])) + '\n';
+    } else if (operation == "VRKObjectFactoryUnregister") {
+      text += "unregister " + classes[arguments[2].pointer] + '\n';
+    } else if (operation == "VRKMessageHandlerAddMessages") {
+      const auto* const messages = static_cast<const VRKToken*>(arguments[1].pointer);
+      for (uint32_t i = 0; i < arguments[2].number; ++i) text += "hear " + std::string(VRKTokenGetString(messages[i])).substr(8) + '\n';
+    } else if (operation == "VRKObjectDeliverMessage") {
+      text += "send " + Short(arguments[1]) + '\n';
+    } else if (operation == "VRKObjectRelease" && arguments[0].number != 0) {
+      text += "release\n";
+    } else if (operation == "VRKDataCoercionHandlerInstall") {
+      text += "coerce " + Short(arguments[0]) + " to " + Short(arguments[1]) + '\n';
+      coercionCallback = AsCallback<VRKDataCoercionCallback>(arguments[3].pointer);
+      coercion = const_cast<void*>(arguments[4].pointer);
+    } else if (operation == "VRKDataCoercionHandlerRemove") {
+      text += arguments[1].pointer == coercion ? "remove coercion\n" : "remove earlier coercion\n";
+    }
+  }
+
+  std::string text;
   std::map<const void*, std::string> classes;
-  std::vector<std::string> unregistered;
-  VRKDataCoercionCallback coercionCallback = nullptr;
-  void* coercion = nullptr;
 };
+
+TEST_F(PlugInTest, StartsUpAndShutsDownInOrder) {
+  Notes notes;
+  const std::string object = "hear orvane.vrk.object-died\n", release = "release\n";
+  const std::string messages =
+      "hear orvane.localizable-strings.make-default\nhear orvane.localizable-strings.set-translations\n"
+      "hear orvane.localizable-strings.translate-string\n";
+  const std::string messageTokens = "token make-default\ntoken set-translations\ntoken translate-string\n";
+  for (int round = 0; round < 2; ++round) {
+    VRKHostPlugInInitialize(plugIn);
+    EXPECT_EQ(notes.Take(), "register string-translator\n" + object + messageTokens + messages + release + release + release +
+                                "send make-default\nregister default\n" + release +
+                                "token utf8\ntoken locale-independent-utf8\ncoerce locale-independent-utf8 to utf8\n"
+                                "token utf16le\ncoerce locale-independent-utf8 to utf16le\n"
+                                "token utf16be\ncoerce locale-independent-utf8 to utf16be\n");
+    VRKHostPlugInInitialize(plugIn);
+    EXPECT_EQ(notes.Take(), "register string-translator\nunregister string-translator\n" + object + messages + release + release + release +
+                                "send make-default\nregister default\nunregister default\n" + release +
+                                "coerce locale-independent-utf8 to utf8\ncoerce locale-independent-utf8 to utf16le\n"
+                                "coerce locale-independent-utf8 to utf16be\nremove earlier coercion\n");
+    VRKHostPlugInTerminate(plugIn);
+    EXPECT_EQ(notes.Take(), "remove coercion\nunregister string-translator\nunregister default\n" + messageTokens);
+  }
+}
 
 // A host that has a loader of its own keeps no object for the plug-in: the first translator dies at
 // once. And it may unload the library as it is.
 TEST_F(PlugInTest, UnregistersItsClassesWhenItIsUnloaded) {
   EXPECT_EQ(VRKHostPlugInUnload(plugIn), 0u);
-  Registrations registrations;
-  VRKHostSetTraceHook(&Registrations::Hook, &registrations);
+  Notes notes;
   {
     const EntryPoints entry;
     EXPECT_EQ(entry.initialize(0), 0u);
     EXPECT_EQ(Alive(), "factories 2 coercions 3 blocks 3 ");
     EXPECT_EQ(CodeOf([] { Coerced("$$$/k=default"); }), 15u);
+    notes.Take();
   }
-  EXPECT_EQ(registrations.unregistered, (std::vector<std::string>{Varnel::kClassDefaultStringTranslator, Varnel::kClassStringTranslator}));
+  EXPECT_EQ(notes.Take(), "unregister default\nunregister string-translator\n");
   EXPECT_EQ(Alive(), "coercions 3 blocks 1 ") << "of which nobody else can take care";
-  VRKDataCoercionHandlerRemove(registrations.coercionCallback, registrations.coercion, 0, 0);
-  VRKMemoryDeallocate(registrations.coercion);
-  VRKHostSetTraceHook(nullptr, nullptr);
+  VRKDataCoercionHandlerRemove(notes.coercionCallback, notes.coercion, 0, 0);
+  VRKMemoryDeallocate(notes.coercion);
   EXPECT_EQ(VRKHostPlugInLoad(PLUG_IN, "VRKKolvanes", &plugIn), 0u);
 }
 

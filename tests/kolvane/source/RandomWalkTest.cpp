@@ -233,4 +233,101 @@ TEST_F(RandomWalk, AnswersAsTheModelDoes) {
   }
 }
 
+// Anything, from anywhere: the host's trace hook, its reporter and its coercion, which fail at times,
+// take steps of their own in the middle of others, and tell of deaths that are none. Only what is reached
+// matters here, and that nothing is left.
+class Interference : public PlugInTest {
+ protected:
+  size_t Random(size_t count) { return random() % count; }
+
+  void Interfere() {
+    if (depth > 3) return;
+    ++depth;
+    for (size_t i = Random(3); i > 0; --i) CodeOf([this] { Step(); });
+    --depth;
+  }
+  static VRKResult VRK_CALL Hook(const VRKHostTraceCall* call, void* context) {
+    auto& self = *static_cast<Interference*>(context);
+    const std::string operation = call->operation;
+    if (operation == "VRKMessageHandlerInstall") self.latest = VRKObject{call->arguments[0].number};
+    const bool isRare = operation.ends_with("Unregister") || operation.ends_with("HandlerRemove") || operation.ends_with("AddMessages");
+    if (self.Random(isRare ? 3 : 40) == 0) self.Interfere();
+    const bool givesUp = CallTrace::GivesUp(operation);
+    return !givesUp && self.Random(60) == 0 ? CallTrace::kFailure : 0;
+  }
+  static uint32_t VRK_CALL Reporter(uint32_t, const char*, const char*, const char*, uint32_t, const char*, uint32_t* onceFlag,
+                                    void* context) {
+    auto& self = *static_cast<Interference*>(context);
+    self.Interfere();
+    *onceFlag = self.Random(2) != 0;
+    return 0;
+  }
+
+  DataRef RandomData(const std::string& text) {
+    const char* const types[] = {kTypeUTF8, kTypeLocaleIndependentUTF8, "type:test", kTypeUTF16LE, kTypeUTF16};
+    return MakeData(types[Random(5)], text.data(), static_cast<uint32_t>(text.size()));
+  }
+  void Send(const char* message, const char* parameter = nullptr, const std::string& text = {}) {
+    const VRKObject receiver = objects.empty() || Random(4) == 0 ? latest : objects[Random(objects.size())];
+    DictionaryRef parameters;
+    parameters.Create();
+    if (parameter != nullptr) parameters.SetEntry(MakeToken(parameter), RandomData(text));
+    VRKObjectDeliverMessage(receiver, MakeToken(message), parameters.Get(), 1);
+  }
+  void Create() {
+    DictionaryRef parameters;
+    parameters.Create();
+    if (Random(2) == 0) parameters.SetEntry(MakeToken("parameter:test"), RandomData("x"));
+    VRKObject object{};
+    VRKObjectCreate(MakeToken(Random(2) == 0 ? kClassStringTranslator : kClassDefaultStringTranslator), parameters.Get(), &object);
+    if (object != VRKObject{}) objects.push_back(object);
+  }
+  void Release() {
+    if (objects.empty()) return;
+    std::swap(objects.back(), objects[Random(objects.size())]);
+    const VRKObject released = objects.back();
+    objects.pop_back();
+    VRKObjectRelease(released);
+  }
+  void Coerce() {
+    const char* const types[] = {kTypeUTF8, kTypeUTF16LE, kTypeUTF16BE, kTypeUTF16};
+    DataRef coerced;
+    RandomData("$$$/k=x").Coerce(MakeToken(types[Random(4)]), coerced);
+  }
+  void Step() {
+    const size_t kind = Random(16);
+    if (kind < 4) return objects.size() < 20 ? Create() : Release();
+    if (kind < 6) return Release();
+    if (kind < 8) return Send(kMessageMakeDefault);
+    if (kind < 10) return Send(kMessageSetTranslations, kParameterTranslations, "\"$$$/k=v\"\n\"$$$/n=tralala\"\n");
+    if (kind < 13) return Send(kMessageTranslateString, kParameterTranslationKey, "$$$/k=x");
+    if (kind < 14) return Coerce();
+    if (kind < 15) return Send("message:orvane.vrk.object-died");
+    static_cast<void>(Random(4) != 0 ? VRKHostPlugInInitialize(plugIn) : VRKHostPlugInTerminate(plugIn));
+  }
+
+  std::mt19937 random;
+  int depth = 0;
+  std::vector<VRKObject> objects;
+  VRKObject latest{};
+};
+
+TEST_F(Interference, ReachesNothingThatIsGone) {
+  Coercion coercion([this](const DataRef&, VRKToken, VRKToken toType, DataRef& result) {
+    Interfere();
+    if (Random(5) == 0) return false;
+    result.Create(toType, "ab=c", 4);
+    return true;
+  });
+  for (const char* const type : {kTypeUTF8, kTypeUTF16, kTypeUTF16LE, kTypeUTF16BE})
+    coercion.Install(MakeToken("type:test"), MakeToken(type));
+  VRKHostSetErrorReporter(&Reporter, this);
+  VRKHostSetTraceHook(&Hook, this);
+  for (int step = 0; step < 20'000; ++step) CodeOf([this] { Step(); });
+  VRKHostSetTraceHook(nullptr, nullptr);
+  VRKHostSetErrorReporter(nullptr, nullptr);
+  while (!objects.empty()) Release();
+  VRKHostPlugInTerminate(plugIn);
+}
+
 }  // namespace
