@@ -25,7 +25,8 @@ extern "C" {
  * coercion of keys. The kernel is to keep the objects that are created meanwhile until the plug-in
  * is terminated: the first translator dies with its object. When the classes fail, neither is
  * registered any more; when the coercion does, the classes stay and VRKKolvanesTerminate removes
- * them. A second call without a VRKKolvanesTerminate replaces all that the first made. */
+ * them. A second call without a VRKKolvanesTerminate replaces all that the first made; should the
+ * classes fail then, the coercion of the first stays until VRKKolvanesTerminate. */
 VRK_KOLVANES_API VRKResult VRK_CALL VRKKolvanesInitialize(uint32_t reserved);
 
 /* Removes what was registered and installed. Translators stay, the default one among them. The

@@ -1,6 +1,8 @@
-/* A plug-in that has one answer to every key, and that fails at the step which the environment
- * variable STUBBORN names: an entry point, an object's creation or a message, by the end of its name.
+/* A plug-in that has one answer to every key, and that fails with the result at the step which the
+ * environment variable STUBBORN gives, such as "15 initialize": an entry point, an object's creation or
+ * a message, by the end of its name; or "unload", which it keeps the kernel from.
  */
+#include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
 
@@ -8,9 +10,10 @@
 
 static VRKResult Step(const char* name) {
   const char* const chosen = getenv("STUBBORN");
-  const size_t length = chosen != NULL ? strlen(chosen) : 0;
-  if (length == 0 || strlen(name) < length) return 0;
-  return strcmp(name + strlen(name) - length, chosen) == 0 ? 15 : 0;
+  unsigned result = 0;
+  char step[32] = "";
+  if (chosen == NULL || sscanf(chosen, "%u %31s", &result, step) != 2) return 0;
+  return strlen(name) >= strlen(step) && strcmp(name + strlen(name) - strlen(step), step) == 0 ? result : 0;
 }
 
 static VRKToken Token(const char* text) {
@@ -51,7 +54,7 @@ VRKResult VRKKolvanesInitialize(uint32_t reserved) {
 }
 
 VRKResult VRKKolvanesTerminate(uint32_t reserved) {
-  VRKObjectFactoryUnregister(reserved, Make, NULL);
+  if (Step("unload") == 0) VRKObjectFactoryUnregister(reserved, Make, NULL);
   return Step("terminate");
 }
 

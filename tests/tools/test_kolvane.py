@@ -1,4 +1,4 @@
-"""Runs the kolvane command as its users do: test_kolvane.py COMMAND SAMPLES STUBBORN-PLUG-IN."""
+"""Runs the kolvane command as its users do: test_kolvane.py COMMAND SAMPLES STUBBORN-PLUG-IN KERNEL."""
 
 import contextlib
 import os
@@ -12,6 +12,7 @@ import unittest
 KOLVANE = sys.argv.pop(1)
 SAMPLES = pathlib.Path(sys.argv.pop(1))
 STUBBORN = pathlib.Path(sys.argv.pop(1))
+KERNEL = sys.argv.pop(1)
 CANCEL = "$$$/Dialog/Cancel=Cancel"
 
 
@@ -169,44 +170,56 @@ class Translate(unittest.TestCase):
             self.assertRegex(errors, rf"^kolvane: [^\x00-\x1f\x7f-\x9f]*\ntry '{hint} --help'\n$")
 
     def test_plug_ins(self):
-        dictionary = SAMPLES / "de.txt"
-        relative = os.path.relpath(STUBBORN, STUBBORN.parent)
-        self.assertEqual(translate("--plugin", relative, "--dictionary", dictionary, CANCEL, CANCEL, cwd=STUBBORN.parent),
-                         (0, "no\nno\n", ""))
-        for step, message, answer in [("initialize", "the plug-in cannot be initialised", ""),
-                                      ("create", "cannot create a translator", ""),
-                                      ("make-default", "cannot make a translator the default", ""),
-                                      ("set-translations", f"{dictionary}: cannot be loaded", ""),
-                                      ("translate-string", f"cannot translate '{CANCEL}'", ""),
-                                      ("terminate", "the plug-in cannot be terminated", "no\n")]:
+        (copy := self.file(STUBBORN.read_bytes(), "copy.so")).chmod(0o755)
+        self.assertEqual(translate("--plugin", "copy.so", CANCEL, CANCEL, cwd=copy.parent), (0, "no\nno\n", ""))
+        broken = self.file(b"short")
+        for step, message, answer in [("15 initialize", "the plug-in cannot be initialised", ""),
+                                      ("77 create", "cannot create a translator", ""),
+                                      ("15 make-default", "cannot make a translator the default", ""),
+                                      ("15 set-translations", f"{broken}: cannot be loaded", ""),
+                                      ("77 translate-string", r"cannot translate 'k\x09=v'", ""),
+                                      ("15 terminate", "the plug-in cannot be terminated", "no\n"),
+                                      ("6 unload", "the plug-in cannot be unloaded", "no\n")]:
             with self.subTest(step):
-                done = translate("--plugin", STUBBORN, "--dictionary", dictionary, CANCEL,
-                                 env={**os.environ, "STUBBORN": step})
-                self.assertEqual(done, (2, answer, f"kolvane: {message}: result 15 (kResultInvariantViolation)\n"))
-        for plug_in, reason in [(dictionary, ".+"), (SAMPLES / "none.so", ".+"),
-                                (pathlib.Path(KOLVANE).parent / "../lib/libVarnelKernel.so",
-                                 "it has no entry point VRKKolvanesInitialize")]:
+                dictionaries = ["--dictionary", broken] * 2 if "set" in step else []
+                done = translate("--plugin", STUBBORN, *dictionaries, "k\t=v", env={**os.environ, "STUBBORN": step})
+                result = step.split()[0]
+                name = {"15": " (kResultInvariantViolation)", "6": " (kVRKInUse)"}.get(result, "")
+                line = f"kolvane: {message}: result {result}{name}\n"
+                self.assertEqual(done, (2, answer, line * max(1, len(dictionaries) // 2)))
+        for plug_in, shown, reason in [(SAMPLES / "de.txt", SAMPLES / "de.txt", ".+"), ("none.so", "none.so", ".+"),
+                                       ("a\nb.so", r"a\\x0Ab.so", "[^\n]+"), ("", "", r"result 2 \(kVRKInvalidArgument\)"),
+                                       (KERNEL, KERNEL, "it has no entry point VRKKolvanesInitialize")]:
             status, output, errors = translate("--plugin", plug_in, "x=y")
             self.assertEqual((status, output), (2, ""))
-            self.assertRegex(errors, rf"\Akolvane: cannot load the plug-in {plug_in}: {reason}\n\Z")
+            self.assertRegex(errors, rf"\Akolvane: cannot load the plug-in {shown}: {reason}\n\Z")
 
     def test_trace(self):
         plain = translate("--dictionary", SAMPLES / "de.txt", CANCEL)
         status, output, trace = translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)
         self.assertEqual((status, output), plain[:2])
         self.assertEqual(trace, translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)[2])
-        lines = trace.split("\n")
-        deliveries = [at for at, line in enumerate(lines)
-                      if line.startswith("VRKObjectDeliverMessage(") and "translate-string" in line]
-        self.assertEqual(len(deliveries), 1)
-        self.assertTrue(lines[deliveries[0]].endswith(", 1) {"))
-        served = lines[deliveries[0] + 1:lines.index("}", deliveries[0])]
-        self.assertTrue(all(line.startswith("  VRK") for line in served), served)
-        self.assertRegex("\n".join(served), r'VRKDictionaryGetEntry\(dictionary 0x\w+, "parameter:[\w.-]+translation-key"\) -> '
-                                            r'data 0x\w+ \(type:orvane.vrk.utf8, 24 bytes "\$\$\$/Dialog/Cancel=Cancel"\)')
-        self.assertIn('20 bytes "Abbrechen\\x00")', "\n".join(served))
-        failing = translate("--trace", "--plugin", STUBBORN, CANCEL, env={**os.environ, "STUBBORN": "translate-string"})[2]
+        for line in [r'VRKObjectFactoryRegister\("class:[\w.-]+string-translator", 0, \*, \*\)',
+                     r'VRKObjectCreate\("class:[\w.-]+string-translator", null\) {',
+                     r'  VRKObjectCreate\(null, dictionary 0x\w+\) -> object 0x\w+',
+                     r'VRKDataCreate\("type:orvane.vrk.utf16", \*, 6518, 0\) -> data 0x\w+ '
+                     r'\(type:orvane.vrk.utf16, 6518 bytes ".{20,70}\.\.\."\)',
+                     r'VRKObjectDeliverMessage\(object 0x\w+, "message:[\w.-]+translate-string", dictionary 0x\w+, 1\) {',
+                     r'  VRKDictionaryGetEntry\(dictionary 0x\w+, "parameter:[\w.-]+translation-key"\) -> '
+                     r'data 0x\w+ \(type:orvane.vrk.utf8, 24 bytes "\$\$\$/Dialog/Cancel=Cancel"\)',
+                     r'  VRKDataGetData\(data 0x\w+\) -> \*, 24',
+                     r'  VRKDataCreate\("type:orvane.vrk.utf16le", \*, 20, 0\) -> data 0x\w+ '
+                     r'\(type:orvane.vrk.utf16le, 20 bytes "Abbrechen\\x00"\)',
+                     r'  VRKDataRelease\(data 0x\w+\)', r'}', r'} -> object 0x\w+']:
+            self.assertRegex(trace, rf"(?m)^{line}$")
+        self.assertNotRegex(trace, r"Re(tain|lease)\(null")
+        long = "x" * 57
+        for key, shown in [(f"k={long}é", rf'"k={long}\.\.\."'), (f"é={long}", f'"é={long}"')]:
+            self.assertRegex(translate("--trace", key)[2], rf"VRKDataCreate.* {shown}")
+        failing = translate("--trace", "--plugin", STUBBORN, CANCEL,
+                            env={**os.environ, "STUBBORN": "15 translate-string"})[2]
         self.assertIn("\n} -> result 15 (kResultInvariantViolation)\n", failing)
+        self.assertNotIn("VRKObjectFactoryUnregister", failing)
 
     def test_terminal_without_keys(self):
         try:

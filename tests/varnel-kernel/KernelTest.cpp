@@ -597,6 +597,12 @@ TEST_F(Kernel, LoadsPlugInsAndKeepsTheirObjects) {
   }
   setenv("TEST_PLUG_IN", "", 1);
   ASSERT_EQ(VRKHostPlugInLoad(TEST_PLUG_IN, "Test", &plugIn), 0u);
+  VRKObject other{};
+  ASSERT_EQ(VRKObjectCreate(VRKToken{}, VRKDictionary{}, &other), 0u);
+  OnMessage restarts = [&](VRKObject, VRKToken) { return VRKHostPlugInInitialize(plugIn) + VRKHostPlugInTerminate(plugIn); };
+  Install(other, restarts, {"message:m"});
+  EXPECT_EQ(Deliver(other, "message:m"), 0u) << "other code than the plug-in's may run";
+  VRKObjectRelease(other);
   VRKObject kept{};
   OnTrace notesObjects = [&](const VRKHostTraceCall& call) {
     if (call.isFinished && call.operation == "VRKObjectCreate"s) kept = VRKObject{call.arguments[2].number};

@@ -158,7 +158,7 @@ struct Faulted {
   std::string failed;
 };
 
-// Starts up, translates and shuts down, each once for every point where `run` puts a fault into it.
+// Starts up, starts up again, translates and shuts down, each once for every point where `run` puts a fault into it.
 // Classes and coercions are there afterwards all or not at all; the next start works, and nothing is
 // left in the end. Returns what there was after start-ups.
 using Installed = std::set<std::pair<uint32_t, uint32_t>>;  // factories and coercions
@@ -169,6 +169,7 @@ Installed SurviveEveryFault(VRKPlugIn plugIn, const Run& run, const Check& check
     std::function<VRKResult()> run;
     Installed allowed;  // afterwards
   } phases[] = {{[=] { return VRKHostPlugInInitialize(plugIn); }, {{0, 0}, {2, 0}, {2, 3}}},
+                {[=] { return VRKHostPlugInInitialize(plugIn); }, {{0, 3}, {2, 0}, {2, 3}}},
                 {Use, {{2, 3}}},
                 {[=] { return VRKHostPlugInTerminate(plugIn); }, {{0, 0}}}};
   for (const auto& phase : phases) {
@@ -243,54 +244,6 @@ TEST_F(PlugInTest, SurvivesEveryFailedAllocation) {
   };
   const auto check = [](const Faulted& faulted) { EXPECT_EQ(faulted.result, faulted.failed.empty() ? 0 : Varnel::kResultOutOfMemory); };
   EXPECT_TRUE(SurviveEveryFault(plugIn, run, check).contains({0, 0}));
-}
-
-// Objects of the default class serve for the translator that was the default when they were made,
-// for as long as it lives.
-TEST_F(PlugInTest, KnowsWhenTheDefaultTranslatorIsDead) {
-  ASSERT_EQ(VRKHostPlugInInitialize(plugIn), 0u);
-  const auto lend = [] {
-    Varnel::ObjectRef object;
-    object.Create(Varnel::MakeToken(Varnel::kClassDefaultStringTranslator), {});
-    Varnel::StringTranslatorClient client;
-    client.SetObject(object);
-    return client;
-  };
-  const auto own = [](const std::string& text) {
-    auto translator = Varnel::CreateStringTranslator();
-    Load(*translator, "\"$$$/k=" + text + "\"\n\"$$$/more=lines\"\n");
-    return translator;
-  };
-  const auto translates = [](Varnel::StringTranslatorInterface& by, const std::string& text) {
-    const auto units = TranslatedBy(by, "$$$/k=default");
-    EXPECT_EQ(std::string(units.begin(), units.end()), text);
-  };
-  const auto dead = [](const std::function<void()>& operation) { EXPECT_EQ(CodeOf(operation), 15u); };
-  {
-    auto first = lend(), other = lend();
-    Load(first, "\"$$$/k=first\"\n\"$$$/more=lines\"\n");
-    translates(other, "first");
-    auto a = own("a");
-    a->MakeDefault();
-    EXPECT_EQ(Coerced("$$$/k=default"), "a");
-    auto lentA = lend();
-    translates(lentA, "a");
-    translates(first, "first");
-    a.reset();
-    dead([] { Coerced("$$$/k=default"); });
-    dead([&] { lend(); });
-    dead([&] { lentA.MakeDefault(); });
-    dead([&] { lentA.SetTranslations("x", 1); });
-    dead([&] { TranslatedBy(lentA, "$$$/k=default"); });
-    translates(first, "first");
-    first.MakeDefault();
-    EXPECT_EQ(Coerced("$$$/k=default"), "first");
-    auto lentAgain = lend();
-    translates(lentAgain, "first");
-    dead([&] { TranslatedBy(lentA, "$$$/k=default"); });
-    EXPECT_EQ(VRKHostPlugInTerminate(plugIn), 0u);
-    dead([&] { TranslatedBy(first, "$$$/k=default"); });
-  }
 }
 
 // The name of each entry of a dictionary in UTF-16 with a definition a line, as a key.

@@ -41,7 +41,9 @@ TEST(Translator, LoadsImagesAndTranslates) {
   }
   EXPECT_EQ(CodeOf([&] { translator->SetTranslations("", 0x80000000u); }), kResultInvariantViolation);
   const uint16_t unit = 0;
-  EXPECT_EQ(CodeOf([&] { translator->SetTranslations(&unit, 0x40000000u); }), kResultInvariantViolation);
+  for (const uint32_t tooMany : {0x40000000u, 0x80000001u}) {
+    EXPECT_EQ(CodeOf([&] { translator->SetTranslations(&unit, tooMany); }), kResultInvariantViolation);
+  }
   const std::pair<const char*, const char*> keys[] = {
       {"", ""}, {nullptr, ""}, {"/k", "exactly these"}, {"$$x=y", ""}, {"$$$/none=a long enough text", "a long enough text"}};
   for (const auto& [key, translation] : keys) EXPECT_EQ(Translated(*translator, key), translation);
@@ -98,6 +100,7 @@ TEST(DefaultTranslator, IsKnownToBeDead) {
   b->MakeDefault();
   EXPECT_EQ(Translated(*GetDefaultStringTranslator({}), "$$$/k=none"), "b");
   dead([&] { lentA->TranslateString("", 0, result); });
+  dead([&] { lentA->SetTranslations("", 0); });
 }
 
 class CoercionTest : public KernelTest {};
@@ -129,8 +132,8 @@ TEST_F(CoercionTest, TakesKeysAndWhatItCanOfOtherData) {
 
   Report report;
   VRKHostSetErrorReporter(&Report::Note, &report);
-  EXPECT_TRUE(coerce(kTypeUTF16LE, "O\0K\0"s, key, utf16le)) << "becomes a key in UTF-8";
-  EXPECT_EQ(text(), "\0\0"s);
+  EXPECT_TRUE(coerce(kTypeUTF16LE, "k\0=\0O\0K\0"s, key, utf16le)) << "becomes a key in UTF-8";
+  EXPECT_EQ(text(), "O\0K\0\0\0"s);
   EXPECT_EQ(report.count, 0u);
   for (const uint32_t reports : {1u, 2u, 2u}) {
     report.flagToSet = report.count;

@@ -213,7 +213,14 @@ TEST_F(MessagingTest, HandlersLiveWithTheirObjects) {
     EXPECT_EQ(translator->heard, "default");
   }
   EXPECT_EQ(translator.use_count(), 3);
+  EXPECT_EQ(madeAnew(), 2) << "the other two, once: deaths of objects that no handler lives with count for nothing";
   EXPECT_EQ(CodeOf([&] { handler.SetObject({}); }), kResultInputContractViolation);
+  ObjectRef third = NewObject();
+  const auto own = std::make_unique<StringTranslatorHandler>(translator);
+  trace.FailNext("VRKMessageHandlerAddMessages");
+  EXPECT_EQ(CodeOf([&] { own->LiveWith(third.Get()); }), CallTrace::kFailure);
+  third.Reset();
+  EXPECT_EQ(translator.use_count(), 4) << "the handler is still its maker's";
 }
 
 // A coercion may be anybody's code, and end the object whose message is being served.
@@ -223,7 +230,9 @@ TEST_F(MessagingTest, OutlivesItsObjectUntilTheMessageIsServed) {
     translator->heard.clear();
     ObjectRef object = NewObject();
     const VRKObject handle = object.Get();
+    int coercions = 0;
     const auto end = [&](const DataRef&, VRKToken, VRKToken toType, DataRef& result) {
+      ++coercions;
       if (object) {
         VRKObjectDeliverMessage(handle, MakeToken("message:orvane.vrk.object-died"), {}, 1);
         object.Reset();
@@ -236,6 +245,7 @@ TEST_F(MessagingTest, OutlivesItsObjectUntilTheMessageIsServed) {
     const DictionaryRef parameters = With(parameter, "type:test", "ab");
     EXPECT_EQ(VRKObjectDeliverMessage(handle, MakeToken(message), parameters.Get(), 1), 0u);
     EXPECT_NE(translator->heard, "");
+    EXPECT_EQ(coercions, 1) << "in place";
     EXPECT_EQ(translator.use_count(), 1);
     EXPECT_EQ(VRKObjectRetain(handle), VRKResult{kVRKInvalidHandle});
   }
