@@ -1,8 +1,20 @@
-// What a command needs to know of the console it may be talking to.
+// What a command gets from the console that it is called from, and gives back.
 #pragma once
+
+#include <string>
+#include <vector>
 
 namespace platform {
 
+// The words of the command line, in UTF-8, the command's own first. Takes what main was given.
+std::vector<std::string> Arguments(int count, char** words);
+
 bool StandardInputIsTerminal() noexcept;
+
+// Whether what failed last was a write to a pipe that nobody reads any more. To be asked at once.
+bool HitClosedPipe() noexcept;
+
+// From now on every byte passes the standard streams as it is.
+void UseBinaryStreams() noexcept;
 
 }  // namespace platform

@@ -1,11 +1,23 @@
 #include <unistd.h>
 
+#include <cerrno>
+
 #include "Console.h"
 
 namespace platform {
 
+std::vector<std::string> Arguments(int count, char** words) {
+  return {words, words + count};
+}
+
 bool StandardInputIsTerminal() noexcept {
   return isatty(STDIN_FILENO) != 0;
 }
+
+bool HitClosedPipe() noexcept {
+  return errno == EPIPE;
+}
+
+void UseBinaryStreams() noexcept {}
 
 }  // namespace platform

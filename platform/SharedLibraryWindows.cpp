@@ -3,24 +3,14 @@
 #include <system_error>
 
 #include "SharedLibrary.h"
+#include "WideText.h"
 
 namespace platform {
-namespace {
-
-// From UTF-8; empty when the path cannot be converted.
-std::wstring WidePath(const char* path) {
-  const int length = ::MultiByteToWideChar(CP_UTF8, 0, path, -1, nullptr, 0);
-  std::wstring wide(static_cast<size_t>(length), L'\0');
-  ::MultiByteToWideChar(CP_UTF8, 0, path, -1, wide.data(), length);
-  return wide;
-}
-
-}  // namespace
-
 SharedLibrary LoadSharedLibrary(const char* path, std::string& reason) {
-  const HMODULE library = ::LoadLibraryW(WidePath(path).c_str());
+  const HMODULE library = ::LoadLibraryW(WideFromUTF8(path).c_str());
   if (library == nullptr) {
-    reason = std::system_category().message(static_cast<int>(::GetLastError()));
+    const int error = static_cast<int>(::GetLastError());
+    reason = path + (": " + std::system_category().message(error));
   }
   return library;
 }

@@ -25,8 +25,8 @@ class ImageSource {
 
   // Reads exactly `count` bytes, or fails before it takes or allocates any.
   bool Read(Bytes& bytes, uint64_t count) {
-    if (count > left) return false;
-    bytes.resize(count);
+    if (count > left || count > bytes.max_size()) return false;
+    bytes.resize(static_cast<size_t>(count));
     return Read(bytes.data(), count);
   }
 

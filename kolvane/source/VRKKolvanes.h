@@ -9,12 +9,10 @@
 
 #include "VarnelKernel.h"
 
-#if !defined(_WIN32)
-#define VRK_KOLVANES_API __attribute__((visibility("default")))
-#elif defined(VRK_KOLVANES_EXPORTS)
-#define VRK_KOLVANES_API __declspec(dllexport)
+#if defined(_WIN32)
+#define VRK_KOLVANES_API /* VRKKolvanes.def exports them, at the ordinals 1 to 3 */
 #else
-#define VRK_KOLVANES_API __declspec(dllimport)
+#define VRK_KOLVANES_API __attribute__((visibility("default")))
 #endif
 
 #ifdef __cplusplus

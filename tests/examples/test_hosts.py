@@ -1,5 +1,6 @@
 """Runs the minimal hosts: test_hosts.py GUIDE FOLDER PLUG-IN SAMPLES HOST..."""
 
+import os
 import pathlib
 import re
 import subprocess
@@ -12,8 +13,9 @@ del sys.argv[1:]
 
 
 def run(host, *arguments):
-    done = subprocess.run([host, *map(str, arguments)], capture_output=True, timeout=60)
-    return done.returncode, done.stdout.decode(), done.stderr.decode()
+    emulator = os.environ.get("EMULATOR", "").split()
+    done = subprocess.run([*emulator, host, *map(str, arguments)], capture_output=True, timeout=60, stdin=subprocess.DEVNULL)
+    return done.returncode, *(text.decode().replace("\r\n", "\n") for text in (done.stdout, done.stderr))
 
 
 class Hosts(unittest.TestCase):

@@ -9,7 +9,7 @@ import sys
 import tempfile
 import unittest
 
-KOLVANE = sys.argv.pop(1)
+KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
 SAMPLES = pathlib.Path(sys.argv.pop(1))
 STUBBORN = pathlib.Path(sys.argv.pop(1))
 KERNEL = sys.argv.pop(1)
@@ -18,7 +18,7 @@ CANCEL = "$$$/Dialog/Cancel=Cancel"
 
 def run(*arguments, stdin=b"", **options):
     """Returns the status, standard output and standard error."""
-    done = subprocess.run([KOLVANE, *map(str, arguments)], input=stdin, stderr=subprocess.PIPE,
+    done = subprocess.run([*KOLVANE, *map(str, arguments)], input=stdin, stderr=subprocess.PIPE,
                           stdout=options.pop("stdout", subprocess.PIPE), timeout=60, **options)
     return done.returncode, (done.stdout or b"").decode(), done.stderr.decode()
 
@@ -66,7 +66,7 @@ class Translate(unittest.TestCase):
         self.assertEqual(translate("a=1", stdin=b"b=2\n")[1], "1\n")
 
     def test_answers_come_while_the_input_stays_open(self):
-        with subprocess.Popen([KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE) as process:
+        with subprocess.Popen([*KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE) as process:
             for number in range(3):
                 process.stdin.write(b"a=%d\na" % number)  # and the start of the next key
                 process.stdin.flush()
@@ -112,22 +112,28 @@ class Translate(unittest.TestCase):
         missing = pathlib.Path(self.folder.name, "no\nsuch")
         status, output, errors = translate("--dictionary", missing, "--default-dictionary", self.folder.name, "a=b")
         self.assertEqual((status, output), (2, ""))
-        self.assertIn("no\\x0Asuch: No such file or directory\n", errors)
-        self.assertIn(f"{self.folder.name}: Is a directory\n", errors)
+        self.assertRegex(errors, r"no\\x0Asuch: (No such file or directory|Invalid argument)\n")
+        self.assertRegex(errors, rf"{self.folder.name}: (Is a directory|Permission denied)\n")
         self.assertEqual(translate("--dictionary", "-", "$$$/a=b", stdin=b'"$$$/a=from standard input"\n')[1],
                          "from standard input\n")
+
+    def test_names_beyond_ascii(self):
+        dictionary = self.file('\ufeff"$$$/size=日本𝄞"\n// fills the image up\n'.encode("utf-16-le"), "Wörter-日本.txt")
+        self.assertEqual(translate("--dictionary", dictionary, "$$$/size=x", "$$$/none=größe"),
+                         (0, "日本𝄞\ngröße\n", ""))
+        self.assertIn("kein Wörterbuch-日本: No such file", translate("--dictionary", "kein Wörterbuch-日本", "x")[2])
 
     def test_unreadable_keys(self):
         folder = os.open(self.folder.name, os.O_RDONLY)
         self.addCleanup(os.close, folder)
-        done = subprocess.run([KOLVANE, "translate"], stdin=folder, capture_output=True, timeout=60)
+        done = subprocess.run([*KOLVANE, "translate"], stdin=folder, capture_output=True, timeout=60)
         self.assertEqual((done.returncode, done.stderr), (2, b"kolvane: cannot read standard input\n"))
 
     @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
     def test_messages_that_cannot_be_written(self):
         with open("/dev/full", "wb") as full:
             for arguments, status, output in [(["bogus"], 2, b""), (["translate", "--dictionary", "/dev/null", "a=b"], 0, b"b\n")]:
-                done = subprocess.run([KOLVANE, *arguments], stdout=subprocess.PIPE, stderr=full, timeout=60)
+                done = subprocess.run([*KOLVANE, *arguments], stdout=subprocess.PIPE, stderr=full, timeout=60)
                 self.assertEqual((done.returncode, done.stdout), (status, output))
 
     @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
@@ -141,14 +147,14 @@ class Translate(unittest.TestCase):
     def test_closed_pipe_is_quiet(self):
         for ignored in (False, True):
             disposition = signal.SIG_IGN if ignored else signal.SIG_DFL
-            with subprocess.Popen([KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE,
+            with subprocess.Popen([*KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE,
                                   stderr=subprocess.PIPE, restore_signals=False,
                                   preexec_fn=lambda: signal.signal(signal.SIGPIPE, disposition)) as process:
                 process.stdout.close()
                 with contextlib.suppress(BrokenPipeError), process.stdin as keys:
                     keys.write(b"a=b\n" * 100000)
                 self.assertEqual(process.stderr.read(), b"")
-                self.assertEqual(process.wait(), 2 if ignored else -signal.SIGPIPE)
+                self.assertEqual(process.wait(), 2 if ignored or len(KOLVANE) > 1 else -signal.SIGPIPE)
 
     def test_help_and_wrong_use(self):
         for arguments in [["--help"], ["help"], ["translate", "--help"], ["help", "translate"], ["--version"]]:
@@ -226,7 +232,7 @@ class Translate(unittest.TestCase):
             ours, terminal = os.openpty()
         except (AttributeError, OSError):
             self.skipTest("no terminals")
-        done = subprocess.run([KOLVANE, "translate"], stdin=terminal, capture_output=True, timeout=10)
+        done = subprocess.run([*KOLVANE, "translate"], stdin=terminal, capture_output=True, timeout=10)
         os.close(ours)
         os.close(terminal)
         self.assertEqual(done.returncode, 2)

@@ -2,13 +2,15 @@
 test_mo_to_dictionary.py KOLVANE SCRIPT."""
 
 import gettext
+import os
 import pathlib
 import subprocess
 import sys
 import tempfile
 import unittest
 
-KOLVANE, SCRIPT = sys.argv.pop(1), sys.argv.pop(1)
+KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
+SCRIPT = sys.argv.pop(1)
 CATALOGUES = pathlib.Path("/usr/share/locale")
 
 
@@ -21,7 +23,7 @@ class MoToDictionary(unittest.TestCase):
                             if isinstance(key, str) and key and key.isascii() and not set(key) & set('%="\\\n')}
                 subprocess.run([sys.executable, SCRIPT, "--prefix", "/iso", "--encoding", encoding,
                                 "-o", dictionary.name, path], check=True)
-                answers = subprocess.run([KOLVANE, "translate", "--nul", "--dictionary", dictionary.name],
+                answers = subprocess.run([*KOLVANE, "translate", "--nul", "--dictionary", dictionary.name],
                                          input="".join(f"$$$/iso/{key}\0" for key in messages).encode(),
                                          stdout=subprocess.PIPE, check=True).stdout.decode().split("\0")[:-1]
             self.assertGreater(len(messages), 300)

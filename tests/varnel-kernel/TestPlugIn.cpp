@@ -1,8 +1,6 @@
-// A plug-in that makes an object and leaves behind what the host told it to, by the environment
-// variable TEST_PLUG_IN: nothing, or a `factory`, `coercion` or `handler` that its terminate entry
-// does not end.
-#include <cstdlib>
-#include <string_view>
+// A plug-in that makes an object and leaves behind what the host told it to: nothing, or a `factory`,
+// `coercion` or `handler` that its terminate entry does not end.
+#include <string>
 
 #include "VarnelKernel.h"
 
@@ -14,9 +12,10 @@
 
 namespace {
 
-bool IsToldTo(std::string_view what) {
-  const char* const told = std::getenv("TEST_PLUG_IN");
-  return told != nullptr && told == what;
+std::string gTold;
+
+bool IsToldTo(const std::string& what) {
+  return gTold == what;
 }
 
 VRKToken Token(const char* text) {
@@ -38,6 +37,10 @@ VRKResult VRK_CALL Handle(VRKObject, VRKToken, VRKDictionary, void*) {
 }
 
 }  // namespace
+
+EXPORTED void VRK_CALL TestLeave(const char* what) {
+  gTold = what;
+}
 
 EXPORTED VRKResult VRK_CALL TestInitialize(uint32_t) {
   VRKObject kept{};

@@ -13,6 +13,7 @@
 #include <vector>
 
 #include "BinaryLoader.h"
+#include "File.h"
 #include "Messages.h"
 #include "Text.h"
 
@@ -38,7 +39,7 @@ std::string ReadAll(const std::string& name, std::FILE* file) {
 
 std::string ReadBytes(const std::string& name) {
   if (name == "-") return ReadAll(name, stdin);
-  const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(std::fopen(name.c_str(), "rb"),
+  const std::unique_ptr<std::FILE, int (*)(std::FILE*)> file(platform::OpenFile(name.c_str(), "rb"),
                                                              &std::fclose);
   if (file == nullptr) Fail(name, std::strerror(errno));
   return ReadAll(name, file.get());

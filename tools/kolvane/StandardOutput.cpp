@@ -6,13 +6,14 @@
 #include <cstdio>
 #include <cstring>
 
+#include "Console.h"
 #include "Messages.h"
 
 namespace {
 
 void Require(bool written) {
   if (written) return;
-  if (errno == EPIPE) throw ClosedPipe();
+  if (platform::HitClosedPipe()) throw ClosedPipe();
   throw Failure(fmt::format("cannot write to standard output: {}", std::strerror(errno)));
 }
 

@@ -18,8 +18,9 @@ void Require(VRKResult result, const std::string& what) {
 // A name alone would be searched for.
 std::string PathOf(const std::string& file) {
   std::error_code failed;
-  const std::filesystem::path path = std::filesystem::absolute(file, failed);
-  return failed ? file : path.string();
+  const std::filesystem::path name(std::u8string(file.begin(), file.end()));
+  const std::u8string path = std::filesystem::absolute(name, failed).u8string();
+  return failed ? file : std::string(path.begin(), path.end());
 }
 
 }  // namespace

@@ -7,8 +7,10 @@
 #include <new>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "CommandLine.h"
+#include "Console.h"
 #include "Messages.h"
 #include "OVErrException.h"
 #include "StandardOutput.h"
@@ -119,7 +121,13 @@ ExitStatus Guard(Action action) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  const ExitStatus run = Guard([&] { return Run(argc, argv); });
+  platform::UseBinaryStreams();
+  const ExitStatus run = Guard([&] {
+    const std::vector<std::string> arguments = platform::Arguments(argc, argv);
+    std::vector<const char*> words;
+    for (const std::string& argument : arguments) words.push_back(argument.c_str());
+    return Run(static_cast<int>(words.size()), words.data());
+  });
   const ExitStatus closed = Guard([] {
     CloseOutput();
     return ExitStatus::kDone;

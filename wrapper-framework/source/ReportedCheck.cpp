@@ -1,5 +1,6 @@
 #include "ReportedCheck.h"
 
+#include "Debugger.h"
 #include "VarnelKernel.h"
 
 namespace Varnel {
@@ -10,15 +11,7 @@ void ReportFailedCheck(CheckSite& site) noexcept {
   const uint32_t answer =
       VRKRuntimeError(kFailedCheck, site.domain, site.condition, 0, site.sourceFile, site.line,
                       site.function, &site.onceFlag);
-  if ((answer & kBreak) != 0) BreakIntoDebugger();
-}
-
-void BreakIntoDebugger() noexcept {
-#if defined(__i386__) || defined(__x86_64__)
-  __asm__ volatile("int3");
-#else
-  __builtin_trap();
-#endif
+  if ((answer & kBreak) != 0) platform::BreakIntoDebugger();
 }
 
 }  // namespace Varnel

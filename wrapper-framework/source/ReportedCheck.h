@@ -19,9 +19,6 @@ struct CheckSite {
 // Reports, and breaks into the debugger if the kernel asks for it.
 void ReportFailedCheck(CheckSite& site) noexcept;
 
-// Stops in the debugger, from where execution can go on. Without one the process ends.
-void BreakIntoDebugger() noexcept;
-
 // Throws what the condition throws. A check that is skipped does not evaluate its condition.
 template <class Condition>
 void ReportedCheck(CheckSite& site, Condition&& condition) {

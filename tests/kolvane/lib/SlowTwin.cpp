@@ -1,27 +1,17 @@
 #include "SlowTwin.h"
 
-#include <unicode/ucnv.h>
-#include <unicode/unistr.h>
-
-#include <memory>
-
+#include "CodePage.h"
 #include "NamedCharacters.h"
 
 namespace {
 
 std::u16string Converted(const std::string& bytes, bool utf8) {
-  using Converter = std::unique_ptr<UConverter, decltype(&ucnv_close)>;
-  static UErrorCode error = U_ZERO_ERROR;
-  static const Converter windows1252(ucnv_open("windows-1252", &error), &ucnv_close);
-  if (utf8) {
-    const auto text = icu::UnicodeString::fromUTF8(bytes);
-    return {text.getBuffer(), static_cast<size_t>(text.length())};
-  }
-  std::u16string text(bytes.size(), u'\0');
-  ucnv_toUChars(windows1252.get(), text.data(), static_cast<int32_t>(text.size()), bytes.data(), static_cast<int32_t>(bytes.size()),
-                &error);
-  error = U_ZERO_ERROR;  // the text has no terminator, which ICU warns of
-  return text;
+  if (bytes.empty()) return {};
+  const uint32_t codePage = utf8 ? platform::kCodePageUTF8 : platform::kCodePageSystem;
+  std::vector<uint16_t> units(bytes.size());
+  const auto count = static_cast<int>(bytes.size());
+  const int size = platform::MultiByteToWideChar(codePage, 0, bytes.data(), count, units.data(), count);
+  return {units.begin(), units.begin() + size};
 }
 
 uint32_t Number(const std::string& image, size_t at, size_t size) {
@@ -144,8 +134,9 @@ void SlowTwin::LoadBinary(const std::string& image) {
   };
   const auto bytes = [&](uint64_t count) {
     if (!has(count)) return std::string();
-    at += count;
-    return image.substr(at - count, count);
+    const std::string taken = image.substr(at, static_cast<size_t>(count));
+    at += taken.size();
+    return taken;
   };
   const uint32_t version = number(1) << 8 | number(1);
   const uint32_t encoding = number(1);

@@ -1,0 +1,11 @@
+#include <windows.h>
+
+#include "Debugger.h"
+
+namespace platform {
+
+void BreakIntoDebugger() noexcept {
+  ::DebugBreak();
+}
+
+}  // namespace platform

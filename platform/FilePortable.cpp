@@ -1,0 +1,9 @@
+#include "File.h"
+
+namespace platform {
+
+std::FILE* OpenFile(const char* name, const char* mode) {
+  return std::fopen(name, mode);
+}
+
+}  // namespace platform

@@ -1,0 +1,13 @@
+// Texts of the system's wide functions.
+#pragma once
+
+#include <string>
+#include <string_view>
+
+namespace platform {
+
+// Damaged text is replaced. Empty when the text is too long to be converted.
+std::wstring WideFromUTF8(std::string_view text);
+std::string UTF8FromWide(std::wstring_view text);
+
+}  // namespace platform

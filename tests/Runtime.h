@@ -1,0 +1,5 @@
+// Whether programs and the libraries that they load share one C++ runtime, so that exceptions pass from
+// one to the other and the program's operator new serves both. Not where each brings its own.
+#pragma once
+
+inline constexpr bool kLibrariesShareRuntime = LIBRARIES_SHARE_RUNTIME != 0;
