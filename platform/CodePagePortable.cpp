@@ -97,7 +97,13 @@ constexpr Lead LeadFor(uint8_t byte) noexcept {
   return {3, 0x80, 0xBF};
 }
 
-// A well-formed sequence, or the longest start of one, which a replacement character stands for.
+constexpr bool Continues(uint8_t byte) noexcept {
+  return byte >= 0x80 && byte < 0xC0;
+}
+
+// A well-formed sequence, or the longest start of one, which a replacement character stands for; a
+// second byte that does not fit its lead byte, as in what is too long or a surrogate, is part of
+// it.
 struct Sequence {
   char32_t character;
   size_t length;
@@ -110,9 +116,8 @@ Sequence ReadSequence(const char* text, size_t left) noexcept {
   char32_t character = first & (0x3Fu >> lead.following);
   for (size_t i = 1; i <= lead.following; ++i) {
     const uint8_t byte = i < left ? static_cast<uint8_t>(text[i]) : uint8_t{0};
-    const uint8_t low = i == 1 ? lead.low : uint8_t{0x80};
-    const uint8_t high = i == 1 ? lead.high : uint8_t{0xBF};
-    if (byte < low || byte > high) return {kReplacementCharacter, i};
+    if (!Continues(byte)) return {kReplacementCharacter, i};
+    if (i == 1 && (byte < lead.low || byte > lead.high)) return {kReplacementCharacter, 2};
     character = (character << 6) | (byte & 0x3Fu);
   }
   return {character, size_t{lead.following} + 1};

@@ -5,6 +5,7 @@
 
 #include <memory>
 #include <random>
+#include <regex>
 #include <string>
 
 #include "CodePage.h"
@@ -32,8 +33,14 @@ std::string Encoded(uint32_t codePage, const std::u16string& text) {
   return bytes;
 }
 
+// A second byte that does not fit its lead byte counts as a character of its own with ICU.
+std::string WithMisfitsAsOne(const std::string& text) {
+  static const std::regex misfits("\xE0[\x80-\x9F]|\xED[\xA0-\xBF]|\xF0[\x80-\x8F]|\xF4[\x90-\xBF]");
+  return std::regex_replace(text, misfits, "\xFF");
+}
+
 std::u16string ICUDecodedUTF8(const std::string& text) {
-  const auto decoded = icu::UnicodeString::fromUTF8(text);
+  const auto decoded = icu::UnicodeString::fromUTF8(WithMisfitsAsOne(text));
   return {decoded.getBuffer(), static_cast<size_t>(decoded.length())};
 }
 
