@@ -13,15 +13,15 @@
 //   small (what it then holds is not defined), kErrorInvalidParameter when a rule above is broken
 //   or the size does not fit an int.
 //
-// Damaged text never fails. Malformed UTF-8 becomes one U+FFFD for a lead byte and what follows it
-// as far as it could be the start of a character, and one for each byte that is left then; a second
-// byte of 80 to BF that does not fit its lead byte goes with it, so that ED A0 80 becomes two. An
-// unpaired surrogate becomes EF BF BD in UTF-8. The bytes 81, 8D, 8F, 90 and 9D of windows-1252,
-// which it leaves undefined, stand for the C1 control of their value.
+// Damaged text never fails. In UTF-8 one U+FFFD stands for a byte that begins nothing; for a lead
+// byte with the bytes after it, as far as they could continue it (E2 82 in E2 82 41), and with a
+// second byte of 80 to BF that does not fit it (E0 80, ED A0; what follows is on its own); and for
+// a lead byte with all that is left of the text, where that is too little for it. An unpaired
+// surrogate becomes EF BF BD in UTF-8. The bytes 81, 8D, 8F, 90 and 9D of windows-1252, which it
+// leaves undefined, stand for the C1 control of their value.
 //
-// Two things are the system's own. A unit that windows-1252 lacks becomes '?', but on Windows, for
-// some, a look-alike, such as A for U+0100. And what is cut short by the end of the text becomes
-// one U+FFFD on Windows, together with any other bytes that stand where its last ones were due.
+// One thing is the system's own: a unit that windows-1252 lacks becomes '?', but on Windows, for
+// some, a look-alike, such as A for U+0100.
 //
 // Nothing here allocates or throws.
 #pragma once

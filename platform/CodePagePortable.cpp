@@ -101,9 +101,9 @@ constexpr bool Continues(uint8_t byte) noexcept {
   return byte >= 0x80 && byte < 0xC0;
 }
 
-// A well-formed sequence, or the longest start of one, which a replacement character stands for; a
-// second byte that does not fit its lead byte, as in what is too long or a surrogate, is part of
-// it.
+// A well-formed sequence, or what one replacement character stands for: the longest start of one,
+// with a second byte that does not fit its lead byte, as in what is too long or a surrogate; or all
+// that is left, where that is too little for the lead byte.
 struct Sequence {
   char32_t character;
   size_t length;
@@ -113,9 +113,10 @@ Sequence ReadSequence(const char* text, size_t left) noexcept {
   const auto first = static_cast<uint8_t>(text[0]);
   const Lead lead = LeadFor(first);
   if (lead.following == 0) return {kReplacementCharacter, 1};
+  if (left <= lead.following) return {kReplacementCharacter, left};
   char32_t character = first & (0x3Fu >> lead.following);
   for (size_t i = 1; i <= lead.following; ++i) {
-    const uint8_t byte = i < left ? static_cast<uint8_t>(text[i]) : uint8_t{0};
+    const auto byte = static_cast<uint8_t>(text[i]);
     if (!Continues(byte)) return {kReplacementCharacter, i};
     if (i == 1 && (byte < lead.low || byte > lead.high)) return {kReplacementCharacter, 2};
     character = (character << 6) | (byte & 0x3Fu);

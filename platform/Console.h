@@ -14,7 +14,7 @@ bool StandardInputIsTerminal() noexcept;
 // Whether what failed last was a write to a pipe that nobody reads any more. To be asked at once.
 bool HitClosedPipe() noexcept;
 
-// From now on every byte passes the standard streams as it is.
-void UseBinaryStreams() noexcept;
+// From now on every byte passes the standard streams as it is, and a console takes it for UTF-8.
+void SpeakUTF8() noexcept;
 
 }  // namespace platform

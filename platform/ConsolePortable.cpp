@@ -18,6 +18,6 @@ bool HitClosedPipe() noexcept {
   return errno == EPIPE;
 }
 
-void UseBinaryStreams() noexcept {}
+void SpeakUTF8() noexcept {}
 
 }  // namespace platform

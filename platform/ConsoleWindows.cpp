@@ -1,5 +1,5 @@
 #include <windows.h>
-// Needs what stands above.
+// shellapi.h needs windows.h.
 #include <fcntl.h>
 #include <io.h>
 #include <shellapi.h>
@@ -12,6 +12,16 @@
 #include "WideText.h"
 
 namespace platform {
+namespace {
+
+UINT gCodePageBefore = 0;
+
+bool IsConsole(DWORD standardHandle) noexcept {
+  DWORD mode = 0;
+  return ::GetConsoleMode(::GetStdHandle(standardHandle), &mode) != 0;
+}
+
+}  // namespace
 
 std::vector<std::string> Arguments(int, char**) {
   int count = 0;
@@ -23,7 +33,7 @@ std::vector<std::string> Arguments(int, char**) {
 }
 
 bool StandardInputIsTerminal() noexcept {
-  return _isatty(_fileno(stdin)) != 0;
+  return IsConsole(STD_INPUT_HANDLE);
 }
 
 bool HitClosedPipe() noexcept {
@@ -31,8 +41,13 @@ bool HitClosedPipe() noexcept {
          _doserrno == ERROR_PIPE_NOT_CONNECTED;
 }
 
-void UseBinaryStreams() noexcept {
+// The console's code page outlives the program.
+void SpeakUTF8() noexcept {
   for (std::FILE* const stream : {stdin, stdout, stderr}) _setmode(_fileno(stream), _O_BINARY);
+  if (!IsConsole(STD_OUTPUT_HANDLE) && !IsConsole(STD_ERROR_HANDLE)) return;
+  gCodePageBefore = ::GetConsoleOutputCP();
+  ::SetConsoleOutputCP(CP_UTF8);
+  std::atexit([] { ::SetConsoleOutputCP(gCodePageBefore); });
 }
 
 }  // namespace platform

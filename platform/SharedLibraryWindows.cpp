@@ -1,17 +1,47 @@
 #include <windows.h>
 
-#include <system_error>
-
 #include "SharedLibrary.h"
 #include "WideText.h"
 
 namespace platform {
+namespace {
+
+// Keeps the system from asking in a window what to do about a library that it cannot load.
+class QuietErrors {
+ public:
+  QuietErrors() { ::SetThreadErrorMode(SEM_FAILCRITICALERRORS, &before); }
+  ~QuietErrors() { ::SetThreadErrorMode(before, nullptr); }
+  QuietErrors(const QuietErrors&) = delete;
+  QuietErrors& operator=(const QuietErrors&) = delete;
+
+ private:
+  DWORD before = 0;
+};
+
+// The system would append an extension to a name that has none.
+std::wstring ExactName(const char* path) {
+  std::wstring name = WideFromUTF8(path);
+  const size_t last = name.find_last_of(L"/\\") + 1;
+  if (name.find(L'.', last) == std::wstring::npos) name += L'.';
+  return name;
+}
+
+std::string ErrorText(DWORD error) {
+  wchar_t text[512];
+  constexpr DWORD kFlags =
+      FORMAT_MESSAGE_FROM_SYSTEM | FORMAT_MESSAGE_IGNORE_INSERTS | FORMAT_MESSAGE_MAX_WIDTH_MASK;
+  DWORD length = ::FormatMessageW(kFlags, nullptr, error, 0, text, ARRAYSIZE(text), nullptr);
+  while (length > 0 && (text[length - 1] == L' ' || text[length - 1] == L'.')) --length;
+  return length > 0 ? UTF8FromWide({text, length}) : "error " + std::to_string(error);
+}
+
+}  // namespace
+
 SharedLibrary LoadSharedLibrary(const char* path, std::string& reason) {
-  const HMODULE library = ::LoadLibraryW(WideFromUTF8(path).c_str());
-  if (library == nullptr) {
-    const int error = static_cast<int>(::GetLastError());
-    reason = path + (": " + std::system_category().message(error));
-  }
+  const std::wstring name = ExactName(path);
+  const QuietErrors quiet;
+  const HMODULE library = ::LoadLibraryW(name.c_str());
+  if (library == nullptr) reason = std::string(path) + ": " + ErrorText(::GetLastError());
   return library;
 }
 
@@ -24,6 +54,7 @@ void* FindFunction(SharedLibrary library, const char* name) noexcept {
 }
 
 const void* ModuleOf(const void* address) noexcept {
+  if (address == nullptr) return nullptr;
   HMODULE module = nullptr;
   ::GetModuleHandleExW(
       GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,

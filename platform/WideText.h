@@ -6,7 +6,7 @@
 
 namespace platform {
 
-// Damaged text is replaced. Empty when the text is too long to be converted.
+// Damaged text is replaced.
 std::wstring WideFromUTF8(std::string_view text);
 std::string UTF8FromWide(std::wstring_view text);
 

@@ -3,6 +3,7 @@
 #include <unicode/ucnv.h>
 #include <unicode/unistr.h>
 
+#include <algorithm>
 #include <memory>
 #include <random>
 #include <regex>
@@ -33,10 +34,20 @@ std::string Encoded(uint32_t codePage, const std::u16string& text) {
   return bytes;
 }
 
-// A second byte that does not fit its lead byte counts as a character of its own with ICU.
+// What counts as one here and as several with ICU: a lead byte with a second one that does not fit it,
+// and a lead byte with all that is left where that is too little.
 std::string WithMisfitsAsOne(const std::string& text) {
   static const std::regex misfits("\xE0[\x80-\x9F]|\xED[\xA0-\xBF]|\xF0[\x80-\x8F]|\xF4[\x90-\xBF]");
-  return std::regex_replace(text, misfits, "\xFF");
+  std::string whole = text;
+  for (size_t at = text.size() - std::min<size_t>(text.size(), 3); at < text.size(); ++at) {
+    const auto byte = static_cast<unsigned char>(text[at]);
+    const size_t length = byte < 0xC2 || byte > 0xF4 ? 1 : byte < 0xE0 ? 2 : byte < 0xF0 ? 3 : 4;
+    if (text.size() - at >= length) continue;
+    whole.resize(at);
+    whole += '\xFF';
+    break;
+  }
+  return std::regex_replace(whole, misfits, "\xFF");
 }
 
 std::u16string ICUDecodedUTF8(const std::string& text) {

@@ -12,8 +12,7 @@ namespace {
 std::vector<std::string> Compared(const std::vector<std::string>& lines) {
   std::vector<std::string> compared;
   for (const std::string& line : lines) {
-    const bool isTheSystemsOwn = line.starts_with("look-alike") || line.starts_with("cut-short");
-    if (IS_WINDOWS || !isTheSystemsOwn) compared.push_back(line);
+    if (IS_WINDOWS || !line.starts_with("look-alike")) compared.push_back(line);
   }
   return compared;
 }

@@ -227,6 +227,10 @@ class Translate(unittest.TestCase):
         self.assertIn("\n} -> result 15 (kResultInvariantViolation)\n", failing)
         self.assertNotIn("VRKObjectFactoryUnregister", failing)
 
+    def test_nothing_to_read(self):
+        done = subprocess.run([*KOLVANE, "translate"], stdin=subprocess.DEVNULL, capture_output=True, timeout=60)
+        self.assertEqual((done.returncode, done.stdout, done.stderr), (0, b"", b""))
+
     def test_terminal_without_keys(self):
         try:
             ours, terminal = os.openpty()

@@ -121,11 +121,11 @@ ExitStatus Guard(Action action) {
 }  // namespace
 
 int main(int argc, char** argv) {
-  platform::UseBinaryStreams();
+  platform::SpeakUTF8();
   const ExitStatus run = Guard([&] {
     const std::vector<std::string> arguments = platform::Arguments(argc, argv);
-    std::vector<const char*> words;
-    for (const std::string& argument : arguments) words.push_back(argument.c_str());
+    std::vector<const char*> words(arguments.size());
+    std::ranges::transform(arguments, words.begin(), &std::string::c_str);
     return Run(static_cast<int>(words.size()), words.data());
   });
   const ExitStatus closed = Guard([] {
