@@ -10,10 +10,10 @@ namespace Varnel {
 inline constexpr char kClassStringTranslator[] =
     "class:orvane.localizable-strings.string-translator";
 
-// Every object shares the translator that is the default when the object is created. When that
-// translator dies, creating objects of this class, and all messages to those it served, fail with
-// kResultInvariantViolation; so does the coercion of keys. Another translator that is made the
-// default serves new objects and coercions.
+// Every object shares the translator that is the default when the object is created. Once that
+// translator is dead, all messages to the object fail with kResultInvariantViolation. So do the
+// creation of objects of this class and the coercion of keys as long as the default translator is a
+// dead one, until another is made the default.
 inline constexpr char kClassDefaultStringTranslator[] =
     "class:orvane.localizable-strings.string-translator.default";
 
