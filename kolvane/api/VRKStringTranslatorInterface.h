@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 #include <vector>
 
 namespace Varnel {
@@ -34,5 +35,12 @@ class StringTranslatorInterface {
 
   virtual ~StringTranslatorInterface() = default;
 };
+
+// A key in the form in which those who serve others hand it to TranslateString: with a terminating
+// NUL, which its length counts, unless it is empty.
+inline std::string Terminated(std::string key) {
+  if (!key.empty() && key.back() != '\0') key.push_back('\0');
+  return key;
+}
 
 }  // namespace Varnel

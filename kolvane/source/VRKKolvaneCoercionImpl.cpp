@@ -18,13 +18,9 @@ CheckSite gDataUTF8Site{.domain = "orvane.varnel.kolvanes",
                         .line = 151,
                         .function = "Varnel::Kolvanes::CoercionImpl::HandleCoercionImpl"};
 
-// Keys end in NUL when they reach a translator, except the empty one.
 std::string KeyText(const DataRef& data) {
   const RawPayload payload = GetRawPayload(data);
-  if (payload.byteCount == 0) return {};
-  std::string text(static_cast<const char*>(payload.bytes), payload.byteCount);
-  if (text.back() != '\0') text.push_back('\0');
-  return text;
+  return Terminated({static_cast<const char*>(payload.bytes), payload.byteCount});
 }
 
 std::vector<uint16_t> Translation(const std::string& key) {

@@ -178,7 +178,7 @@ class Translate(unittest.TestCase):
     def test_plug_ins(self):
         (copy := self.file(STUBBORN.read_bytes(), "copy.so")).chmod(0o755)
         self.assertEqual(translate("--plugin", "copy.so", CANCEL, CANCEL, cwd=copy.parent), (0, "no\nno\n", ""))
-        broken = self.file(b"short")
+        broken = self.file(b"short", "a-long-name-" * 9)
         for step, message, answer in [("15 initialize", "the plug-in cannot be initialised", ""),
                                       ("77 create", "cannot create a translator", ""),
                                       ("15 make-default", "cannot make a translator the default", ""),

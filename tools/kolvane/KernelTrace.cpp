@@ -18,9 +18,9 @@ std::span<const VRKHostTraceArgument> Arguments(const VRKHostTraceCall& call) {
   return {call.arguments, call.argumentCount};
 }
 
+// Only as much of the text is repaired as its excerpt may show.
 std::string Quoted(std::string_view text) {
-  constexpr size_t kEnough =
-      256;  // for an excerpt, so that what is repaired is not all of a long text
+  constexpr size_t kEnough = 256;
   return '"' + Excerpt(ToUTF8(ToUTF16(text.substr(0, kEnough)))) + '"';
 }
 

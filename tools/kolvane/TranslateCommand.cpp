@@ -94,28 +94,27 @@ void CheckStandardInput(const Request& request) {
   }
 }
 
-// Calls the translator. `doing` says on failure what could not be done, and names its subject as
-// {}.
-template <class Action>
-void Call(const char* doing, const std::string& subject, Action action) {
+// Does what calls the kernel. `what` tells, when that fails, what could not be done.
+template <class What, class Action>
+void Call(What what, Action action) {
   try {
     action();
   } catch (const Varnel::Exception& failure) {
-    throw Failure(fmt::format("{}: {}", fmt::format(fmt::runtime(doing), Excerpt(subject)),
-                              ResultText(failure.GetResultCode())));
+    throw Failure(fmt::format("{}: {}", what(), ResultText(failure.GetResultCode())));
   }
 }
 
 boost::shared_ptr<Translator> NewTranslator() {
   boost::shared_ptr<Translator> translator;
-  Call("cannot create {}", "a translator", [&] { translator = Varnel::CreateStringTranslator(); });
+  Call([] { return "cannot create a translator"; },
+       [&] { translator = Varnel::CreateStringTranslator(); });
   return translator;
 }
 
 void Load(const ImageFile& file, Translator& translator) {
   const Varnel::TranslationImage image =
       Varnel::PackTranslationImage(file.bytes.data(), static_cast<uint32_t>(file.bytes.size()));
-  Call("{}: cannot be loaded", file.name,
+  Call([&] { return Printable(file.name) + ": cannot be loaded"; },
        [&] { translator.SetTranslations(image.units.get(), image.unitCount); });
 }
 
@@ -149,7 +148,7 @@ bool LoadAll(const std::vector<std::string>& names, FileEncoding encoding, Trans
 std::string Translation(Translator& translator, const std::string& key) {
   if (key.size() > std::numeric_limits<uint32_t>::max()) throw Failure("a key is too long");
   std::vector<uint16_t> units;
-  Call("cannot translate '{}'", key,
+  Call([&] { return fmt::format("cannot translate '{}'", Excerpt(key)); },
        [&] { translator.TranslateString(key.data(), static_cast<uint32_t>(key.size()), units); });
   if (!units.empty()) units.pop_back();  // the 0 that ends it
   return ToUTF8(units);
@@ -186,7 +185,8 @@ void TranslateInput(Translator& translator, bool nul, char ending) {
 ExitStatus Translate(const Request& request) {
   const boost::shared_ptr<Translator> defaultTranslator = NewTranslator();
   const boost::shared_ptr<Translator> translator = NewTranslator();
-  Call("cannot make {} the default", "a translator", [&] { defaultTranslator->MakeDefault(); });
+  Call([] { return "cannot make a translator the default"; },
+       [&] { defaultTranslator->MakeDefault(); });
   const bool loadedDefaults =
       LoadAll(request.defaultDictionaries, request.encoding, *defaultTranslator);
   const bool loadedOwn = LoadAll(request.dictionaries, request.encoding, *translator);

@@ -46,15 +46,12 @@ CheckSite gTranslationKeySite{.domain = kDomain,
                               .line = 236,
                               .function = "Varnel::StringTranslatorHandler::HandleTranslateString"};
 
-// Keys end in NUL when they reach a translator, except the empty one.
 std::string KeyText(DataRef& translationKey) {
   if (GetType(translationKey) != gTokens.typeLocaleIndependentUTF8.Get()) {
     ReportedCheck(gTranslationKeySite,
                   [&] { return translationKey.Coerce(gTokens.typeUTF8.Get(), translationKey); });
   }
-  std::string text = GetUTF8(translationKey);
-  if (!text.empty() && text.back() != '\0') text.push_back('\0');
-  return text;
+  return Terminated(GetUTF8(translationKey));
 }
 
 }  // namespace

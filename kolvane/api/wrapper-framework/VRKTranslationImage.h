@@ -13,8 +13,8 @@ struct TranslationImage {
 };
 
 // Copies the bytes of any dictionary file, text or binary, into units, so that the translator reads
-// exactly those bytes; where their number is odd, one 0 byte follows. An image of more than 2^31 -
-// 2 bytes is more than a translator takes. Throws std::bad_alloc.
+// exactly those bytes; where their number is odd, one 0 byte follows. An image of 2^31 - 1
+// bytes or more is more than a translator takes. Throws std::bad_alloc.
 //
 // The bytes form of SetTranslations is no way for a file as it is: a client sends what it is given
 // as UTF-8, and the kernel recodes it to UTF-16 with a byte-order mark. That does for text in
