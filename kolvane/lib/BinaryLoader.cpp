@@ -1,17 +1,20 @@
 #include "BinaryLoader.h"
 
+#include <algorithm>
 #include <istream>
+#include <limits>
 #include <memory>
-#include <vector>
+#include <utility>
 
 #include "Converters.h"
 #include "DictionaryTable.h"
 #include "LittleEndian.h"
+#include "StoredGroups.h"
 
 namespace tovali_private {
 namespace {
 
-using Bytes = std::vector<uint8_t>;
+using Bytes = StoredImage::Bytes;
 
 // An image's stream, with what is left of it known beforehand.
 class ImageSource {
@@ -23,31 +26,34 @@ class ImageSource {
     if (stream && end > 0) left = static_cast<uint64_t>(end);
   }
 
-  // Reads exactly `count` bytes, or fails before it takes or allocates any.
+  // Reads exactly `count` bytes, or fails before it allocates any.
   bool Read(Bytes& bytes, uint64_t count) {
-    if (count > left || count > bytes.max_size()) return false;
-    bytes.resize(static_cast<size_t>(count));
-    return Read(bytes.data(), count);
+    if (count > left) return false;
+    ReadUpTo(bytes, count);
+    return bytes.size() == count;
   }
 
-  bool Read(uint8_t* bytes, uint64_t count) {
-    if (count > left) return false;
-    stream.read(reinterpret_cast<char*>(bytes), static_cast<std::streamsize>(count));
-    left -= count;
-    position += count;
-    return static_cast<bool>(stream);
+  // Reads as many bytes as there are, but at most `count`.
+  void ReadUpTo(Bytes& bytes, uint64_t count) {
+    const uint64_t wanted = std::min(count, left);
+    if (wanted > bytes.max_size()) throw std::bad_alloc();
+    bytes.resize(static_cast<size_t>(wanted), boost::container::default_init);
+    stream.read(reinterpret_cast<char*>(bytes.data()), static_cast<std::streamsize>(wanted));
+    bytes.resize(static_cast<size_t>(stream.gcount()));
+    left -= bytes.size();
+    position += bytes.size();
   }
 
   bool Read(uint16_t& value) {
     uint8_t bytes[sizeof value];
-    if (!Read(bytes, sizeof bytes)) return false;
+    if (!Read(bytes)) return false;
     value = Read16(bytes);
     return true;
   }
 
   bool Read(uint32_t& value) {
     uint8_t bytes[sizeof value];
-    if (!Read(bytes, sizeof bytes)) return false;
+    if (!Read(bytes)) return false;
     value = Read32(bytes);
     return true;
   }
@@ -55,90 +61,94 @@ class ImageSource {
   uint64_t Position() const noexcept { return position; }
 
  private:
+  bool Read(std::span<uint8_t> bytes) {
+    if (bytes.size() > left) return false;
+    stream.read(reinterpret_cast<char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
+    left -= bytes.size();
+    position += bytes.size();
+    return static_cast<bool>(stream);
+  }
+
   std::istream& stream;
   uint64_t position = 0;
   uint64_t left = 0;
 };
 
-// Gathers the entries of one group and splices them into their bucket when the group ends, however
-// it ends. Without a bucket to go to they are dropped.
-class Group {
- public:
-  Group(DictionaryTable& owner, uint32_t bucketIndex, LoadStatus& loadStatus)
-      : table(owner), bucket(bucketIndex), status(loadStatus) {}
-  Group(const Group&) = delete;
-  Group& operator=(const Group&) = delete;
-
-  ~Group() {
-    if (bucket >= DictionaryTable::kBucketCount) return;
-    status.entriesAdded += static_cast<uint32_t>(entries.size());
-    status.entriesReplaced += table.Splice(bucket, entries);
-  }
-
-  // Whether an entry can be found in the group's bucket.
-  bool Suits(const DictionaryEntry& entry) const noexcept {
-    return bucket == entry.Hash(DictionaryTable::kBucketCount);
-  }
-
-  void Append(std::unique_ptr<DictionaryEntry> entry) { entries.push_back(std::move(entry)); }
-
- private:
-  DictionaryTable& table;
-  uint32_t bucket;
-  LoadStatus& status;
-  std::vector<std::unique_ptr<DictionaryEntry>> entries;
-};
-
-// What stands before the entry data of a version 1.5 body, as it stands there.
+// What else stands before the entry data of a version 1.5 body, as it stands there.
 struct Tables1_5 {
   Bytes counts;
-  Bytes lengths;
   Bytes buckets;
   uint64_t countsAt = 0;
   uint64_t bucketsAt = 0;
 };
 
+// Takes an image apart into groups, with a look at lengths, but none at keys, nor at values that are
+// in UTF-16 already.
 class BinaryLoader {
  public:
-  BinaryLoader(DictionaryTable& owner, std::istream& image, LoadStatus& loadStatus)
-      : table(owner), source(image), status(loadStatus) {}
+  BinaryLoader(std::istream& image, const std::shared_ptr<LoadStatus>& loadStatus)
+      : source(image), status(*loadStatus) {
+    stored.status = loadStatus;
+  }
 
-  // Whether the body was read to its end.
-  bool Load();
+  // Hands the groups to the table, and returns whether the body was there to its end.
+  bool LoadInto(DictionaryTable& table);
 
-  // What ended Load, or else the first damage that it met.
+  // What ended the load, or else the first damage that it met.
   LoadDamage Damage() const noexcept { return damage; }
   uint64_t DamageOffset() const noexcept { return damageOffset; }
 
  private:
-  bool LoadBody1_5();
+  bool Parse();
+  bool ParseBody1_5();
   bool ReadTables(Tables1_5& tables);
-  bool LoadGroups(const Tables1_5& tables);
-  bool LoadBody1_0();
-  bool LoadEntry1_0(Group& group);
-  bool ReadKey(uint32_t length);
-  bool ReadValue(uint32_t length) { return source.Read(valueBytes, length) || StopShort(); }
-  void AppendEntry(Group& group);
-  std::unique_ptr<DictionaryEntry> MakeEntry();
+  bool ParseGroups1_5(const Tables1_5& tables);
+  bool TakeEntries1_5(StoredGroup& group, size_t lengthsEnd);
+
+  bool ParseBody1_0();
+  bool ParseGroups1_0(const Bytes& records, uint64_t recordsAt);
+  bool TakeEntries1_0(StoredGroup& group, uint64_t& place, uint32_t end);
+  bool TakeEntry1_0(StoredGroup& group);
+  bool TakeField1_0(std::span<const uint8_t>& field);
+
+  void ConvertValues(StoredImage& converted);
+  std::span<const uint8_t> Converted(std::span<const uint8_t> value);
 
   void CheckBucket(uint32_t bucket, uint64_t offset);
   void Note(LoadDamage met, uint64_t offset);
   bool Stop(LoadDamage met, uint64_t offset);
   bool StopShort() { return Stop(LoadDamage::kShortRead, source.Position()); }
 
-  DictionaryTable& table;
   ImageSource source;
+  StoredImage stored;
   LoadStatus& status;
   LoadDamage damage = LoadDamage::kNone;
   uint64_t damageOffset = 0;
   int valueEncoding = 0;  // as stored, and the selector of its conversion
-
-  Bytes keyBytes;  // of the entry being read
-  Bytes valueBytes;
+  size_t taken1_0 = 0;    // bytes of a version 1.0 body
   UnicodeBuffer valueUnits;
 };
 
-bool BinaryLoader::Load() {
+bool BinaryLoader::LoadInto(DictionaryTable& table) {
+  const bool whole = Parse();
+  if (valueEncoding == 0) {
+    table.Defer(std::move(stored));
+    return whole;
+  }
+  StoredImage converted;
+  converted.status = stored.status;
+  converted.keysChecked = true;
+  try {
+    ConvertValues(converted);
+  } catch (...) {
+    table.Defer(std::move(converted));
+    throw;
+  }
+  table.Defer(std::move(converted));
+  return whole;
+}
+
+bool BinaryLoader::Parse() {
   Bytes header;
   if (!source.Read(header, kBinaryMagic.size() + 3)) return StopShort();
   const uint8_t* const fields = header.data() + kBinaryMagic.size();
@@ -148,15 +158,20 @@ bool BinaryLoader::Load() {
   status.encoding = valueEncoding == 0   ? TextEncoding::kUTF16LE
                     : valueEncoding == 1 ? TextEncoding::kUTF8
                                          : TextEncoding::kCodePage;
-  if (major == 1 && minor == 5) return LoadBody1_5();
-  if (major == 1 && minor == 0) return LoadBody1_0();
+  if (major == 1 && minor == 5) return ParseBody1_5();
+  if (major == 1 && minor == 0) return ParseBody1_0();
   return Stop(LoadDamage::kUnsupportedVersion, kBinaryMagic.size());
 }
 
-bool BinaryLoader::LoadBody1_5() {
+bool BinaryLoader::ParseBody1_5() {
   status.format = ImageFormat::kBinary1_5;
   Tables1_5 tables;
-  return ReadTables(tables) && LoadGroups(tables);
+  if (!ReadTables(tables)) return false;
+  uint64_t dataSize = 0;
+  for (size_t at = 0; at < stored.lengths.size(); at += 4) dataSize += Read32(&stored.lengths[at]);
+  stored.dataOffset = source.Position();
+  source.ReadUpTo(stored.data, dataSize);
+  return ParseGroups1_5(tables);
 }
 
 bool BinaryLoader::ReadTables(Tables1_5& tables) {
@@ -166,95 +181,133 @@ bool BinaryLoader::ReadTables(Tables1_5& tables) {
   tables.countsAt = source.Position();
   if (!source.Read(tables.counts, uint64_t{4} * groupCount)) return StopShort();
   const uint32_t lengthCount = Read32(&tables.counts[tables.counts.size() - 4]);
-  if (!source.Read(tables.lengths, uint64_t{4} * lengthCount)) return StopShort();
+  if (!source.Read(stored.lengths, uint64_t{4} * lengthCount)) return StopShort();
   tables.bucketsAt = source.Position();
   return source.Read(tables.buckets, uint64_t{2} * groupCount) || StopShort();
 }
 
-bool BinaryLoader::LoadGroups(const Tables1_5& tables) {
+bool BinaryLoader::ParseGroups1_5(const Tables1_5& tables) {
   const size_t groupCount = tables.counts.size() / 4;
-  const size_t lengthCount = tables.lengths.size() / 4;
-  uint32_t next = 0;
+  stored.groups.reserve(groupCount);
+  StoredGroup group;
   for (size_t i = 0; i < groupCount; ++i) {
-    const uint32_t end = Read32(&tables.counts[4 * i]);
-    if (end % 2 != 0 || end < next || end > lengthCount) {
+    const uint64_t lengthsEnd = uint64_t{4} * Read32(&tables.counts[4 * i]);
+    if (lengthsEnd % StoredImage::kLengthsSize != 0 || lengthsEnd < group.lengthsEnd || lengthsEnd > stored.lengths.size()) {
       return Stop(LoadDamage::kBadCounts, tables.countsAt + 4 * i);
     }
-    const uint32_t bucket = Read16(&tables.buckets[2 * i]);
-    CheckBucket(bucket, tables.bucketsAt + 2 * i);
-    Group group(table, bucket, status);
-    for (; next < end; next += 2) {
-      const uint8_t* const pair = &tables.lengths[size_t{4} * next];
-      if (!ReadKey(Read32(pair)) || !ReadValue(Read32(pair + 4))) return false;
-      AppendEntry(group);
-    }
+    group.bucket = Read16(&tables.buckets[2 * i]);
+    group.entryCount = 0;
+    CheckBucket(group.bucket, tables.bucketsAt + 2 * i);
+    const bool whole = TakeEntries1_5(group, static_cast<size_t>(lengthsEnd));
+    stored.groups.push_back(group);
+    if (!whole) return false;
   }
   return true;
 }
 
-// Entries follow one another; offsets only tell, by their differences, where one group ends.
-bool BinaryLoader::LoadBody1_0() {
+bool BinaryLoader::TakeEntries1_5(StoredGroup& group, size_t lengthsEnd) {
+  for (; group.lengthsEnd < lengthsEnd; group.lengthsEnd += StoredImage::kLengthsSize) {
+    const uint8_t* const lengths = &stored.lengths[group.lengthsEnd];
+    const size_t keyLength = Read32(lengths);
+    const size_t valueLength = Read32(lengths + 4);
+    const size_t left = stored.data.size() - group.dataEnd;
+    const uint64_t offset = stored.dataOffset + group.dataEnd;
+    if (keyLength > left) return Stop(LoadDamage::kShortRead, offset);
+    if (valueLength > left - keyLength) return Stop(LoadDamage::kShortRead, offset + keyLength);
+    group.dataEnd += keyLength + valueLength;
+    ++group.entryCount;
+  }
+  return true;
+}
+
+bool BinaryLoader::ParseBody1_0() {
   status.format = ImageFormat::kBinary1_0;
   uint16_t recordCount = 0;
   if (!source.Read(recordCount)) return StopShort();
   const uint64_t recordsAt = source.Position();
   if (recordCount == 0) return Stop(LoadDamage::kNoGroups, recordsAt - sizeof recordCount);
-
-  constexpr size_t kRecordSize = 6;
-  constexpr size_t kOffsetInRecord = 2;
   Bytes records;
-  if (!source.Read(records, kRecordSize * recordCount)) return StopShort();
+  if (!source.Read(records, uint64_t{6} * recordCount)) return StopShort();
+  stored.dataOffset = source.Position() + 4;
+  stored.lengthsBetween = 8;
+  source.ReadUpTo(stored.data, std::numeric_limits<uint64_t>::max());
+  return ParseGroups1_0(records, recordsAt);
+}
 
-  uint64_t place = Read32(&records[kOffsetInRecord]);
-  for (size_t at = 0; at + kRecordSize < records.size(); at += kRecordSize) {
-    const uint32_t bucket = Read16(&records[at]);
-    CheckBucket(bucket, recordsAt + at);
-    const size_t endAt = at + kRecordSize + kOffsetInRecord;
+// Entries follow one another; offsets only tell, by their differences, where one group ends.
+bool BinaryLoader::ParseGroups1_0(const Bytes& records, uint64_t recordsAt) {
+  uint64_t place = Read32(&records[2]);
+  StoredGroup group;
+  for (size_t at = 0; at + 6 < records.size(); at += 6) {
+    const size_t endAt = at + 8;
     const uint32_t end = Read32(&records[endAt]);
-    Group group(table, bucket, status);
-    while (place < end) {
-      const uint64_t entryAt = source.Position();
-      if (!LoadEntry1_0(group)) return false;
-      place += source.Position() - entryAt;
-    }
+    group.bucket = Read16(&records[at]);
+    group.entryCount = 0;
+    CheckBucket(group.bucket, recordsAt + at);
+    const bool whole = TakeEntries1_0(group, place, end);
+    stored.groups.push_back(group);
+    if (!whole) return false;
     if (place != end) Note(LoadDamage::kBadOffset, recordsAt + endAt);
   }
   return true;
 }
 
-bool BinaryLoader::LoadEntry1_0(Group& group) {
-  uint32_t keyLength = 0;
-  if (!source.Read(keyLength)) return StopShort();
-  if (!ReadKey(keyLength)) return false;
-  uint32_t valueLength = 0;
-  if (!source.Read(valueLength)) return StopShort();
-  if (!ReadValue(valueLength)) return false;
-  AppendEntry(group);
+bool BinaryLoader::TakeEntries1_0(StoredGroup& group, uint64_t& place, uint32_t end) {
+  while (place < end) {
+    const size_t entryAt = taken1_0;
+    if (!TakeEntry1_0(group)) return false;
+    place += taken1_0 - entryAt;
+  }
   return true;
 }
 
-bool BinaryLoader::ReadKey(uint32_t length) {
-  status.damageOffset = source.Position();  // should the entry interrupt the load
-  return source.Read(keyBytes, length) || StopShort();
-}
-
-void BinaryLoader::AppendEntry(Group& group) {
-  const uint64_t entryAt = status.damageOffset;
-  auto entry = MakeEntry();
-  if (!group.Suits(*entry)) Note(LoadDamage::kWrongBucket, entryAt);
-  group.Append(std::move(entry));
-}
-
-std::unique_ptr<DictionaryEntry> BinaryLoader::MakeEntry() {
-  const ByteRunKey key(keyBytes.data(), static_cast<uint32_t>(keyBytes.size()), false);
-  const uint8_t* value = valueBytes.data();
-  size_t byteCount = valueBytes.size();
-  if (valueEncoding != 0) {
-    ConvertToUnicode(reinterpret_cast<const char*>(value), byteCount, valueUnits, &valueEncoding);
-    value = reinterpret_cast<const uint8_t*>(valueUnits.Data());
-    byteCount = size_t{valueUnits.Length()} * 2;
+// Moves the entry's key and value, which stand among the lengths, up to those before them.
+bool BinaryLoader::TakeEntry1_0(StoredGroup& group) {
+  std::span<const uint8_t> key, value;
+  if (!TakeField1_0(key) || !TakeField1_0(value)) return false;
+  for (const auto field : {key, value}) {
+    stored.lengths.insert(stored.lengths.end(), field.data() - 4, field.data());
+    std::copy(field.begin(), field.end(), stored.data.data() + group.dataEnd);
+    group.dataEnd += field.size();
   }
-  return std::make_unique<DictionaryEntry>(key, value, static_cast<uint32_t>(byteCount));
+  group.lengthsEnd += StoredImage::kLengthsSize;
+  ++group.entryCount;
+  return true;
+}
+
+bool BinaryLoader::TakeField1_0(std::span<const uint8_t>& field) {
+  const auto left = std::span<const uint8_t>(stored.data).subspan(taken1_0);
+  const uint64_t offset = source.Position() - left.size();
+  if (left.size() < 4) return Stop(LoadDamage::kShortRead, offset);
+  const uint32_t length = Read32(left.data());
+  if (length > left.size() - 4) return Stop(LoadDamage::kShortRead, offset + 4);
+  field = left.subspan(4, length);
+  taken1_0 += size_t{4} + length;
+  return true;
+}
+
+// Stores the same entries with their values in UTF-16; those before a value that cannot be converted
+// also when it throws.
+void BinaryLoader::ConvertValues(StoredImage& converted) {
+  size_t lengthsAt = 0;
+  size_t dataAt = 0;
+  for (const StoredGroup& group : stored.groups) {
+    converted.BeginGroup(group.bucket);
+    for (; lengthsAt < group.lengthsEnd; lengthsAt += StoredImage::kLengthsSize) {
+      const StoredEntry entry = stored.EntryAt(lengthsAt, dataAt);
+      dataAt += entry.key.size() + entry.value.size();
+      status.damageOffset = entry.offset;  // should it interrupt the load
+      converted.Append(entry.key, Converted(entry.value));
+      const bool canBeFound = entry.Key().Hash(DictionaryTable::kBucketCount) == group.bucket;
+      if (!canBeFound) Note(LoadDamage::kWrongBucket, entry.offset);
+    }
+  }
+}
+
+std::span<const uint8_t> BinaryLoader::Converted(std::span<const uint8_t> value) {
+  ConvertToUnicode(reinterpret_cast<const char*>(value.data()), value.size(), valueUnits,
+                   &valueEncoding);
+  return {reinterpret_cast<const uint8_t*>(valueUnits.Data()), size_t{valueUnits.Length()} * 2};
 }
 
 void BinaryLoader::CheckBucket(uint32_t bucket, uint64_t offset) {
@@ -275,12 +328,13 @@ bool BinaryLoader::Stop(LoadDamage met, uint64_t offset) {
 
 }  // namespace
 
-int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status) {
-  status.format = ImageFormat::kBinaryOther;
-  BinaryLoader loader(table, image, status);
-  const bool whole = loader.Load();
-  status.damage = loader.Damage();
-  status.damageOffset = loader.DamageOffset();
+int LoadBinary(DictionaryTable& table, std::istream& image,
+               const std::shared_ptr<LoadStatus>& status) {
+  status->format = ImageFormat::kBinaryOther;
+  BinaryLoader loader(image, status);
+  const bool whole = loader.LoadInto(table);
+  status->damage = loader.Damage();
+  status->damageOffset = loader.DamageOffset();
   return whole ? 0 : -1;
 }
 

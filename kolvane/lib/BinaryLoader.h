@@ -12,6 +12,7 @@
 #pragma once
 
 #include <iosfwd>
+#include <memory>
 #include <string_view>
 
 #include "LoadStatus.h"
@@ -23,12 +24,14 @@ namespace tovali_private {
 inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
 
 // Loads the image, whose stream stands at offset 0 and is known to begin with the magic, and
-// splices each of its groups into the bucket that the group names. Returns 0 when it read the body
-// to its end and -1 when it stopped before; `status` gets format, encoding, counts and damage.
+// splices each of its groups into the bucket that the group names, where it stays as it is until
+// somebody looks into that bucket. Returns 0 when it read the body to its end and -1 when it stopped
+// before; `status` gets format, encoding, counts and damage.
 //
 // Nothing that an image says is trusted: a count or a length that exceeds what is left of the
 // stream is a short read, and is found out before anything is allocated for it. What was read
 // before a stop, or before a value whose conversion throws OVErrException, stays in the table.
-int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status);
+int LoadBinary(DictionaryTable& table, std::istream& image,
+               const std::shared_ptr<LoadStatus>& status);
 
 }  // namespace tovali_private

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <limits>
 #include <memory>
 #include <ostream>
 #include <vector>
@@ -53,14 +54,13 @@ uint32_t HashItem::WriteValue(std::ostream& out, bool binary, const int* selecto
 }
 
 ByteRunKey::ByteRunKey(const uint8_t* bytes, uint32_t byteCount, bool copy)
-    : data(byteCount == 0 ? nullptr : bytes), length(byteCount), owns(copy) {
-  if (copy) data = CopyOf(Bytes());
-}
+    : ByteRunKey(copy ? CopyOf({bytes, byteCount}) : bytes, byteCount,
+                 copy ? Storage::kAllocated : Storage::kBorrowed) {}
 
 ByteRunKey::ByteRunKey(const ByteRunKey& other) : ByteRunKey(other.data, other.length, true) {}
 
 ByteRunKey::~ByteRunKey() {
-  if (owns) delete[] data;
+  if (storage == Storage::kAllocated) delete[] data;
 }
 
 uint32_t ByteRunKey::Write(std::ostream& out, bool binary, const int*) const {
@@ -74,25 +74,51 @@ uint32_t ByteRunKey::Write(std::ostream& out, bool binary, const int*) const {
   return WriteUnits(out, text);
 }
 
-// Looks at nine bytes at most: every one of a key of up to nine, then every second, and so on.
+// Looks at nine bytes at most: every one of a key of up to nine, then every second, and so on. Each
+// is added to the hash so far, shifted left by five, modulo n; nine such steps need 49 bits, so that
+// the remainder can be taken once, at the end.
 uint32_t ByteRunKey::Hash(uint32_t n) const noexcept {
   const uint32_t step = std::max(length / 5, 1u);
-  uint32_t hash = 0;
-  for (uint64_t i = 0; i < length; i += step) hash = ((hash << 5) + data[i]) % n;
-  return hash;
+  uint64_t hash = 0;
+  for (uint64_t i = 0; i < length; i += step) hash = (hash << 5) + data[i];
+  return static_cast<uint32_t>(hash % n);
 }
 
-bool ByteRunKey::Equals(const HashItem& other) const noexcept {
-  const auto& key = static_cast<const ByteRunKey&>(other);
-  return length == key.length && (length == 0 || std::memcmp(data, key.data, length) == 0);
+ByteRunValue* DictionaryEntry::CreateBlock(const ByteRunKey& key, uint64_t valueBytes) {
+  const uint64_t room = uint64_t{sizeof(DictionaryEntry)} + key.Bytes().size();
+  if (room > std::numeric_limits<size_t>::max() / 2) throw std::bad_alloc();
+  return ByteRunValue::Create(valueBytes, static_cast<size_t>(room));
 }
 
-DictionaryEntry::DictionaryEntry(const ByteRunKey& key, const uint8_t* valueBytes,
-                                 uint32_t byteCount)
-    : ByteRunKey(key), value(valueBytes, byteCount) {}
+std::unique_ptr<DictionaryEntry> DictionaryEntry::Place(void* room, const ByteRunKey& key,
+                                                        ByteRunValue* bytes) {
+  uint8_t* const keyBytes = static_cast<uint8_t*>(room) + sizeof(DictionaryEntry);
+  const auto length = static_cast<uint32_t>(key.Bytes().size());
+  std::copy_n(key.Bytes().data(), length, keyBytes);
+  return std::unique_ptr<DictionaryEntry>(::new (room) DictionaryEntry(keyBytes, length, bytes));
+}
 
-DictionaryEntry::DictionaryEntry(const ByteRunKey& key, const uint16_t* text, uint32_t unitCount)
-    : ByteRunKey(key), value(Unescape({text, unitCount})) {}
+std::unique_ptr<DictionaryEntry> DictionaryEntry::Create(const ByteRunKey& key,
+                                                         const uint8_t* valueBytes,
+                                                         uint32_t byteCount) {
+  ByteRunValue* const block = CreateBlock(key, byteCount);
+  std::copy_n(valueBytes, byteCount, block->Data());
+  return Place(block->Room(), key, block);
+}
+
+std::unique_ptr<DictionaryEntry> DictionaryEntry::Create(const ByteRunKey& key,
+                                                         const uint16_t* text, uint32_t unitCount) {
+  ByteRunValue* const block = CreateBlock(key, uint64_t{unitCount} * 2);
+  void* const room = block->Room();
+  block->Shorten(Unescape({text, unitCount}, reinterpret_cast<uint16_t*>(block->Data())) * 2);
+  return Place(room, key, block);
+}
+
+// The block outlives the entry that is taken down in it by this one handle at least.
+void DictionaryEntry::operator delete(DictionaryEntry* entry, std::destroying_delete_t) noexcept {
+  const KolvaneString last = entry->value;
+  entry->~DictionaryEntry();
+}
 
 uint32_t DictionaryEntry::SerializedSize() const {
   return ByteRunKey::SerializedSize() + 2 * value.Length();

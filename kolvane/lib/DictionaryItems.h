@@ -2,7 +2,10 @@
 #pragma once
 
 #include <cstdint>
+#include <cstring>
 #include <iosfwd>
+#include <memory>
+#include <new>
 #include <span>
 
 #include "KolvaneString.h"
@@ -33,7 +36,7 @@ class HashItem {
 
   virtual ~HashItem() = default;
 
-  // The bucket of a table of n buckets that the item belongs to.
+  // The bucket of a table of n buckets that the item belongs to; n is at most 2^27.
   virtual uint32_t Hash(uint32_t n) const noexcept = 0;
 
   // Whether the item has this key; `other` is always a ByteRunKey.
@@ -57,24 +60,40 @@ class ByteRunKey : public HashItem {
   uint32_t SerializedSize() const override { return length; }
   uint32_t Write(std::ostream& out, bool binary, const int* selector) const override;
   uint32_t Hash(uint32_t n) const noexcept override;
-  bool Equals(const HashItem& other) const noexcept override;
+  bool Equals(const HashItem& other) const noexcept final;
 
   std::span<const uint8_t> Bytes() const noexcept { return {data, length}; }
-  bool Owns() const noexcept { return owns; }
+  bool Owns() const noexcept { return storage != Storage::kBorrowed; }
+
+ protected:
+  enum class Storage : uint8_t { kBorrowed, kAllocated, kWithObject };
+
+  ByteRunKey(const uint8_t* bytes, uint32_t byteCount, Storage where) noexcept
+      : data(byteCount == 0 ? nullptr : bytes), length(byteCount), storage(where) {}
 
  private:
   const uint8_t* data;  // null when the length is 0
   uint32_t length;
-  bool owns;
+  Storage storage;
 };
 
-// A key with its translation; hashes and compares as the key does.
+inline bool ByteRunKey::Equals(const HashItem& other) const noexcept {
+  const auto& key = static_cast<const ByteRunKey&>(other);
+  return length == key.length && (length == 0 || std::memcmp(data, key.data, length) == 0);
+}
+
+// A key with its translation; hashes and compares as the key does. Entry, key and value lie in one
+// block of memory, which is the value's: it lasts for as long as anybody shares the value.
 class DictionaryEntry final : public ByteRunKey {
  public:
   // Both copy the key. The first takes the bytes as code units in little-endian order; the second
   // decodes the text, as Unescape does.
-  DictionaryEntry(const ByteRunKey& key, const uint8_t* valueBytes, uint32_t byteCount);
-  DictionaryEntry(const ByteRunKey& key, const uint16_t* text, uint32_t unitCount);
+  static std::unique_ptr<DictionaryEntry> Create(const ByteRunKey& key, const uint8_t* valueBytes,
+                                                 uint32_t byteCount);
+  static std::unique_ptr<DictionaryEntry> Create(const ByteRunKey& key, const uint16_t* text,
+                                                 uint32_t unitCount);
+
+  static void operator delete(DictionaryEntry* entry, std::destroying_delete_t) noexcept;
 
   uint32_t SerializedSize() const override;
   uint32_t Write(std::ostream& out, bool binary, const int* selector) const override;
@@ -83,12 +102,17 @@ class DictionaryEntry final : public ByteRunKey {
 
   const KolvaneString& Value() const noexcept { return value; }
 
+  // The entry behind this one in its chain that has the same key and is found once this one is gone,
+  // or null. The table keeps it.
+  DictionaryEntry* hidden = nullptr;
+
  private:
-  friend class KeyIndex;
+  static ByteRunValue* CreateBlock(const ByteRunKey& key, uint64_t valueBytes);
+  static std::unique_ptr<DictionaryEntry> Place(void* room, const ByteRunKey& key, ByteRunValue* bytes);
+  DictionaryEntry(const uint8_t* keyBytes, uint32_t keyLength, ByteRunValue* valueBytes) noexcept
+      : ByteRunKey(keyBytes, keyLength, Storage::kWithObject), value(valueBytes) {}
 
   KolvaneString value;
-  DictionaryEntry* nextInSlot = nullptr;  // these two belong to the index
-  uint32_t wholeHash = 0;
 };
 
 }  // namespace tovali_private

@@ -50,12 +50,12 @@ void CheckTextEnd(std::istream& image, TextEncoding encoding, LoadStatus& status
 }  // namespace
 
 void DictionaryTable::Load(std::istream& image) {
-  lastLoad = {};
-  lastLoad.damage = LoadDamage::kInterrupted;  // until the load has come to an end
+  lastLoad = std::make_shared<LoadStatus>();
+  lastLoad->damage = LoadDamage::kInterrupted;  // until the load has come to an end
   const auto reader = DictionaryReader::Create(&image);
   switch (Recognise(image)) {
     case Recognised::kTooShort:
-      lastLoad.damage = LoadDamage::kTooShort;
+      lastLoad->damage = LoadDamage::kTooShort;
       break;
     case Recognised::kText:
       LoadText(image, *reader);
@@ -67,23 +67,23 @@ void DictionaryTable::Load(std::istream& image) {
 }
 
 void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
-  lastLoad.format = ImageFormat::kText;
-  lastLoad.encoding = reader.Encoding();
+  lastLoad->format = ImageFormat::kText;
+  lastLoad->encoding = reader.Encoding();
   while (const uint16_t* line = reader.GetNextLine()) {
     if (line[0] == 0) continue;
     switch (StoreLine({line, reader.LineLength()})) {
       case StoredLine::kDropped:
-        ++lastLoad.linesDropped;
+        ++lastLoad->linesDropped;
         break;
       case StoredLine::kReplaced:
-        ++lastLoad.entriesReplaced;
+        ++lastLoad->entriesReplaced;
         [[fallthrough]];
       case StoredLine::kAdded:
-        ++lastLoad.entriesAdded;
+        ++lastLoad->entriesAdded;
         break;
     }
   }
-  CheckTextEnd(image, reader.Encoding(), lastLoad);
+  CheckTextEnd(image, reader.Encoding(), *lastLoad);
 }
 
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
@@ -93,8 +93,9 @@ StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
   std::transform(split->key.begin(), split->key.end(), narrowed.begin(),
                  [](uint16_t unit) { return static_cast<uint8_t>(unit); });
   const ByteRunKey key(narrowed.data(), static_cast<uint32_t>(narrowed.size()), false);
-  auto entry = std::make_unique<DictionaryEntry>(key, split->value.data(),
-                                                 static_cast<uint32_t>(split->value.size()));
+  auto entry = DictionaryEntry::Create(key, split->value.data(),
+                                       static_cast<uint32_t>(split->value.size()));
+  index.ReserveOne();
   const bool replaces = Detach(key) != nullptr;
   Insert(std::move(entry));
   return replaces ? StoredLine::kReplaced : StoredLine::kAdded;

@@ -3,47 +3,97 @@
 #include <utility>
 
 using tovali_private::HashItem;
+using tovali_private::StoredEntry;
+using tovali_private::StoredGroup;
+using tovali_private::StoredImage;
+
+namespace {
+
+// Entries are met in the order in which they are asked for; the one that counts is the image's first.
+void NoteWrongBucket(LoadStatus& status, uint64_t offset) {
+  const bool isBefore = status.damage == LoadDamage::kWrongBucket && offset < status.damageOffset;
+  if (status.damage != LoadDamage::kNone && !isBefore) return;
+  status.damage = LoadDamage::kWrongBucket;
+  status.damageOffset = offset;
+}
+
+}  // namespace
 
 DictionaryTable::~DictionaryTable() {
   if (defaultDictionary == this) defaultDictionary = nullptr;
   Clear();
 }
 
-DictionaryTable::DictionaryEntry* DictionaryTable::Find(const ByteRunKey& key) noexcept {
-  lastBucket = key.Hash(kBucketCount);
-  DictionaryEntry* const found = index.Find(key);
-  predecessor = found != nullptr ? found->previous : nullptr;
-  return found;
+DictionaryTable::DictionaryEntry* DictionaryTable::Find(const ByteRunKey& key) {
+  if (waiting.Any()) Settle(key.Hash(kBucketCount));
+  return index.Find(key);
 }
 
-std::unique_ptr<DictionaryTable::DictionaryEntry> DictionaryTable::Detach(
-    const ByteRunKey& key) noexcept {
+std::unique_ptr<DictionaryTable::DictionaryEntry> DictionaryTable::Detach(const ByteRunKey& key) {
   std::unique_ptr<DictionaryEntry> found(Find(key));
   if (found == nullptr) return nullptr;
-  index.Remove(*found);
-  HashItem*& link = predecessor != nullptr ? predecessor->next : buckets[lastBucket];
-  link = std::exchange(found->next, nullptr);
-  if (link != nullptr) link->previous = predecessor;
-  found->previous = nullptr;
+  if (DictionaryEntry* const next = std::exchange(found->hidden, nullptr)) {
+    index.Put(*next);
+  } else {
+    index.Remove(*found);
+  }
+  Unlink(*found);
   return found;
 }
 
-void DictionaryTable::Insert(std::unique_ptr<DictionaryEntry> entry) noexcept {
-  const uint32_t bucket = entry->Hash(kBucketCount);
-  LinkAtHead(bucket, std::move(entry));
+void DictionaryTable::Unlink(HashItem& item) noexcept {
+  HashItem* const after = std::exchange(item.next, nullptr);
+  HashItem* const before = std::exchange(item.previous, nullptr);
+  (before != nullptr ? before->next : buckets[item.Hash(kBucketCount)]) = after;
+  if (after != nullptr) after->previous = before;
 }
 
-// The last entry goes in first: what comes to the head of a chain after it stands before it.
-uint32_t DictionaryTable::Splice(uint32_t bucket,
-                                 std::span<std::unique_ptr<DictionaryEntry>> group) noexcept {
-  uint32_t hiding = 0;
-  for (size_t i = group.size(); i-- > 0;) {
-    if (LinkAtHead(bucket, std::move(group[i]))) ++hiding;
+void DictionaryTable::Insert(std::unique_ptr<DictionaryEntry> entry) {
+  const uint32_t bucket = entry->Hash(kBucketCount);
+  if (waiting.Any()) Settle(bucket);
+  index.ReserveOne();
+  LinkAtHead(bucket, std::move(entry), true);
+}
+
+void DictionaryTable::Defer(tovali_private::StoredImage&& image) {
+  const std::shared_ptr<LoadStatus> status = image.status;
+  status->entriesAdded += waiting.Add(std::move(image));
+}
+
+const LoadStatus& DictionaryTable::LastLoad() {
+  for (uint32_t bucket = 0; waiting.Any() && bucket < kBucketCount; ++bucket) Settle(bucket);
+  return *lastLoad;
+}
+
+const HashItem* DictionaryTable::Bucket(uint32_t bucket) {
+  Settle(bucket);
+  return buckets[bucket];
+}
+
+// Oldest groups go first, and of each the last entry: what comes to the head of a chain after
+// something stands before it. Should memory run out, the rest waits on.
+void DictionaryTable::Settle(uint32_t bucket) {
+  while (StoredGroup* const group = waiting.Oldest(bucket)) {
+    while (group->entryCount != 0) SettleLastOf(*group);
+    waiting.DropOldest(bucket);
   }
-  return hiding;
+}
+
+void DictionaryTable::SettleLastOf(StoredGroup& group) {
+  const StoredImage& image = *group.image;
+  const StoredEntry stored = image.LastOf(group);
+  auto entry = DictionaryEntry::Create(stored.Key(), stored.value.data(),
+                                       static_cast<uint32_t>(stored.value.size()));
+  const bool canBeFound = entry->Hash(kBucketCount) == group.bucket;
+  if (canBeFound) index.ReserveOne();
+  const bool hides = LinkAtHead(group.bucket, std::move(entry), canBeFound);
+  image.DropLastOf(group);
+  if (hides) ++image.status->entriesReplaced;
+  if (!canBeFound && !image.keysChecked) NoteWrongBucket(*image.status, stored.offset);
 }
 
 void DictionaryTable::Clear() noexcept {
+  waiting.Clear();
   index.Clear();
   for (HashItem*& head : buckets) {
     while (head != nullptr) {
@@ -54,11 +104,12 @@ void DictionaryTable::Clear() noexcept {
 }
 
 // Returns whether the entry hides another one of its key.
-bool DictionaryTable::LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry) noexcept {
+bool DictionaryTable::LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry,
+                                 bool canBeFound) noexcept {
   DictionaryEntry* const item = entry.release();
   item->next = buckets[bucket];
   if (item->next != nullptr) item->next->previous = item;
   buckets[bucket] = item;
-  const bool canBeFound = item->Hash(kBucketCount) == bucket;
-  return canBeFound && index.Add(*item);
+  if (canBeFound) item->hidden = index.Put(*item);
+  return item->hidden != nullptr;
 }

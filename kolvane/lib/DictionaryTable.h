@@ -12,6 +12,7 @@
 #include "DictionaryItems.h"
 #include "KeyIndex.h"
 #include "LoadStatus.h"
+#include "StoredGroups.h"
 #include "TranslatedString.h"
 
 namespace tovali_private {
@@ -28,7 +29,7 @@ class DictionaryTable {
   using DictionaryEntry = tovali_private::DictionaryEntry;
   using ByteRunKey = tovali_private::ByteRunKey;
 
-  static constexpr uint32_t kBucketCount = 1021;
+  static constexpr uint32_t kBucketCount = tovali_private::WaitingGroups::kBucketCount;
 
   DictionaryTable() = default;
   DictionaryTable(const DictionaryTable&) = delete;
@@ -43,8 +44,9 @@ class DictionaryTable {
   // stored before stays.
   void Load(std::istream& image);
 
-  // How the latest load went, one that threw included.
-  const LoadStatus& LastLoad() const noexcept { return lastLoad; }
+  // How the latest load went, one that threw included; valid until the next one. To know it all, it
+  // looks into every bucket. Throws std::bad_alloc.
+  const LoadStatus& LastLoad();
 
   // Makes this the process's default dictionary, in which every table looks for what it lacks. The
   // table stays with its owner.
@@ -64,40 +66,44 @@ class DictionaryTable {
   // key's units are narrowed to their low 8 bits. When it throws, the table is as it was.
   StoredLine StoreLine(std::span<const uint16_t> line);
 
+  // These work on the table's chains, and may have to make a bucket's entries first that a binary
+  // image left there; when that throws std::bad_alloc they have done nothing else.
+
   // The first entry of the key's bucket that has this key, or null.
-  DictionaryEntry* Find(const ByteRunKey& key) noexcept;
+  DictionaryEntry* Find(const ByteRunKey& key);
 
   // Takes out what Find finds; an equal key behind it is found from then on.
-  std::unique_ptr<DictionaryEntry> Detach(const ByteRunKey& key) noexcept;
+  std::unique_ptr<DictionaryEntry> Detach(const ByteRunKey& key);
 
   // Puts an entry at the head of its bucket, in front of any of the same key.
-  void Insert(std::unique_ptr<DictionaryEntry> entry) noexcept;
+  void Insert(std::unique_ptr<DictionaryEntry> entry);
 
-  // Puts the entries, in their order, in front of what the bucket holds. An entry whose key belongs
-  // to another bucket is owned but never found. Returns how many now hide an entry of the same key.
-  // `bucket` is less than kBucketCount.
-  uint32_t Splice(uint32_t bucket, std::span<std::unique_ptr<DictionaryEntry>> group) noexcept;
+  // The first item of a bucket's chain, or null.
+  const tovali_private::HashItem* Bucket(uint32_t bucket);
+
+  // Puts the image's groups, each with its entries in their order, in front of what their buckets
+  // hold, or drops those whose bucket is not the table's. An entry whose key belongs to another
+  // bucket is owned but never found.
+  void Defer(tovali_private::StoredImage&& image);
 
   // Destroys every entry.
   void Clear() noexcept;
 
-  // The first item of a bucket's chain, or null.
-  const tovali_private::HashItem* Bucket(uint32_t bucket) const noexcept { return buckets[bucket]; }
-
  private:
-  bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry) noexcept;
+  void Settle(uint32_t bucket);
+  void SettleLastOf(tovali_private::StoredGroup& group);
+  bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry, bool canBeFound) noexcept;
+  void Unlink(tovali_private::HashItem& item) noexcept;
   void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
   KolvaneString Lookup(std::span<const char> text, const int* selector);
 
-  // Where the latest Find looked, and the item before the one it returned.
-  uint32_t lastBucket = 0;
-  tovali_private::HashItem* predecessor = nullptr;
-
-  // The chains are the truth. The index finds what a walk from a chain's head would find first.
+  // The chains are the truth, as far as no group waits for its bucket. The index finds what a walk
+  // from a chain's head would find first.
   tovali_private::HashItem* buckets[kBucketCount] = {};
+  tovali_private::WaitingGroups waiting;
   tovali_private::KeyIndex index;
 
-  LoadStatus lastLoad;
+  std::shared_ptr<LoadStatus> lastLoad = std::make_shared<LoadStatus>();
 
   static DictionaryTable* defaultDictionary;  // owned by whoever owns the table
 };

@@ -14,6 +14,10 @@ namespace {
 constexpr uint32_t kFirstSlots = 16;
 constexpr uint32_t kMostSlots = 1u << 31;
 
+constexpr uint32_t MostItems(uint32_t slotCount) noexcept {
+  return slotCount / 4 * 3;
+}
+
 uint64_t ProcessSeed() {
   static const uint64_t seed = [] {
     std::random_device random;
@@ -26,71 +30,67 @@ uint64_t ProcessSeed() {
 
 KeyIndex::KeyIndex()
     : seed(ProcessSeed()),
-      slotCount(kFirstSlots),
-      slots(std::make_unique<DictionaryEntry*[]>(kFirstSlots)) {}
+      mask(kFirstSlots - 1),
+      most(MostItems(kFirstSlots)),
+      slots(std::make_unique<Slot[]>(kFirstSlots)) {}
 
 DictionaryEntry* KeyIndex::Find(const ByteRunKey& key) const noexcept {
-  return Find(key, WholeHash(key));
+  return slots[SlotFor(HashOf(key), key)].item;
 }
 
-bool KeyIndex::Add(DictionaryEntry& entry) noexcept {
-  if (entryCount >= slotCount) Grow();
-  entry.wholeHash = WholeHash(entry);
-  const bool hides = Find(entry, entry.wholeHash) != nullptr;
-  PutInFront(entry);
-  ++entryCount;
-  return hides;
+DictionaryEntry* KeyIndex::Put(DictionaryEntry& item) noexcept {
+  const uint32_t hash = HashOf(item);
+  Slot& slot = slots[SlotFor(hash, item)];
+  if (slot.item == nullptr) ++itemCount;
+  slot.hash = hash;
+  return std::exchange(slot.item, &item);
 }
 
-void KeyIndex::Remove(DictionaryEntry& entry) noexcept {
-  DictionaryEntry** link = &SlotOf(entry.wholeHash);
-  while (*link != &entry) link = &(*link)->nextInSlot;
-  *link = std::exchange(entry.nextInSlot, nullptr);
-  --entryCount;
+// Closes the gap: each item behind it, up to the next empty slot, moves into it unless it is to be
+// looked for only from behind the gap on.
+void KeyIndex::Remove(const DictionaryEntry& item) noexcept {
+  uint32_t gap = SlotFor(HashOf(item), item);
+  for (uint32_t next = Behind(gap); slots[next].item != nullptr; next = Behind(next)) {
+    const uint32_t fromItsFirst = (next - slots[next].hash) & mask;
+    const uint32_t fromGap = (next - gap) & mask;
+    if (fromItsFirst < fromGap) continue;
+    slots[gap] = slots[next];
+    gap = next;
+  }
+  slots[gap] = {};
+  --itemCount;
 }
 
 void KeyIndex::Clear() noexcept {
-  std::fill_n(slots.get(), slotCount, nullptr);
-  entryCount = 0;
+  std::fill_n(slots.get(), size_t{mask} + 1, Slot());
+  itemCount = 0;
 }
 
-uint32_t KeyIndex::WholeHash(const ByteRunKey& key) const noexcept {
+uint32_t KeyIndex::HashOf(const ByteRunKey& key) const noexcept {
   const auto bytes = key.Bytes();
   return static_cast<uint32_t>(XXH3_64bits_withSeed(bytes.data(), bytes.size(), seed));
 }
 
-DictionaryEntry* KeyIndex::Find(const ByteRunKey& key, uint32_t hash) const noexcept {
-  DictionaryEntry* entry = SlotOf(hash);
-  while (entry != nullptr && !(entry->wholeHash == hash && entry->Equals(key))) {
-    entry = entry->nextInSlot;
+// The slot of the item with this key, or else the empty one where it would go.
+uint32_t KeyIndex::SlotFor(uint32_t hash, const ByteRunKey& key) const noexcept {
+  uint32_t at = hash & mask;
+  while (slots[at].item != nullptr && !(slots[at].hash == hash && slots[at].item->Equals(key))) {
+    at = Behind(at);
   }
-  return entry;
+  return at;
 }
 
-void KeyIndex::PutInFront(DictionaryEntry& entry) noexcept {
-  DictionaryEntry*& slot = SlotOf(entry.wholeHash);
-  entry.nextInSlot = std::exchange(slot, &entry);
-}
-
-// Entries with equal keys move from one slot to another together and must keep their order, so each
-// list is turned round before its entries are put, one in front of the other, into their new slots.
-void KeyIndex::Grow() noexcept {
-  if (slotCount == kMostSlots) return;
-  std::unique_ptr<DictionaryEntry*[]> old(new (std::nothrow)
-                                              DictionaryEntry*[size_t{slotCount} * 2]());
-  if (old == nullptr) return;
+void KeyIndex::Grow() {
+  if (mask + 1 == kMostSlots) throw std::bad_alloc();
+  auto old = std::make_unique<Slot[]>((size_t{mask} + 1) * 2);
   old.swap(slots);
-  const uint32_t oldCount = std::exchange(slotCount, slotCount * 2);
-  for (uint32_t i = 0; i < oldCount; ++i) {
-    DictionaryEntry* reversed = nullptr;
-    while (DictionaryEntry* entry = old[i]) {
-      old[i] = std::exchange(entry->nextInSlot, reversed);
-      reversed = entry;
-    }
-    while (DictionaryEntry* entry = reversed) {
-      reversed = entry->nextInSlot;
-      PutInFront(*entry);
-    }
+  const uint32_t oldMask = std::exchange(mask, mask * 2 + 1);
+  most = MostItems(mask + 1);
+  for (uint32_t i = 0; i <= oldMask; ++i) {
+    if (old[i].item == nullptr) continue;
+    uint32_t at = old[i].hash & mask;
+    while (slots[at].item != nullptr) at = Behind(at);
+    slots[at] = old[i];
   }
 }
 

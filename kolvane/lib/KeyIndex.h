@@ -1,4 +1,4 @@
-// Finds the entry for a key in constant time, whatever the keys look like.
+// Finds an item by its key in constant time, whatever the keys look like.
 #pragma once
 
 #include <cstdint>
@@ -8,42 +8,47 @@
 
 namespace tovali_private {
 
-// A hash table over whole keys, seeded anew in every process, so that an image can crowd its slots
-// in a small share at most of the processes that load it. It owns none of its entries. Several of
-// them may have equal keys: the one added last hides the others, and they come to light again,
-// latest first, as those before them are removed.
-//
-// No operation allocates but Add, which grows the slots as entries come; where there is no memory
-// for that the slots stay as they are and lookups slow down.
+// A hash table over whole keys that knows at most one item for each. It is seeded anew in every
+// process, so that no image can be made to crowd its slots. It owns no items, and moves none.
 class KeyIndex {
  public:
   KeyIndex();
   KeyIndex(const KeyIndex&) = delete;
   KeyIndex& operator=(const KeyIndex&) = delete;
 
-  // The entry added last of those that have this key, or null.
+  // Makes room for another key; Put needs it. Throws std::bad_alloc, and has then done nothing.
+  void ReserveOne() {
+    if (itemCount == most) Grow();
+  }
+
+  // The item with this key, or null.
   DictionaryEntry* Find(const ByteRunKey& key) const noexcept;
 
-  // Returns whether the entry hides another one of its key. The entry must not be in the index.
-  bool Add(DictionaryEntry& entry) noexcept;
+  // Makes the item the one that is found by its key. Returns the one that was, or null.
+  DictionaryEntry* Put(DictionaryEntry& item) noexcept;
 
-  // The entry must be in the index.
-  void Remove(DictionaryEntry& entry) noexcept;
+  // Forgets an item that Find finds.
+  void Remove(const DictionaryEntry& item) noexcept;
 
-  // Forgets every entry, at the cost of a pass over the slots.
   void Clear() noexcept;
 
  private:
-  uint32_t WholeHash(const ByteRunKey& key) const noexcept;
-  DictionaryEntry*& SlotOf(uint32_t hash) const noexcept { return slots[hash & (slotCount - 1)]; }
-  DictionaryEntry* Find(const ByteRunKey& key, uint32_t hash) const noexcept;
-  void PutInFront(DictionaryEntry& entry) noexcept;
-  void Grow() noexcept;
+  // Slots are looked through from the one that the hash names onwards, up to an empty one.
+  struct Slot {
+    uint32_t hash = 0;
+    DictionaryEntry* item = nullptr;
+  };
+
+  uint32_t Behind(uint32_t slot) const noexcept { return (slot + 1) & mask; }
+  uint32_t HashOf(const ByteRunKey& key) const noexcept;
+  uint32_t SlotFor(uint32_t hash, const ByteRunKey& key) const noexcept;
+  void Grow();
 
   uint64_t seed;
-  uint32_t slotCount;  // a power of two
-  uint32_t entryCount = 0;
-  std::unique_ptr<DictionaryEntry*[]> slots;  // each the first of a list linked by nextInSlot
+  uint32_t mask;  // one less than the number of slots, which is a power of two
+  uint32_t most;  // items, for lookups to stay short
+  uint32_t itemCount = 0;
+  std::unique_ptr<Slot[]> slots;
 };
 
 }  // namespace tovali_private

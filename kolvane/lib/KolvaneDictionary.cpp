@@ -10,7 +10,7 @@ void KolvaneDictionary::Load(std::istream& image) {
   table->Load(image);
 }
 
-const LoadStatus& KolvaneDictionary::LastLoad() const noexcept {
+const LoadStatus& KolvaneDictionary::LastLoad() {
   return table->LastLoad();
 }
 

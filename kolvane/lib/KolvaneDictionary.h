@@ -19,7 +19,7 @@ class KolvaneDictionary {
   ~KolvaneDictionary();
 
   void Load(std::istream& image);
-  const LoadStatus& LastLoad() const noexcept;
+  const LoadStatus& LastLoad();
   void MakeDefault() noexcept;
   TranslatedString Translate(const char* text, const int* selector);
 

@@ -1,8 +1,9 @@
 // The text of a translation: immutable UTF-16 that many holders share.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
-#include <memory>
+#include <new>
 #include <span>
 
 namespace tovali_private {
@@ -27,19 +28,33 @@ class RefCountObj {
   uint32_t count = 0;
 };
 
-// A copy of the bytes it is given; the bytes are null when there are none.
+// A run of bytes, in one block of memory with the object. The block can have room for something else
+// that is to live as long as the bytes.
 class ByteRunValue final : public RefCountObj {
  public:
-  ByteRunValue(const uint8_t* bytes, uint32_t byteCount);
+  // The bytes are to be written, then shared. Throws std::bad_alloc.
+  static ByteRunValue* Create(uint64_t byteCount, size_t room = 0);
 
-  const uint8_t* Data() const noexcept { return data.get(); }
+  // Gives up the bytes behind the first `byteCount`; to be done before the run is shared.
+  void Shorten(uint32_t byteCount) noexcept { length = byteCount; }
+
+  // Null when there are none.
+  uint8_t* Data() noexcept { return length == 0 ? nullptr : Storage(); }
   uint32_t Length() const noexcept { return length; }
 
+  // Aligned for pointers; to be asked for before the run is shortened.
+  void* Room() noexcept { return Storage() + AlignedSize(length); }
+
+  static void operator delete(void* block) noexcept { ::operator delete(block); }
+
  private:
+  explicit ByteRunValue(uint32_t byteCount) noexcept : length(byteCount) {}
   ~ByteRunValue() override = default;
 
+  uint8_t* Storage() noexcept { return reinterpret_cast<uint8_t*>(this + 1); }
+  static uint64_t AlignedSize(uint64_t byteCount) noexcept;
+
   uint32_t length;
-  std::unique_ptr<uint8_t[]> data;
 };
 
 }  // namespace tovali_private
@@ -56,11 +71,14 @@ class KolvaneString {
   KolvaneString(const uint16_t* units, uint32_t unitCount);
   KolvaneString(const uint8_t* bytes, uint32_t byteCount);
 
+  // Shares the bytes.
+  explicit KolvaneString(tovali_private::ByteRunValue* bytes) noexcept;
+
   KolvaneString(const KolvaneString& other) noexcept;
   KolvaneString& operator=(const KolvaneString& other) noexcept;
   ~KolvaneString();
 
-  const uint16_t* Data() const noexcept { return reinterpret_cast<const uint16_t*>(value->Data()); }
+  const uint16_t* Data() const noexcept { return reinterpret_cast<uint16_t*>(value->Data()); }
   uint32_t Length() const noexcept { return value->Length() / 2; }
   uint32_t ByteLength() const noexcept { return value->Length(); }
   std::span<const uint16_t> Units() const noexcept { return {Data(), Length()}; }

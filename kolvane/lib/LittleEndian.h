@@ -1,4 +1,4 @@
-// Every turning of bytes into integers that the dictionary library does.
+// Every turning of bytes into integers, and back, that the dictionary library does.
 #pragma once
 
 #include <bit>
@@ -16,6 +16,10 @@ inline uint16_t Read16(const uint8_t* bytes) noexcept {
 
 inline uint32_t Read32(const uint8_t* bytes) noexcept {
   return Read16(bytes) | static_cast<uint32_t>(Read16(bytes + 2)) << 16;
+}
+
+inline void Write32(uint8_t* bytes, uint32_t value) noexcept {
+  for (int i = 0; i < 4; ++i) bytes[i] = static_cast<uint8_t>(value >> (8 * i));
 }
 
 }  // namespace tovali_private

@@ -48,45 +48,39 @@ const Escape* FindEscape(uint16_t escapeCharacter, uint16_t letter) noexcept {
   return found == table.end() ? nullptr : &*found;
 }
 
-std::vector<uint16_t> DecodeEscapes(Units text) {
-  std::vector<uint16_t> decoded;
-  decoded.reserve(text.size());
-  uint16_t pending = 0;  // the escape character before this unit, if there is one
-  for (const uint16_t unit : text) {
-    if (pending == 0) {
-      if (IsEscapeCharacter(unit)) {
-        pending = unit;
-      } else {
-        decoded.push_back(unit);
-      }
+// Returns where the decoded text ends.
+uint16_t* DecodeEscapes(Units text, uint16_t* out) noexcept {
+  for (size_t i = 0; i < text.size(); ++i) {
+    const uint16_t unit = text[i];
+    const bool escapes = IsEscapeCharacter(unit) && i + 1 < text.size();
+    if (!escapes) {
+      *out++ = unit;
       continue;
     }
-    if (const Escape* escape = FindEscape(pending, unit)) {
-      decoded.push_back(escape->character);
+    const uint16_t letter = text[++i];
+    if (const Escape* escape = FindEscape(unit, letter)) {
+      *out++ = escape->character;
     } else {
-      decoded.push_back(pending);
-      if (unit != pending) decoded.push_back(unit);
+      *out++ = unit;
+      if (letter != unit) *out++ = letter;
     }
-    pending = 0;
   }
-  if (pending != 0) decoded.push_back(pending);
-  return decoded;
+  return out;
 }
 
-// In place: a name is longer than its character.
-void ExpandNamedCharacters(std::vector<uint16_t>& text) {
-  const auto firstMark = std::find(text.begin(), text.end(), '#');
-  auto out = firstMark;
-  for (auto in = firstMark; in != text.end();) {
-    const NamedCharacter* named = *in == '#' ? MatchNamedCharacter(Units(in, text.end())) : nullptr;
+// In place: a name is longer than its character. Returns where the expanded text ends.
+uint16_t* ExpandNamedCharacters(uint16_t* text, uint16_t* end) noexcept {
+  uint16_t* out = std::find(text, end, '#');
+  for (const uint16_t* in = out; in != end;) {
+    const NamedCharacter* named = *in == '#' ? MatchNamedCharacter(Units(in, end)) : nullptr;
     if (named == nullptr) {
       *out++ = *in++;
       continue;
     }
     for (const uint16_t unit : named->Units()) *out++ = unit;
-    in += static_cast<std::ptrdiff_t>(named->WrittenLength());
+    in += named->WrittenLength();
   }
-  text.erase(out, text.end());
+  return out;
 }
 
 // The letter that stands for a unit after a backslash in written text, or 0 for a unit that is
@@ -128,10 +122,16 @@ std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept
 template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noexcept;
 template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
+uint32_t Unescape(Units text, uint16_t* decoded) noexcept {
+  uint16_t* const end = ExpandNamedCharacters(decoded, DecodeEscapes(text, decoded));
+  return static_cast<uint32_t>(end - decoded);
+}
+
 KolvaneString Unescape(Units text) {
-  std::vector<uint16_t> decoded = DecodeEscapes(text);
-  ExpandNamedCharacters(decoded);
-  return {decoded.data(), static_cast<uint32_t>(decoded.size())};
+  auto* const bytes = ByteRunValue::Create(uint64_t{2} * text.size());
+  KolvaneString value(bytes);
+  bytes->Shorten(2 * Unescape(text, reinterpret_cast<uint16_t*>(bytes->Data())));
+  return value;
 }
 
 std::optional<std::vector<uint16_t>> EscapeForText(Units text) {

@@ -103,7 +103,7 @@ void Load(DictionaryTable& table, const std::string& image) {
   table.Load(stream);
 }
 
-Contents ContentsOf(const DictionaryTable& table) {
+Contents ContentsOf(DictionaryTable& table) {
   Contents contents;
   for (uint32_t bucket = 0; bucket < DictionaryTable::kBucketCount; ++bucket) {
     for (auto item = table.Bucket(bucket); item != nullptr; item = item->next) {

@@ -36,6 +36,6 @@ void Load(DictionaryTable& table, const std::string& image);
 
 // Every entry of a table: bucket, key and value, in the order of the chains.
 using Contents = std::vector<std::tuple<uint32_t, std::string, std::u16string>>;
-Contents ContentsOf(const DictionaryTable& table);
+Contents ContentsOf(DictionaryTable& table);
 
 std::u16string Translated(DictionaryTable& table, const char* text, int selector = 1);

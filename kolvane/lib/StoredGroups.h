@@ -1,0 +1,97 @@
+// Entries of binary images that stay as they were stored until somebody looks into their bucket.
+//
+// To make entries of an image takes several times as long as to read it, and most programs ask for
+// few of their keys.
+#pragma once
+
+#include <array>
+#include <boost/container/vector.hpp>
+#include <cstddef>
+#include <cstdint>
+#include <list>
+#include <memory>
+#include <span>
+#include <vector>
+
+#include "DictionaryItems.h"
+#include "LoadStatus.h"
+
+namespace tovali_private {
+
+struct StoredImage;
+
+// What is left of one group; entries are taken from its end.
+struct StoredGroup {
+  uint32_t bucket = 0;
+  uint32_t entryCount = 0;
+  size_t lengthsEnd = 0;  // where its entries end in the image's lengths and data
+  size_t dataEnd = 0;
+  StoredImage* image = nullptr;  // these two belong to WaitingGroups
+  StoredGroup* next = nullptr;
+};
+
+// An entry that borrows its image's bytes.
+struct StoredEntry {
+  ByteRunKey Key() const { return {key.data(), static_cast<uint32_t>(key.size()), false}; }
+
+  std::span<const uint8_t> key;
+  std::span<const uint8_t> value;  // UTF-16
+  uint64_t offset;                 // of the key in the image that was loaded
+};
+
+// The entries of one image, and its groups in their order.
+struct StoredImage {
+  using Bytes = boost::container::vector<uint8_t>;
+
+  static constexpr size_t kLengthsSize = 8;  // of the two of an entry
+
+  // Append puts an entry into the group that was begun last. Both throw std::bad_alloc.
+  void BeginGroup(uint32_t bucket);
+  void Append(std::span<const uint8_t> key, std::span<const uint8_t> value);
+
+  StoredEntry EntryAt(size_t lengthsAt, size_t dataAt) const noexcept;
+  StoredEntry LastOf(const StoredGroup& group) const noexcept;  // there must be one
+  void DropLastOf(StoredGroup& group) const noexcept;
+
+  Bytes lengths;  // 32 bits for the key of each entry, and for its value
+  Bytes data;     // the key of each entry, and its value
+  std::vector<StoredGroup> groups;
+  std::shared_ptr<LoadStatus> status;  // of the load
+  bool keysChecked = false;            // whether they were found to belong to their buckets or not
+
+  uint64_t dataOffset = 0;      // of the first key in the image that was loaded,
+  uint32_t lengthsBetween = 0;  // where this many bytes stand between a value and the next key
+
+  uint32_t waitingGroups = 0;  // these two belong to WaitingGroups
+  std::list<StoredImage>::iterator place;
+};
+
+// For every bucket the groups that wait for it, oldest first. Owns their images, each for as long as
+// one of its groups waits.
+class WaitingGroups {
+ public:
+  static constexpr uint32_t kBucketCount = 1021;
+
+  bool Any() const noexcept { return !images.empty(); }
+
+  // Adds those groups of an image that have entries, and a bucket. Returns the number of entries.
+  // Throws std::bad_alloc, and has then added none.
+  uint32_t Add(StoredImage&& image);
+
+  // The bucket's oldest group, or null.
+  StoredGroup* Oldest(uint32_t bucket) const noexcept;
+
+  // Lets go of the bucket's oldest group, and of its image when no other group needs it.
+  void DropOldest(uint32_t bucket) noexcept;
+
+  void Clear() noexcept;
+
+ private:
+  std::list<StoredImage> images;
+
+  // The newest group of each bucket; behind it, in a ring, stands the oldest.
+  using Queues = std::array<StoredGroup*, kBucketCount>;
+  std::unique_ptr<Queues> newest;
+};
+
+}  // namespace tovali_private
