@@ -1,4 +1,5 @@
 // The road of a key through a dictionary.
+#include <algorithm>
 #include <cstring>
 
 #include "Converters.h"
@@ -16,11 +17,6 @@ void DictionaryTable::MakeDefault() noexcept {
   defaultDictionary = this;
 }
 
-TranslatedString DictionaryTable::Translate(const char* text, const int* selector) {
-  if (text == nullptr || *text == 0) return TranslatedString(KolvaneString());
-  return TranslatedString(Lookup({text, std::strlen(text)}, selector));
-}
-
 namespace {
 
 KolvaneString DecodeDefaultText(std::span<const char> text, const int* selector) {
@@ -36,15 +32,16 @@ KolvaneString DecodeDefaultText(std::span<const char> text, const int* selector)
 
 }  // namespace
 
-KolvaneString DictionaryTable::Lookup(std::span<const char> text, const int* selector) {
-  const auto split = SplitKolvane(text);
-  if (!split) return {};
+TranslatedString DictionaryTable::Translate(const char* text, const int* selector) {
+  if (text == nullptr) return TranslatedString(KolvaneString());
+  const auto split = SplitKolvane<char>({text, std::strlen(text)});
+  if (!split || (split->key.empty() && split->value.empty() && *text == 0)) return TranslatedString(KolvaneString());
   const ByteRunKey key(reinterpret_cast<const uint8_t*>(split->key.data()),
                        static_cast<uint32_t>(split->key.size()), false);
-  if (const DictionaryEntry* own = Find(key)) return own->Value();
+  if (const DictionaryEntry* own = Find(key)) return TranslatedString(own->Value());
   if (defaultDictionary != nullptr && defaultDictionary != this) {
-    if (const DictionaryEntry* fallback = defaultDictionary->Find(key)) return fallback->Value();
+    if (const DictionaryEntry* fallback = defaultDictionary->Find(key)) return TranslatedString(fallback->Value());
   }
-  if (split->value.empty()) return {};
-  return DecodeDefaultText(split->value, selector);
+  if (split->value.empty()) return TranslatedString(KolvaneString());
+  return TranslatedString(DecodeDefaultText(split->value, selector));
 }

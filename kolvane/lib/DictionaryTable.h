@@ -95,7 +95,6 @@ class DictionaryTable {
   bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry, bool canBeFound) noexcept;
   void Unlink(tovali_private::HashItem& item) noexcept;
   void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
-  KolvaneString Lookup(std::span<const char> text, const int* selector);
 
   // The chains are the truth, as far as no group waits for its bucket. The index finds what a walk
   // from a chain's head would find first.

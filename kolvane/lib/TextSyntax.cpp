@@ -1,6 +1,7 @@
 #include "TextSyntax.h"
 
 #include <algorithm>
+#include <string_view>
 
 #include "NamedCharacters.h"
 
@@ -20,6 +21,14 @@ size_t FindQuote(Units line, size_t start) noexcept {
     if (line[i] == kQuote && (i == 0 || line[i - 1] != kBackslash)) return i;
   }
   return line.size();
+}
+
+size_t FindUnit(std::span<const char> text, char unit) noexcept {
+  return std::min(std::string_view(text.data(), text.size()).find(unit), text.size());
+}
+
+size_t FindUnit(Units text, uint16_t unit) noexcept {
+  return static_cast<size_t>(std::find(text.begin(), text.end(), unit) - text.begin());
 }
 
 struct Escape {
@@ -113,8 +122,7 @@ std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept
     if (text.size() < 3 || text[1] != '$' || text[2] != '$') return std::nullopt;
     text = text.subspan(3);
   }
-  const auto equals = std::find(text.begin(), text.end(), Unit{'='});
-  const auto keyLength = static_cast<size_t>(equals - text.begin());
+  const size_t keyLength = FindUnit(text, Unit{'='});
   const size_t valueStart = std::min(keyLength + 1, text.size());
   return SplitText<Unit>{text.first(keyLength), text.subspan(valueStart)};
 }

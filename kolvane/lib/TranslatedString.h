@@ -2,18 +2,16 @@
 #pragma once
 
 #include <cstdint>
-#include <memory>
 
 #include "KolvaneString.h"
 
-// Owns one handle to the translation, whose text it shares with the dictionary and which outlives
-// it. A moved-from TranslatedString may only be destroyed.
+// Holds on to the translation, whose text it shares with the dictionary and which outlives it.
 class TranslatedString {
  public:
-  explicit TranslatedString(const KolvaneString& translation);
+  explicit TranslatedString(const KolvaneString& translation) noexcept : text(translation) {}
 
   // Code units, one more than the translation has: room for a terminator.
-  uint32_t BufferSize() const noexcept { return text->Length() + 1; }
+  uint32_t BufferSize() const noexcept { return text.Length() + 1; }
 
   // Stores as many of the translation's units as fit before a terminating 0 unit. With
   // throwIfShort, a capacity below BufferSize then throws kErrorBufferTooSmall; what was stored
@@ -21,5 +19,5 @@ class TranslatedString {
   void CopyTo(uint16_t* buffer, uint32_t capacity, bool throwIfShort) const;
 
  private:
-  std::unique_ptr<KolvaneString> text;
+  KolvaneString text;
 };
