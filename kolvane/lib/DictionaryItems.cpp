@@ -84,40 +84,39 @@ uint32_t ByteRunKey::Hash(uint32_t n) const noexcept {
   return static_cast<uint32_t>(hash % n);
 }
 
-ByteRunValue* DictionaryEntry::CreateBlock(const ByteRunKey& key, uint64_t valueBytes) {
-  const uint64_t room = uint64_t{sizeof(DictionaryEntry)} + key.Bytes().size();
-  if (room > std::numeric_limits<size_t>::max() / 2) throw std::bad_alloc();
-  return ByteRunValue::Create(valueBytes, static_cast<size_t>(room));
+// The bytes begin at an even place behind the key: they are code units.
+KeyedRun* KeyedRun::Create(Arena& arena, std::span<const uint8_t> key,
+                           std::span<const uint8_t> bytes) {
+  const uint64_t offset = sizeof(KeyedRun) + (uint64_t{key.size()} + 1) / 2 * 2;
+  if (offset > std::numeric_limits<uint32_t>::max()) throw std::bad_alloc();
+  auto* const block = static_cast<uint8_t*>(arena.Allocate(offset + bytes.size()));
+  std::copy(key.begin(), key.end(), block + sizeof(KeyedRun));
+  std::copy(bytes.begin(), bytes.end(), block + offset);
+  return ::new (block) KeyedRun(static_cast<uint32_t>(key.size()),
+                                static_cast<uint32_t>(bytes.size()), static_cast<uint32_t>(offset));
 }
 
-std::unique_ptr<DictionaryEntry> DictionaryEntry::Place(void* room, const ByteRunKey& key,
-                                                        ByteRunValue* bytes) {
-  uint8_t* const keyBytes = static_cast<uint8_t*>(room) + sizeof(DictionaryEntry);
-  const auto length = static_cast<uint32_t>(key.Bytes().size());
-  std::copy_n(key.Bytes().data(), length, keyBytes);
-  return std::unique_ptr<DictionaryEntry>(::new (room) DictionaryEntry(keyBytes, length, bytes));
+DictionaryEntry::DictionaryEntry(KeyedRun& keyedRun) noexcept
+    : ByteRunKey(keyedRun.Key().data(), static_cast<uint32_t>(keyedRun.Key().size()),
+                 Storage::kWithValue),
+      run(keyedRun),
+      value(keyedRun) {
+  run.entry = this;
 }
 
-std::unique_ptr<DictionaryEntry> DictionaryEntry::Create(const ByteRunKey& key,
-                                                         const uint8_t* valueBytes,
-                                                         uint32_t byteCount) {
-  ByteRunValue* const block = CreateBlock(key, byteCount);
-  std::copy_n(valueBytes, byteCount, block->Data());
-  return Place(block->Room(), key, block);
+std::unique_ptr<DictionaryEntry> DictionaryEntry::Create(EntryMemory& memory, const ByteRunKey& key,
+                                                         std::span<const uint8_t> valueBytes) {
+  KeyedRun& run = *KeyedRun::Create(memory.runs, key.Bytes(), valueBytes);
+  const KolvaneString owner(run);
+  void* const place = memory.entries.Allocate(sizeof(DictionaryEntry));
+  return std::unique_ptr<DictionaryEntry>(::new (place) DictionaryEntry(run));
 }
 
-std::unique_ptr<DictionaryEntry> DictionaryEntry::Create(const ByteRunKey& key,
-                                                         const uint16_t* text, uint32_t unitCount) {
-  ByteRunValue* const block = CreateBlock(key, uint64_t{unitCount} * 2);
-  void* const room = block->Room();
-  block->Shorten(Unescape({text, unitCount}, reinterpret_cast<uint16_t*>(block->Data())) * 2);
-  return Place(room, key, block);
-}
-
-// The block outlives the entry that is taken down in it by this one handle at least.
-void DictionaryEntry::operator delete(DictionaryEntry* entry, std::destroying_delete_t) noexcept {
-  const KolvaneString last = entry->value;
-  entry->~DictionaryEntry();
+std::unique_ptr<DictionaryEntry> DictionaryEntry::Create(EntryMemory& memory, const ByteRunKey& key,
+                                                         std::span<const uint16_t> text) {
+  std::vector<uint16_t> decoded;
+  const std::span<const uint16_t> units = Unescape(text, decoded);
+  return Create(memory, key, {reinterpret_cast<const uint8_t*>(units.data()), units.size_bytes()});
 }
 
 uint32_t DictionaryEntry::SerializedSize() const {

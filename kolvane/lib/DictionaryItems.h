@@ -8,6 +8,7 @@
 #include <new>
 #include <span>
 
+#include "Arena.h"
 #include "KolvaneString.h"
 
 namespace tovali_private {
@@ -66,7 +67,7 @@ class ByteRunKey : public HashItem {
   bool Owns() const noexcept { return storage != Storage::kBorrowed; }
 
  protected:
-  enum class Storage : uint8_t { kBorrowed, kAllocated, kWithObject };
+  enum class Storage : uint8_t { kBorrowed, kAllocated, kWithValue };
 
   ByteRunKey(const uint8_t* bytes, uint32_t byteCount, Storage where) noexcept
       : data(byteCount == 0 ? nullptr : bytes), length(byteCount), storage(where) {}
@@ -82,18 +83,48 @@ inline bool ByteRunKey::Equals(const HashItem& other) const noexcept {
   return length == key.length && (length == 0 || std::memcmp(data, key.data, length) == 0);
 }
 
-// A key with its translation; hashes and compares as the key does. Entry, key and value lie in one
-// block of memory, which is the value's: it lasts for as long as anybody shares the value.
+class DictionaryEntry;
+
+// The value of an entry, with the entry's key before it: all that a lookup looks into, side by side.
+class KeyedRun final : public ByteRunValue {
+ public:
+  // Copies both. Throws std::bad_alloc.
+  static KeyedRun* Create(Arena& arena, std::span<const uint8_t> key, std::span<const uint8_t> bytes);
+
+  std::span<const uint8_t> Key() const noexcept { return {KeyBytes(), keyLength}; }
+
+  static void operator delete(void* block) noexcept { Arena::Free(block); }
+
+ private:
+  KeyedRun(uint32_t lengthOfKey, uint32_t byteCount, uint32_t offset) noexcept
+      : ByteRunValue(byteCount, offset), keyLength(lengthOfKey) {}
+  ~KeyedRun() override = default;
+
+  const uint8_t* KeyBytes() const noexcept { return reinterpret_cast<const uint8_t*>(this + 1); }
+
+  uint32_t keyLength;
+
+ public:
+  DictionaryEntry* entry = nullptr;  // while there is one
+};
+
+// What lookups look into, apart from what they do not. It may end before what was made in it.
+struct EntryMemory {
+  Arena runs;
+  Arena entries;
+};
+
+// A key with its translation; hashes and compares as the key does.
 class DictionaryEntry final : public ByteRunKey {
  public:
   // Both copy the key. The first takes the bytes as code units in little-endian order; the second
   // decodes the text, as Unescape does.
-  static std::unique_ptr<DictionaryEntry> Create(const ByteRunKey& key, const uint8_t* valueBytes,
-                                                 uint32_t byteCount);
-  static std::unique_ptr<DictionaryEntry> Create(const ByteRunKey& key, const uint16_t* text,
-                                                 uint32_t unitCount);
+  static std::unique_ptr<DictionaryEntry> Create(EntryMemory& memory, const ByteRunKey& key,
+                                                 std::span<const uint8_t> valueBytes);
+  static std::unique_ptr<DictionaryEntry> Create(EntryMemory& memory, const ByteRunKey& key,
+                                                 std::span<const uint16_t> text);
 
-  static void operator delete(DictionaryEntry* entry, std::destroying_delete_t) noexcept;
+  static void operator delete(void* entry) noexcept { Arena::Free(entry); }
 
   uint32_t SerializedSize() const override;
   uint32_t Write(std::ostream& out, bool binary, const int* selector) const override;
@@ -101,17 +132,16 @@ class DictionaryEntry final : public ByteRunKey {
   uint32_t WriteValue(std::ostream& out, bool binary, const int* selector) const override;
 
   const KolvaneString& Value() const noexcept { return value; }
+  KeyedRun& Run() const noexcept { return run; }
 
   // The entry behind this one in its chain that has the same key and is found once this one is gone,
   // or null. The table keeps it.
   DictionaryEntry* hidden = nullptr;
 
  private:
-  static ByteRunValue* CreateBlock(const ByteRunKey& key, uint64_t valueBytes);
-  static std::unique_ptr<DictionaryEntry> Place(void* room, const ByteRunKey& key, ByteRunValue* bytes);
-  DictionaryEntry(const uint8_t* keyBytes, uint32_t keyLength, ByteRunValue* valueBytes) noexcept
-      : ByteRunKey(keyBytes, keyLength, Storage::kWithObject), value(valueBytes) {}
+  explicit DictionaryEntry(KeyedRun& keyedRun) noexcept;
 
+  KeyedRun& run;
   KolvaneString value;
 };
 

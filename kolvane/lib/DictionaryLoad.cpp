@@ -93,8 +93,7 @@ StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
   std::transform(split->key.begin(), split->key.end(), narrowed.begin(),
                  [](uint16_t unit) { return static_cast<uint8_t>(unit); });
   const ByteRunKey key(narrowed.data(), static_cast<uint32_t>(narrowed.size()), false);
-  auto entry = DictionaryEntry::Create(key, split->value.data(),
-                                       static_cast<uint32_t>(split->value.size()));
+  auto entry = DictionaryEntry::Create(memory, key, split->value);
   index.ReserveOne();
   const bool replaces = Detach(key) != nullptr;
   Insert(std::move(entry));

@@ -1,5 +1,4 @@
 // The road of a key through a dictionary.
-#include <algorithm>
 #include <cstring>
 
 #include "Converters.h"
@@ -7,6 +6,7 @@
 #include "TextSyntax.h"
 
 using tovali_private::ConvertToUnicode;
+using tovali_private::KeyedRun;
 using tovali_private::SplitKolvane;
 using tovali_private::Unescape;
 using tovali_private::UnicodeBuffer;
@@ -33,15 +33,15 @@ KolvaneString DecodeDefaultText(std::span<const char> text, const int* selector)
 }  // namespace
 
 TranslatedString DictionaryTable::Translate(const char* text, const int* selector) {
-  if (text == nullptr) return TranslatedString(KolvaneString());
+  if (text == nullptr || *text == 0) return TranslatedString(KolvaneString());
   const auto split = SplitKolvane<char>({text, std::strlen(text)});
-  if (!split || (split->key.empty() && split->value.empty() && *text == 0)) return TranslatedString(KolvaneString());
+  if (!split) return TranslatedString(KolvaneString());
   const ByteRunKey key(reinterpret_cast<const uint8_t*>(split->key.data()),
                        static_cast<uint32_t>(split->key.size()), false);
-  if (const DictionaryEntry* own = Find(key)) return TranslatedString(own->Value());
-  if (defaultDictionary != nullptr && defaultDictionary != this) {
-    if (const DictionaryEntry* fallback = defaultDictionary->Find(key)) return TranslatedString(fallback->Value());
-  }
+  KeyedRun* found = FindRun(key);
+  const bool fallsBack = defaultDictionary != nullptr && defaultDictionary != this;
+  if (found == nullptr && fallsBack) found = defaultDictionary->FindRun(key);
+  if (found != nullptr) return TranslatedString(KolvaneString(*found));
   if (split->value.empty()) return TranslatedString(KolvaneString());
   return TranslatedString(DecodeDefaultText(split->value, selector));
 }

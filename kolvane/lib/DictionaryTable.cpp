@@ -3,6 +3,7 @@
 #include <utility>
 
 using tovali_private::HashItem;
+using tovali_private::KeyedRun;
 using tovali_private::StoredEntry;
 using tovali_private::StoredGroup;
 using tovali_private::StoredImage;
@@ -24,18 +25,23 @@ DictionaryTable::~DictionaryTable() {
   Clear();
 }
 
-DictionaryTable::DictionaryEntry* DictionaryTable::Find(const ByteRunKey& key) {
+KeyedRun* DictionaryTable::FindRun(const ByteRunKey& key) {
   if (waiting.Any()) Settle(key.Hash(kBucketCount));
-  return index.Find(key);
+  return index.Find(key.Bytes());
+}
+
+DictionaryTable::DictionaryEntry* DictionaryTable::Find(const ByteRunKey& key) {
+  const KeyedRun* const run = FindRun(key);
+  return run != nullptr ? run->entry : nullptr;
 }
 
 std::unique_ptr<DictionaryTable::DictionaryEntry> DictionaryTable::Detach(const ByteRunKey& key) {
   std::unique_ptr<DictionaryEntry> found(Find(key));
   if (found == nullptr) return nullptr;
-  if (DictionaryEntry* const next = std::exchange(found->hidden, nullptr)) {
-    index.Put(*next);
+  if (const DictionaryEntry* const next = std::exchange(found->hidden, nullptr)) {
+    index.Put(next->Run());
   } else {
-    index.Remove(*found);
+    index.Remove(found->Run());
   }
   Unlink(*found);
   return found;
@@ -82,8 +88,7 @@ void DictionaryTable::Settle(uint32_t bucket) {
 void DictionaryTable::SettleLastOf(StoredGroup& group) {
   const StoredImage& image = *group.image;
   const StoredEntry stored = image.LastOf(group);
-  auto entry = DictionaryEntry::Create(stored.Key(), stored.value.data(),
-                                       static_cast<uint32_t>(stored.value.size()));
+  auto entry = DictionaryEntry::Create(memory, stored.Key(), stored.value);
   const bool canBeFound = entry->Hash(kBucketCount) == group.bucket;
   if (canBeFound) index.ReserveOne();
   const bool hides = LinkAtHead(group.bucket, std::move(entry), canBeFound);
@@ -110,6 +115,8 @@ bool DictionaryTable::LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntr
   item->next = buckets[bucket];
   if (item->next != nullptr) item->next->previous = item;
   buckets[bucket] = item;
-  if (canBeFound) item->hidden = index.Put(*item);
-  return item->hidden != nullptr;
+  const KeyedRun* const before = canBeFound ? index.Put(item->Run()) : nullptr;
+  if (before == nullptr) return false;
+  item->hidden = before->entry;
+  return true;
 }

@@ -90,11 +90,14 @@ class DictionaryTable {
   void Clear() noexcept;
 
  private:
+  tovali_private::KeyedRun* FindRun(const ByteRunKey& key);
   void Settle(uint32_t bucket);
   void SettleLastOf(tovali_private::StoredGroup& group);
   bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry, bool canBeFound) noexcept;
   void Unlink(tovali_private::HashItem& item) noexcept;
   void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
+
+  tovali_private::EntryMemory memory;
 
   // The chains are the truth, as far as no group waits for its bucket. The index finds what a walk
   // from a chain's head would find first.

@@ -4,9 +4,14 @@
 #include <xxhash.h>
 
 #include <algorithm>
+#include <cstring>
+#include <limits>
+#include <memory>
 #include <new>
 #include <random>
 #include <utility>
+
+#include "Memory.h"
 
 namespace tovali_private {
 namespace {
@@ -14,7 +19,7 @@ namespace {
 constexpr uint32_t kFirstSlots = 16;
 constexpr uint32_t kMostSlots = 1u << 31;
 
-constexpr uint32_t MostItems(uint32_t slotCount) noexcept {
+constexpr uint32_t MostRuns(uint32_t slotCount) noexcept {
   return slotCount / 4 * 3;
 }
 
@@ -26,31 +31,53 @@ uint64_t ProcessSeed() {
   return seed;
 }
 
+// Whoever has found the run copies its bytes next: they are on their way while keys are compared.
+bool HasKey(const KeyedRun& run, std::span<const uint8_t> key) noexcept {
+  const auto* const start = reinterpret_cast<const char*>(&run);
+  __builtin_prefetch(start + 64);
+  __builtin_prefetch(start + 128);
+  const auto own = run.Key();
+  return own.size() == key.size() && (key.empty() || std::memcmp(own.data(), key.data(), key.size()) == 0);
+}
+
 }  // namespace
+
+void KeyIndex::FreeSlots::operator()(Slot* memory) const noexcept {
+  platform::FreeMemory(memory, size);
+}
+
+KeyIndex::Slots KeyIndex::MakeSlots(size_t count) {
+  if (count > std::numeric_limits<size_t>::max() / sizeof(Slot)) throw std::bad_alloc();
+  const size_t size = count * sizeof(Slot);
+  Slots made(static_cast<Slot*>(platform::AllocateMemory(size)), FreeSlots{size});
+  if (made == nullptr) throw std::bad_alloc();
+  std::uninitialized_value_construct_n(made.get(), count);
+  return made;
+}
 
 KeyIndex::KeyIndex()
     : seed(ProcessSeed()),
       mask(kFirstSlots - 1),
-      most(MostItems(kFirstSlots)),
-      slots(std::make_unique<Slot[]>(kFirstSlots)) {}
+      most(MostRuns(kFirstSlots)),
+      slots(MakeSlots(kFirstSlots)) {}
 
-DictionaryEntry* KeyIndex::Find(const ByteRunKey& key) const noexcept {
-  return slots[SlotFor(HashOf(key), key)].item;
+KeyedRun* KeyIndex::Find(std::span<const uint8_t> key) const noexcept {
+  return slots[SlotFor(HashOf(key), key)].run;
 }
 
-DictionaryEntry* KeyIndex::Put(DictionaryEntry& item) noexcept {
-  const uint32_t hash = HashOf(item);
-  Slot& slot = slots[SlotFor(hash, item)];
-  if (slot.item == nullptr) ++itemCount;
+KeyedRun* KeyIndex::Put(KeyedRun& run) noexcept {
+  const uint32_t hash = HashOf(run.Key());
+  Slot& slot = slots[SlotFor(hash, run.Key())];
+  if (slot.run == nullptr) ++runCount;
   slot.hash = hash;
-  return std::exchange(slot.item, &item);
+  return std::exchange(slot.run, &run);
 }
 
-// Closes the gap: each item behind it, up to the next empty slot, moves into it unless it is to be
+// Closes the gap: each run behind it, up to the next empty slot, moves into it unless it is to be
 // looked for only from behind the gap on.
-void KeyIndex::Remove(const DictionaryEntry& item) noexcept {
-  uint32_t gap = SlotFor(HashOf(item), item);
-  for (uint32_t next = Behind(gap); slots[next].item != nullptr; next = Behind(next)) {
+void KeyIndex::Remove(const KeyedRun& run) noexcept {
+  uint32_t gap = SlotFor(HashOf(run.Key()), run.Key());
+  for (uint32_t next = Behind(gap); slots[next].run != nullptr; next = Behind(next)) {
     const uint32_t fromItsFirst = (next - slots[next].hash) & mask;
     const uint32_t fromGap = (next - gap) & mask;
     if (fromItsFirst < fromGap) continue;
@@ -58,23 +85,22 @@ void KeyIndex::Remove(const DictionaryEntry& item) noexcept {
     gap = next;
   }
   slots[gap] = {};
-  --itemCount;
+  --runCount;
 }
 
 void KeyIndex::Clear() noexcept {
   std::fill_n(slots.get(), size_t{mask} + 1, Slot());
-  itemCount = 0;
+  runCount = 0;
 }
 
-uint32_t KeyIndex::HashOf(const ByteRunKey& key) const noexcept {
-  const auto bytes = key.Bytes();
-  return static_cast<uint32_t>(XXH3_64bits_withSeed(bytes.data(), bytes.size(), seed));
+uint32_t KeyIndex::HashOf(std::span<const uint8_t> key) const noexcept {
+  return static_cast<uint32_t>(XXH3_64bits_withSeed(key.data(), key.size(), seed));
 }
 
-// The slot of the item with this key, or else the empty one where it would go.
-uint32_t KeyIndex::SlotFor(uint32_t hash, const ByteRunKey& key) const noexcept {
+// The slot of the run with this key, or else the empty one where it would go.
+uint32_t KeyIndex::SlotFor(uint32_t hash, std::span<const uint8_t> key) const noexcept {
   uint32_t at = hash & mask;
-  while (slots[at].item != nullptr && !(slots[at].hash == hash && slots[at].item->Equals(key))) {
+  while (slots[at].run != nullptr && !(slots[at].hash == hash && HasKey(*slots[at].run, key))) {
     at = Behind(at);
   }
   return at;
@@ -82,14 +108,14 @@ uint32_t KeyIndex::SlotFor(uint32_t hash, const ByteRunKey& key) const noexcept 
 
 void KeyIndex::Grow() {
   if (mask + 1 == kMostSlots) throw std::bad_alloc();
-  auto old = std::make_unique<Slot[]>((size_t{mask} + 1) * 2);
+  Slots old = MakeSlots((size_t{mask} + 1) * 2);
   old.swap(slots);
   const uint32_t oldMask = std::exchange(mask, mask * 2 + 1);
-  most = MostItems(mask + 1);
+  most = MostRuns(mask + 1);
   for (uint32_t i = 0; i <= oldMask; ++i) {
-    if (old[i].item == nullptr) continue;
+    if (old[i].run == nullptr) continue;
     uint32_t at = old[i].hash & mask;
-    while (slots[at].item != nullptr) at = Behind(at);
+    while (slots[at].run != nullptr) at = Behind(at);
     slots[at] = old[i];
   }
 }

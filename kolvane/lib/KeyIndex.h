@@ -1,34 +1,36 @@
-// Finds an item by its key in constant time, whatever the keys look like.
+// Finds what has a key in constant time, whatever the keys look like.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <memory>
+#include <span>
 
 #include "DictionaryItems.h"
 
 namespace tovali_private {
 
-// A hash table over whole keys that knows at most one item for each. It is seeded anew in every
-// process, so that no image can be made to crowd its slots. It owns no items, and moves none.
+// A hash table over whole keys that knows at most one run for each. Its hash is seeded anew in every
+// process, so that no image can be made to crowd its slots. It owns no runs.
 class KeyIndex {
  public:
   KeyIndex();
   KeyIndex(const KeyIndex&) = delete;
   KeyIndex& operator=(const KeyIndex&) = delete;
 
-  // Makes room for another key; Put needs it. Throws std::bad_alloc, and has then done nothing.
+  // Makes room for one more key; Put needs it. Throws std::bad_alloc, and has then done nothing.
   void ReserveOne() {
-    if (itemCount == most) Grow();
+    if (runCount == most) Grow();
   }
 
-  // The item with this key, or null.
-  DictionaryEntry* Find(const ByteRunKey& key) const noexcept;
+  // The run with this key, or null.
+  KeyedRun* Find(std::span<const uint8_t> key) const noexcept;
 
-  // Makes the item the one that is found by its key. Returns the one that was, or null.
-  DictionaryEntry* Put(DictionaryEntry& item) noexcept;
+  // Makes the run the one that is found by its key. Returns the one that was, or null.
+  KeyedRun* Put(KeyedRun& run) noexcept;
 
-  // Forgets an item that Find finds.
-  void Remove(const DictionaryEntry& item) noexcept;
+  // Forgets a run that Find finds.
+  void Remove(const KeyedRun& run) noexcept;
 
   void Clear() noexcept;
 
@@ -36,19 +38,26 @@ class KeyIndex {
   // Slots are looked through from the one that the hash names onwards, up to an empty one.
   struct Slot {
     uint32_t hash = 0;
-    DictionaryEntry* item = nullptr;
+    KeyedRun* run = nullptr;
   };
 
+  struct FreeSlots {
+    void operator()(Slot* slots) const noexcept;
+    size_t size;
+  };
+  using Slots = std::unique_ptr<Slot[], FreeSlots>;
+
+  static Slots MakeSlots(size_t count);
+  uint32_t HashOf(std::span<const uint8_t> key) const noexcept;
+  uint32_t SlotFor(uint32_t hash, std::span<const uint8_t> key) const noexcept;
   uint32_t Behind(uint32_t slot) const noexcept { return (slot + 1) & mask; }
-  uint32_t HashOf(const ByteRunKey& key) const noexcept;
-  uint32_t SlotFor(uint32_t hash, const ByteRunKey& key) const noexcept;
   void Grow();
 
   uint64_t seed;
   uint32_t mask;  // one less than the number of slots, which is a power of two
-  uint32_t most;  // items, for lookups to stay short
-  uint32_t itemCount = 0;
-  std::unique_ptr<Slot[]> slots;
+  uint32_t most;  // runs, for lookups to stay short
+  uint32_t runCount = 0;
+  Slots slots;
 };
 
 }  // namespace tovali_private

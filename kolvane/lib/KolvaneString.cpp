@@ -2,43 +2,36 @@
 
 #include <algorithm>
 #include <limits>
+#include <new>
 
 using tovali_private::ByteRunValue;
 
 namespace tovali_private {
 
-// What the bytes take for the room behind them to be aligned.
-uint64_t ByteRunValue::AlignedSize(uint64_t byteCount) noexcept {
-  constexpr uint64_t kAlignment = alignof(void*);
-  return (sizeof(ByteRunValue) + byteCount + kAlignment - 1) / kAlignment * kAlignment - sizeof(ByteRunValue);
-}
-
-ByteRunValue* ByteRunValue::Create(uint64_t byteCount, size_t room) {
-  const uint64_t size = sizeof(ByteRunValue) + AlignedSize(byteCount) + room;
-  if (byteCount > std::numeric_limits<uint32_t>::max() || size > std::numeric_limits<size_t>::max()) {
-    throw std::bad_alloc();
-  }
+ByteRunValue* ByteRunValue::Create(const uint8_t* bytes, uint32_t byteCount) {
+  const uint64_t size = uint64_t{sizeof(ByteRunValue)} + byteCount;
+  if (size > std::numeric_limits<size_t>::max()) throw std::bad_alloc();
   void* const block = ::operator new(static_cast<size_t>(size));
-  return ::new (block) ByteRunValue(static_cast<uint32_t>(byteCount));
+  std::copy_n(bytes, byteCount, static_cast<uint8_t*>(block) + sizeof(ByteRunValue));
+  return ::new (block) ByteRunValue(byteCount, sizeof(ByteRunValue));
 }
 
 }  // namespace tovali_private
 
-KolvaneString::KolvaneString(const uint16_t* units, uint32_t unitCount)
-    : KolvaneString(ByteRunValue::Create(uint64_t{unitCount} * 2)) {
-  std::copy_n(units, unitCount, reinterpret_cast<uint16_t*>(value->Data()));
+namespace {
+
+uint32_t ByteCount(uint32_t unitCount) {
+  if (unitCount > std::numeric_limits<uint32_t>::max() / 2) throw std::bad_alloc();
+  return unitCount * 2;
 }
+
+}  // namespace
+
+KolvaneString::KolvaneString(const uint16_t* units, uint32_t unitCount)
+    : KolvaneString(reinterpret_cast<const uint8_t*>(units), ByteCount(unitCount)) {}
 
 KolvaneString::KolvaneString(const uint8_t* bytes, uint32_t byteCount)
-    : KolvaneString(ByteRunValue::Create(byteCount)) {
-  std::copy_n(bytes, byteCount, value->Data());
-}
-
-KolvaneString::KolvaneString(ByteRunValue* bytes) noexcept : value(bytes) {
-  value->AddRef();
-}
-
-KolvaneString::KolvaneString(const KolvaneString& other) noexcept : KolvaneString(other.value) {}
+    : KolvaneString(*ByteRunValue::Create(bytes, byteCount)) {}
 
 KolvaneString& KolvaneString::operator=(const KolvaneString& other) noexcept {
   if (value == other.value) return *this;
@@ -46,10 +39,6 @@ KolvaneString& KolvaneString::operator=(const KolvaneString& other) noexcept {
   value = other.value;
   value->AddRef();
   return *this;
-}
-
-KolvaneString::~KolvaneString() {
-  value->Release();
 }
 
 const KolvaneString& KolvaneString::Empty() {

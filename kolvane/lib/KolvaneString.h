@@ -28,33 +28,29 @@ class RefCountObj {
   uint32_t count = 0;
 };
 
-// A run of bytes, in one block of memory with the object. The block can have room for something else
-// that is to live as long as the bytes.
-class ByteRunValue final : public RefCountObj {
+// A run of bytes, in one block of memory with the object.
+class ByteRunValue : public RefCountObj {
  public:
-  // The bytes are to be written, then shared. Throws std::bad_alloc.
-  static ByteRunValue* Create(uint64_t byteCount, size_t room = 0);
-
-  // Gives up the bytes behind the first `byteCount`; to be done before the run is shared.
-  void Shorten(uint32_t byteCount) noexcept { length = byteCount; }
+  // Copies the bytes. Throws std::bad_alloc.
+  static ByteRunValue* Create(const uint8_t* bytes, uint32_t byteCount);
 
   // Null when there are none.
-  uint8_t* Data() noexcept { return length == 0 ? nullptr : Storage(); }
+  const uint8_t* Data() const noexcept { return length == 0 ? nullptr : Bytes(); }
   uint32_t Length() const noexcept { return length; }
-
-  // Aligned for pointers; to be asked for before the run is shortened.
-  void* Room() noexcept { return Storage() + AlignedSize(length); }
 
   static void operator delete(void* block) noexcept { ::operator delete(block); }
 
- private:
-  explicit ByteRunValue(uint32_t byteCount) noexcept : length(byteCount) {}
+ protected:
+  // The bytes stand `offset` bytes behind the object's start.
+  ByteRunValue(uint32_t byteCount, uint32_t offset) noexcept
+      : length(byteCount), bytesOffset(offset) {}
   ~ByteRunValue() override = default;
 
-  uint8_t* Storage() noexcept { return reinterpret_cast<uint8_t*>(this + 1); }
-  static uint64_t AlignedSize(uint64_t byteCount) noexcept;
+  const uint8_t* Bytes() const noexcept { return reinterpret_cast<const uint8_t*>(this) + bytesOffset; }
 
+ private:
   uint32_t length;
+  uint32_t bytesOffset;
 };
 
 }  // namespace tovali_private
@@ -72,13 +68,15 @@ class KolvaneString {
   KolvaneString(const uint8_t* bytes, uint32_t byteCount);
 
   // Shares the bytes.
-  explicit KolvaneString(tovali_private::ByteRunValue* bytes) noexcept;
+  explicit KolvaneString(tovali_private::ByteRunValue& bytes) noexcept : value(&bytes) {
+    value->AddRef();
+  }
 
-  KolvaneString(const KolvaneString& other) noexcept;
+  KolvaneString(const KolvaneString& other) noexcept : KolvaneString(*other.value) {}
   KolvaneString& operator=(const KolvaneString& other) noexcept;
-  ~KolvaneString();
+  ~KolvaneString() { value->Release(); }
 
-  const uint16_t* Data() const noexcept { return reinterpret_cast<uint16_t*>(value->Data()); }
+  const uint16_t* Data() const noexcept { return reinterpret_cast<const uint16_t*>(value->Data()); }
   uint32_t Length() const noexcept { return value->Length() / 2; }
   uint32_t ByteLength() const noexcept { return value->Length(); }
   std::span<const uint16_t> Units() const noexcept { return {Data(), Length()}; }

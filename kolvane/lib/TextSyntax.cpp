@@ -4,6 +4,7 @@
 #include <string_view>
 
 #include "NamedCharacters.h"
+#include "Scan.h"
 
 namespace tovali_private {
 namespace {
@@ -14,21 +15,21 @@ constexpr uint16_t kQuote = '"';
 constexpr uint16_t kCaret = '^';
 constexpr uint16_t kBackslash = '\\';
 
-// The place of the first double quote from `start` on that no backslash immediately precedes, or
-// the line's length. Only the one unit before a quote counts.
-size_t FindQuote(Units line, size_t start) noexcept {
-  for (size_t i = start; i < line.size(); ++i) {
-    if (line[i] == kQuote && (i == 0 || line[i - 1] != kBackslash)) return i;
-  }
-  return line.size();
-}
-
 size_t FindUnit(std::span<const char> text, char unit) noexcept {
   return std::min(std::string_view(text.data(), text.size()).find(unit), text.size());
 }
 
 size_t FindUnit(Units text, uint16_t unit) noexcept {
-  return static_cast<size_t>(std::find(text.begin(), text.end(), unit) - text.begin());
+  return RunBefore(text, [unit](uint16_t each) { return each == unit; });
+}
+
+// The place of the first double quote from `start` on that no backslash immediately precedes, or
+// the line's length. Only the one unit before a quote counts.
+size_t FindQuote(Units line, size_t start) noexcept {
+  for (size_t at = start;; ++at) {
+    at += FindUnit(line.subspan(at), kQuote);
+    if (at == line.size() || at == 0 || line[at - 1] != kBackslash) return at;
+  }
 }
 
 struct Escape {
@@ -130,16 +131,19 @@ std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept
 template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noexcept;
 template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
-uint32_t Unescape(Units text, uint16_t* decoded) noexcept {
-  uint16_t* const end = ExpandNamedCharacters(decoded, DecodeEscapes(text, decoded));
-  return static_cast<uint32_t>(end - decoded);
+Units Unescape(Units text, std::vector<uint16_t>& decoded) {
+  const size_t plain = RunBefore(text, [](uint16_t unit) { return IsEscapeCharacter(unit) || unit == '#'; });
+  if (plain == text.size()) return text;
+  decoded.resize(text.size());
+  uint16_t* const end = ExpandNamedCharacters(decoded.data(), DecodeEscapes(text, decoded.data()));
+  decoded.resize(static_cast<size_t>(end - decoded.data()));
+  return decoded;
 }
 
 KolvaneString Unescape(Units text) {
-  auto* const bytes = ByteRunValue::Create(uint64_t{2} * text.size());
-  KolvaneString value(bytes);
-  bytes->Shorten(2 * Unescape(text, reinterpret_cast<uint16_t*>(bytes->Data())));
-  return value;
+  std::vector<uint16_t> decoded;
+  const Units units = Unescape(text, decoded);
+  return {units.data(), static_cast<uint32_t>(units.size())};
 }
 
 std::optional<std::vector<uint16_t>> EscapeForText(Units text) {

@@ -35,11 +35,10 @@ extern template std::optional<SplitText<char>> SplitKolvane(std::span<const char
 extern template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
 // Decodes caret and backslash escapes, then named characters such as `#{nbsp}`; what it does not
-// know stays as it is. The result is never longer than the text. The second form stores it in
-// `decoded`, which has room for as many units as the text has, and returns its length; it may be
-// the text's own place.
+// know stays as it is. The result is never longer than the text. The second form gives the text back
+// where there is nothing to decode, and otherwise stores in `decoded` what it gives.
 KolvaneString Unescape(std::span<const uint16_t> text);
-uint32_t Unescape(std::span<const uint16_t> text, uint16_t* decoded) noexcept;
+std::span<const uint16_t> Unescape(std::span<const uint16_t> text, std::vector<uint16_t>& decoded);
 
 // Writes line ends and double quotes as backslash escapes; nothing is returned when the text has
 // none of them. Unescape undoes these escapes, but it also decodes what the text itself held of

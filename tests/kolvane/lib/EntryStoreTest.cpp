@@ -18,9 +18,11 @@ ByteRunKey Key(const std::string& key, bool copy = true) {
   return {reinterpret_cast<const uint8_t*>(key.data()), static_cast<uint32_t>(key.size()), copy};
 }
 
+EntryMemory gMemory;
+
 std::unique_ptr<DictionaryEntry> Entry(const std::string& key, const std::u16string& value) {
   const std::string bytes = Bytes(value);
-  return DictionaryEntry::Create(Key(key), reinterpret_cast<const uint8_t*>(bytes.data()), static_cast<uint32_t>(bytes.size()));
+  return DictionaryEntry::Create(gMemory, Key(key), {reinterpret_cast<const uint8_t*>(bytes.data()), bytes.size()});
 }
 
 class Mortal : public RefCountObj {
@@ -116,7 +118,7 @@ TEST(DictionaryEntry, WritesItself) {
   EXPECT_EQ(Entry("/abc", u"xyz")->SerializedSize(), 10u);
   std::ostringstream odd;
   const uint8_t bytes[] = {'H', 0, 'i'};
-  DictionaryEntry::Create(Key("/a"), bytes, 3)->Write(odd, true, nullptr);
+  DictionaryEntry::Create(gMemory, Key("/a"), bytes)->Write(odd, true, nullptr);
   EXPECT_EQ(odd.str(), std::string("/aH\0i", 5));
 }
 

@@ -1,0 +1,71 @@
+#include "Arena.h"
+
+#include <algorithm>
+#include <limits>
+#include <new>
+#include <utility>
+
+#include "Memory.h"
+
+namespace tovali_private {
+
+struct Arena::Chunk {
+  void Release() noexcept {
+    if (--holders == 0) platform::FreeMemory(this, size);
+  }
+
+  size_t size;
+  size_t holders;  // what was handed out, and the arena while this is its current chunk
+};
+
+// Stands before all that is handed out.
+struct Arena::Header {
+  Chunk* chunk;
+};
+
+Arena::Chunk* Arena::CreateChunk(uint64_t size) {
+  if (size > std::numeric_limits<size_t>::max()) throw std::bad_alloc();
+  void* const memory = platform::AllocateMemory(static_cast<size_t>(size));
+  if (memory == nullptr) throw std::bad_alloc();
+  return ::new (memory) Chunk{static_cast<size_t>(size), 0};
+}
+
+void* Arena::HandOut(Chunk& chunk, uint8_t* place) noexcept {
+  ++chunk.holders;
+  return ::new (place) Header{&chunk} + 1;
+}
+
+void* Arena::Allocate(uint64_t size) {
+  constexpr uint64_t kAlignment = alignof(Header);
+  const uint64_t needed = sizeof(Header) + (size + kAlignment - 1) / kAlignment * kAlignment;
+  if (needed > left) {
+    const bool isLarge = needed > nextChunkSize / 4;
+    if (isLarge) {
+      Chunk* const own = CreateChunk(sizeof(Chunk) + needed);
+      return HandOut(*own, reinterpret_cast<uint8_t*>(own + 1));
+    }
+    BeginChunk();
+  }
+  left -= static_cast<size_t>(needed);
+  return HandOut(*current, std::exchange(next, next + needed));
+}
+
+void Arena::BeginChunk() {
+  Chunk* const fresh = CreateChunk(nextChunkSize);
+  Retire();
+  current = fresh;
+  current->holders = 1;
+  next = reinterpret_cast<uint8_t*>(current + 1);
+  left = nextChunkSize - sizeof(Chunk);
+  nextChunkSize = std::min(nextChunkSize * 2, platform::kLargeMemory);
+}
+
+void Arena::Free(void* memory) noexcept {
+  (static_cast<Header*>(memory) - 1)->chunk->Release();
+}
+
+void Arena::Retire() noexcept {
+  if (current != nullptr) current->Release();
+}
+
+}  // namespace tovali_private

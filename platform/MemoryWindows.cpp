@@ -1,0 +1,16 @@
+#include <new>
+
+#include "Memory.h"
+
+namespace platform {
+
+// Large pages need a privilege there that hosts do not have.
+void* AllocateMemory(size_t size) noexcept {
+  return ::operator new(size, std::nothrow);
+}
+
+void FreeMemory(void* memory, size_t) noexcept {
+  ::operator delete(memory);
+}
+
+}  // namespace platform
