@@ -1,6 +1,7 @@
 // The conversion layer for systems without code-page functions of their own. A text is walked once:
 // runs of ASCII go to a sink as they are, and a codec takes each other character. One sink counts,
 // the other writes.
+#include <array>
 #include <cstddef>
 #include <cstring>
 #include <limits>
@@ -21,6 +22,13 @@ struct Counter {
     return true;
   }
 
+  // Puts for each byte the unit that stands for it.
+  template <class Units>
+  bool PutAll(const char*, size_t count, const Units&) noexcept {
+    total += count;
+    return true;
+  }
+
   uint64_t total = 0;
 };
 
@@ -31,6 +39,14 @@ struct Writer {
     if (count > capacity - total) return false;
     for (size_t i = 0; i < count; ++i) out[total + i] = static_cast<Out>(from[i]);
     total += count;
+    return true;
+  }
+
+  template <class Units>
+  bool PutAll(const char* bytes, size_t count, const Units& units) noexcept {
+    if (count > capacity) return false;
+    for (size_t i = 0; i < count; ++i) out[i] = units[static_cast<uint8_t>(bytes[i])];
+    total = count;
     return true;
   }
 
@@ -188,11 +204,17 @@ constexpr uint16_t kWindows1252[32] = {
     0x2039, 0x0152, 0x008D, 0x017D, 0x008F, 0x0090, 0x2018, 0x2019, 0x201C, 0x201D, 0x2022,
     0x2013, 0x2014, 0x02DC, 0x2122, 0x0161, 0x203A, 0x0153, 0x009D, 0x017E, 0x0178};
 
-constexpr auto kFromWindows1252 = [](const char* text, size_t, auto& sink) -> size_t {
-  const auto byte = static_cast<uint8_t>(text[0]);
-  const uint16_t unit = byte < 0xA0 ? kWindows1252[byte - 0x80] : byte;
-  return sink.Put(&unit, 1) ? 1 : 0;
-};
+constexpr uint16_t FromWindows1252(uint8_t byte) noexcept {
+  return byte >= 0x80 && byte < 0xA0 ? kWindows1252[byte - 0x80] : byte;
+}
+
+constexpr auto kUnitsOfWindows1252 = [] {
+  std::array<uint16_t, 256> units{};
+  for (size_t byte = 0; byte < units.size(); ++byte) {
+    units[byte] = FromWindows1252(static_cast<uint8_t>(byte));
+  }
+  return units;
+}();
 
 char Windows1252Byte(uint16_t unit) noexcept {
   if (unit >= 0xA0 && unit <= 0xFF) return static_cast<char>(unit);
@@ -210,7 +232,7 @@ constexpr auto kToWindows1252 = [](const uint16_t* units, size_t, auto& sink) ->
 template <class Sink>
 bool Convert(uint32_t codePage, const char* text, size_t count, Sink& sink) noexcept {
   return codePage == kCodePageUTF8 ? Walk(text, count, sink, kFromUTF8)
-                                   : Walk(text, count, sink, kFromWindows1252);
+                                   : sink.PutAll(text, count, kUnitsOfWindows1252);
 }
 
 template <class Sink>

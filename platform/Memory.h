@@ -8,8 +8,7 @@
 
 namespace platform {
 
-// What is at least this large is worth asking for on its own.
-inline constexpr size_t kLargeMemory = size_t{1} << 21;
+inline constexpr size_t kHugePage = size_t{1} << 21;
 
 // Aligned for any object. Null when there is none.
 void* AllocateMemory(size_t size) noexcept;

@@ -8,20 +8,23 @@
 namespace platform {
 namespace {
 
-size_t WholePages(size_t size) noexcept {
-  return (size + kLargeMemory - 1) / kLargeMemory * kLargeMemory;
+constexpr bool IsLarge(size_t size) noexcept {
+  return size >= kHugePage / 2;
 }
 
-// Huge pages are as large as kLargeMemory, and begin at its multiples.
+constexpr size_t WholePages(size_t size) noexcept {
+  return (size + kHugePage - 1) / kHugePage * kHugePage;
+}
+
+// They begin at multiples of their size.
 void* MapHugePages(size_t size) noexcept {
-  const size_t reserved = size + kLargeMemory;
   void* const mapped =
-      mmap(nullptr, reserved, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+      mmap(nullptr, size + kHugePage, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
   if (mapped == MAP_FAILED) return nullptr;
   auto* const start = static_cast<char*>(mapped);
-  const size_t before = -reinterpret_cast<uintptr_t>(start) % kLargeMemory;
+  const size_t before = -reinterpret_cast<uintptr_t>(start) % kHugePage;
   if (before != 0) munmap(start, before);
-  munmap(start + before + size, kLargeMemory - before);
+  munmap(start + before + size, kHugePage - before);
 #ifdef MADV_HUGEPAGE
   madvise(start + before, size, MADV_HUGEPAGE);
 #endif
@@ -31,13 +34,12 @@ void* MapHugePages(size_t size) noexcept {
 }  // namespace
 
 void* AllocateMemory(size_t size) noexcept {
-  if (size < kLargeMemory) return ::operator new(size, std::nothrow);
-  if (size > SIZE_MAX - 2 * kLargeMemory) return nullptr;
-  return MapHugePages(WholePages(size));
+  if (!IsLarge(size)) return ::operator new(size, std::nothrow);
+  return size <= SIZE_MAX - 2 * kHugePage ? MapHugePages(WholePages(size)) : nullptr;
 }
 
 void FreeMemory(void* memory, size_t size) noexcept {
-  if (size < kLargeMemory) {
+  if (!IsLarge(size)) {
     ::operator delete(memory);
   } else if (memory != nullptr) {
     munmap(memory, WholePages(size));

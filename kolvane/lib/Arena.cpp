@@ -57,7 +57,7 @@ void Arena::BeginChunk() {
   current->holders = 1;
   next = reinterpret_cast<uint8_t*>(current + 1);
   left = nextChunkSize - sizeof(Chunk);
-  nextChunkSize = std::min(nextChunkSize * 2, platform::kLargeMemory);
+  nextChunkSize = std::min(nextChunkSize * 2, platform::kHugePage);
 }
 
 void Arena::Free(void* memory) noexcept {

@@ -1,13 +1,18 @@
 // The road of a key through a dictionary.
+#include <algorithm>
+#include <boost/container/small_vector.hpp>
 #include <cstring>
 
 #include "Converters.h"
 #include "DictionaryTable.h"
+#include "Scan.h"
 #include "TextSyntax.h"
 
 using tovali_private::ConvertToUnicode;
 using tovali_private::KeyedRun;
+using tovali_private::RunBefore;
 using tovali_private::SplitKolvane;
+using tovali_private::StartsEscape;
 using tovali_private::Unescape;
 using tovali_private::UnicodeBuffer;
 
@@ -19,15 +24,26 @@ void DictionaryTable::MakeDefault() noexcept {
 
 namespace {
 
+// Whether it is its own translation in every code page, and with nothing to decode.
+bool IsPlain(std::span<const char> text) noexcept {
+  const auto isSpecial = [](char byte) {
+    const auto value = static_cast<uint8_t>(byte);
+    return value >= 0x80 || StartsEscape(value);
+  };
+  return RunBefore(text, isSpecial) == text.size();
+}
+
 KolvaneString DecodeDefaultText(std::span<const char> text, const int* selector) {
-  UnicodeBuffer units;
-  if (selector != nullptr && *selector != 0) {
+  const bool isMultibyte = selector != nullptr && *selector != 0;
+  if (isMultibyte && !IsPlain(text)) {
+    UnicodeBuffer units;
     ConvertToUnicode(text.data(), text.size(), units, selector);
-  } else {
-    units.Reserve(text.size());
-    for (const char byte : text) units.Append(static_cast<uint8_t>(byte));
+    return Unescape({units.Data(), units.Length()});
   }
-  return Unescape({units.Data(), units.Length()});
+  boost::container::small_vector<uint16_t, 256> units(text.size(), boost::container::default_init);
+  std::transform(text.begin(), text.end(), units.begin(),
+                 [](char byte) { return static_cast<uint8_t>(byte); });
+  return Unescape(units);
 }
 
 }  // namespace

@@ -1,9 +1,13 @@
 #include "DictionaryReader.h"
 
+#include <algorithm>
+#include <cstring>
 #include <istream>
 
 #include "Converters.h"
+#include "HeldBytes.h"
 #include "LittleEndian.h"
+#include "Scan.h"
 
 namespace tovali_private {
 namespace {
@@ -13,6 +17,10 @@ constexpr uint16_t kSwappedByteOrderMark = 0xFFFE;
 
 constexpr bool EndsLine(uint16_t unit) noexcept {
   return unit == 0x000A || unit == 0x000D || unit == 0x2028 || unit == 0x2029;
+}
+
+constexpr uint16_t Swapped(uint16_t unit) noexcept {
+  return static_cast<uint16_t>(unit << 8 | unit >> 8);
 }
 
 constexpr bool EndsLine(uint8_t byte) noexcept {
@@ -38,10 +46,28 @@ std::unique_ptr<DictionaryReader> DictionaryReader::Create(std::istream* stream)
   return std::make_unique<MultibyteReader>(stream);
 }
 
+std::span<const uint8_t> DictionaryReader::Held() {
+  return stream != nullptr ? HeldBytes(*stream) : std::span<const uint8_t>();
+}
+
+void DictionaryReader::Skip(size_t count) noexcept {
+  if (count != 0) SkipHeld(*stream, count);
+}
+
 void DictionaryReader::ReadStreamBytes(std::istream* stream, uint8_t* bytes, uint32_t& count) {
   uint32_t stored = 0;
-  for (char byte = 0; stream != nullptr && stored < count && stream->get(byte);) {
-    bytes[stored++] = static_cast<uint8_t>(byte);
+  while (stream != nullptr && stored < count) {
+    const auto held = HeldBytes(*stream);
+    const size_t taken = std::min<size_t>(held.size(), count - stored);
+    if (taken == 0) {
+      char byte = 0;
+      if (!stream->get(byte)) break;
+      bytes[stored++] = static_cast<uint8_t>(byte);
+      continue;
+    }
+    std::copy_n(held.data(), taken, bytes + stored);
+    SkipHeld(*stream, taken);
+    stored += static_cast<uint32_t>(taken);
   }
   count = stored;
 }
@@ -49,6 +75,7 @@ void DictionaryReader::ReadStreamBytes(std::istream* stream, uint8_t* bytes, uin
 const uint16_t* UnicodeReader::GetNextLine() {
   line.Clear();
   for (uint16_t unit = 0;;) {
+    TakeHeldUnits();
     if (ReadChar(unit)) {
       if (line.Length() == 0) return nullptr;
       break;
@@ -58,6 +85,22 @@ const uint16_t* UnicodeReader::GetNextLine() {
   }
   line.Append(0);
   return line.Data();
+}
+
+// Takes the units up to the first that ends the line or the input.
+void UnicodeReader::TakeHeldUnits() {
+  constexpr size_t kBlock = 64;
+  const bool isSwapped = Encoding() == TextEncoding::kUTF16BE;
+  for (;;) {
+    const auto held = Held();
+    const std::span<uint16_t> block = line.Extend(std::min(held.size() / 2, kBlock));
+    std::memcpy(block.data(), held.data(), block.size_bytes());
+    if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), Swapped);
+    const size_t run = RunBefore(std::span<const uint16_t>(block), [](uint16_t unit) { return unit == 0 || EndsLine(unit); });
+    line.SetLength(line.Length() - static_cast<uint32_t>(block.size() - run));
+    Skip(2 * run);
+    if (run < kBlock) return;
+  }
 }
 
 bool UnicodeReader::ReadChar(uint16_t& unit) {
@@ -70,13 +113,14 @@ bool UnicodeReader::ReadChar(uint16_t& unit) {
 
 bool ByteSwapUnicodeReader::ReadChar(uint16_t& unit) {
   const bool ended = UnicodeReader::ReadChar(unit);
-  unit = static_cast<uint16_t>(unit << 8 | unit >> 8);
+  unit = Swapped(unit);
   return ended;
 }
 
 const uint16_t* MultibyteReader::GetNextLine() {
   bytes.Clear();
   for (;;) {
+    TakeHeldBytes();
     uint8_t byte = 0;
     uint32_t count = 1;
     ReadBytes(&byte, count);
@@ -90,6 +134,15 @@ const uint16_t* MultibyteReader::GetNextLine() {
   ConvertToUnicode(reinterpret_cast<const char*>(bytes.Data()), bytes.Length(), line);
   line.Append(0);
   return line.Data();
+}
+
+// Takes the bytes up to the first that ends the line or the input.
+void MultibyteReader::TakeHeldBytes() {
+  const auto held = Held();
+  const size_t run = RunBefore(held, [](uint8_t byte) { return byte == 0 || EndsLine(byte); });
+  const std::span<uint8_t> block = bytes.Extend(run);
+  std::copy_n(held.data(), run, block.data());
+  Skip(run);
 }
 
 }  // namespace tovali_private

@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <iosfwd>
 #include <memory>
+#include <span>
 
 #include "GrowableBuffer.h"
 #include "LoadStatus.h"
@@ -36,10 +37,13 @@ class DictionaryReader {
   DictionaryReader(std::istream* input, TextEncoding inputEncoding)
       : stream(input), encoding(inputEncoding) {}
 
-  // Reads up to `count` bytes, one at a time, and sets `count` to those that came before the stream
-  // ended or failed.
+  // Reads up to `count` bytes and sets `count` to those that came before the stream ended or failed.
   void ReadBytes(uint8_t* bytes, uint32_t& count) { ReadStreamBytes(stream, bytes, count); }
   static void ReadStreamBytes(std::istream* stream, uint8_t* bytes, uint32_t& count);
+
+  // See HeldBytes.h.
+  std::span<const uint8_t> Held();
+  void Skip(size_t count) noexcept;
 
   UnicodeBuffer line;
 
@@ -61,6 +65,9 @@ class UnicodeReader : public DictionaryReader {
 
  protected:
   using DictionaryReader::DictionaryReader;
+
+ private:
+  void TakeHeldUnits();
 };
 
 // UTF-16 in big-endian order.
@@ -81,6 +88,8 @@ class MultibyteReader final : public DictionaryReader {
   const uint16_t* GetNextLine() override;
 
  private:
+  void TakeHeldBytes();
+
   ByteBuffer bytes;
 };
 

@@ -7,6 +7,7 @@
 #include <limits>
 #include <memory>
 #include <new>
+#include <span>
 
 namespace tovali_private {
 
@@ -24,6 +25,14 @@ class GrowableBuffer {
   void Append(Element element) {
     if (length == capacity) Grow(size_t{length} + 1);
     storage[length++] = element;
+  }
+
+  // Appends elements that hold nothing yet, and returns their place.
+  std::span<Element> Extend(size_t count) {
+    Reserve(length + count);
+    const std::span<Element> place(storage.get() + length, count);
+    length += static_cast<uint32_t>(count);
+    return place;
   }
 
   // Makes room for `count` elements in all, keeping those it holds.

@@ -61,6 +61,10 @@ KeyIndex::KeyIndex()
       most(MostRuns(kFirstSlots)),
       slots(MakeSlots(kFirstSlots)) {}
 
+void KeyIndex::Prepare(std::span<const uint8_t> key) const noexcept {
+  __builtin_prefetch(&slots[HashOf(key) & mask]);
+}
+
 KeyedRun* KeyIndex::Find(std::span<const uint8_t> key) const noexcept {
   return slots[SlotFor(HashOf(key), key)].run;
 }

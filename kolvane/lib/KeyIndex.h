@@ -23,6 +23,9 @@ class KeyIndex {
     if (runCount == most) Grow();
   }
 
+  // Has what the key's operations need fetched meanwhile.
+  void Prepare(std::span<const uint8_t> key) const noexcept;
+
   // The run with this key, or null.
   KeyedRun* Find(std::span<const uint8_t> key) const noexcept;
 

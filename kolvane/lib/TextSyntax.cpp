@@ -132,8 +132,7 @@ template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noex
 template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
 Units Unescape(Units text, std::vector<uint16_t>& decoded) {
-  const size_t plain = RunBefore(text, [](uint16_t unit) { return IsEscapeCharacter(unit) || unit == '#'; });
-  if (plain == text.size()) return text;
+  if (RunBefore(text, StartsEscape) == text.size()) return text;
   decoded.resize(text.size());
   uint16_t* const end = ExpandNamedCharacters(decoded.data(), DecodeEscapes(text, decoded.data()));
   decoded.resize(static_cast<size_t>(end - decoded.data()));
