@@ -6,9 +6,6 @@
 namespace varnel_kernel {
 namespace {
 
-constexpr uint32_t kIndexBits = 22;
-constexpr uint32_t kIndexMask = (1u << kIndexBits) - 1;
-constexpr uint32_t kGenerationMask = (1u << (32 - kIndexBits)) - 1;
 constexpr uint32_t kRestingSlots = 1024;
 
 }  // namespace
@@ -29,6 +26,7 @@ std::unique_ptr<Item> HandleTable::RemoveItem(uint32_t handle, Kind kind) noexce
   const uint32_t index = handle & kIndexMask;
   --live[static_cast<size_t>(kind)];
   slot->kind = Kind::kNone;
+  constexpr uint32_t kGenerationMask = (1u << (32 - kIndexBits)) - 1;
   slot->generation = (slot->generation + 1) & kGenerationMask;
   slot->nextFree = 0;
   (freeCount == 0 ? firstFree : slots[lastFree].nextFree) = index;
@@ -42,17 +40,6 @@ void HandleTable::Clear() noexcept {
     const Kind kind = slots[index].kind;
     if (kind != Kind::kNone) RemoveItem(HandleOf(index), kind);
   }
-}
-
-const HandleTable::Slot* HandleTable::SlotOf(uint32_t handle, Kind kind) const noexcept {
-  const uint32_t index = handle & kIndexMask;
-  if (index >= slots.size()) return nullptr;
-  const Slot& slot = slots[index];
-  return slot.kind == kind && slot.generation == handle >> kIndexBits ? &slot : nullptr;
-}
-
-HandleTable::Slot* HandleTable::SlotOf(uint32_t handle, Kind kind) noexcept {
-  return const_cast<Slot*>(std::as_const(*this).SlotOf(handle, kind));
 }
 
 uint32_t HandleTable::HandleOf(uint32_t index) const noexcept {

@@ -4,6 +4,7 @@
 #include <array>
 #include <cstdint>
 #include <memory>
+#include <utility>
 #include <vector>
 
 namespace varnel_kernel {
@@ -90,10 +91,23 @@ class HandleTable {
     Kind kind = Kind::kNone;
   };
 
+  static constexpr uint32_t kIndexBits = 22;
+  static constexpr uint32_t kIndexMask = (1u << kIndexBits) - 1;
+
   uint32_t AddItem(std::unique_ptr<Item> item, Kind kind);
   std::unique_ptr<Item> RemoveItem(uint32_t handle, Kind kind) noexcept;
-  Slot* SlotOf(uint32_t handle, Kind kind) noexcept;
-  const Slot* SlotOf(uint32_t handle, Kind kind) const noexcept;
+
+  Slot* SlotOf(uint32_t handle, Kind kind) noexcept {
+    return const_cast<Slot*>(std::as_const(*this).SlotOf(handle, kind));
+  }
+
+  const Slot* SlotOf(uint32_t handle, Kind kind) const noexcept {
+    const uint32_t index = handle & kIndexMask;
+    if (index >= slots.size()) return nullptr;
+    const Slot& slot = slots[index];
+    return slot.kind == kind && slot.generation == handle >> kIndexBits ? &slot : nullptr;
+  }
+
   uint32_t HandleOf(uint32_t index) const noexcept;
   uint32_t TakeFreeSlot();
 

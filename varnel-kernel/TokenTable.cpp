@@ -1,6 +1,13 @@
 #include "TokenTable.h"
 
+#define XXH_INLINE_ALL
+#include <xxhash.h>
+
 namespace varnel_kernel {
+
+size_t TokenTable::Hash::operator()(std::string_view text) const noexcept {
+  return static_cast<size_t>(XXH3_64bits(text.data(), text.size()));
+}
 
 VRKToken TokenTable::TokenOf(std::string_view text) {
   if (const auto found = tokens.find(text); found != tokens.end()) return found->second;

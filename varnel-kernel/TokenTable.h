@@ -2,6 +2,7 @@
 #pragma once
 
 #include <boost/unordered/unordered_flat_map.hpp>
+#include <cstddef>
 #include <cstdint>
 #include <deque>
 #include <string>
@@ -24,8 +25,14 @@ class TokenTable {
   const char* TextOf(VRKToken token) const noexcept;
 
  private:
+  // Tokens are asked for by their texts over and over again.
+  struct Hash {
+    using is_avalanching = void;
+    size_t operator()(std::string_view text) const noexcept;
+  };
+
   std::deque<std::string> texts;  // that of token n at n - 1
-  boost::unordered_flat_map<std::string_view, VRKToken> tokens;
+  boost::unordered_flat_map<std::string_view, VRKToken, Hash> tokens;
 };
 
 }  // namespace varnel_kernel

@@ -82,8 +82,8 @@ struct Tables1_5 {
   uint64_t bucketsAt = 0;
 };
 
-// Takes an image apart into groups, with a look at lengths, but none at keys, nor at values that are
-// in UTF-16 already.
+// Takes an image apart into groups, with a look at lengths, but none at keys, nor at values that
+// are in UTF-16 already.
 class BinaryLoader {
  public:
   BinaryLoader(std::istream& image, const std::shared_ptr<LoadStatus>& loadStatus)
@@ -192,7 +192,8 @@ bool BinaryLoader::ParseGroups1_5(const Tables1_5& tables) {
   StoredGroup group;
   for (size_t i = 0; i < groupCount; ++i) {
     const uint64_t lengthsEnd = uint64_t{4} * Read32(&tables.counts[4 * i]);
-    if (lengthsEnd % StoredImage::kLengthsSize != 0 || lengthsEnd < group.lengthsEnd || lengthsEnd > stored.lengths.size()) {
+    if (lengthsEnd % StoredImage::kLengthsSize != 0 || lengthsEnd < group.lengthsEnd ||
+        lengthsEnd > stored.lengths.size()) {
       return Stop(LoadDamage::kBadCounts, tables.countsAt + 4 * i);
     }
     group.bucket = Read16(&tables.buckets[2 * i]);
@@ -286,8 +287,8 @@ bool BinaryLoader::TakeField1_0(std::span<const uint8_t>& field) {
   return true;
 }
 
-// Stores the same entries with their values in UTF-16; those before a value that cannot be converted
-// also when it throws.
+// Stores the same entries with their values in UTF-16; those before a value that cannot be
+// converted also when it throws.
 void BinaryLoader::ConvertValues(StoredImage& converted) {
   size_t lengthsAt = 0;
   size_t dataAt = 0;

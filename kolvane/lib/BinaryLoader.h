@@ -25,8 +25,8 @@ inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
 
 // Loads the image, whose stream stands at offset 0 and is known to begin with the magic, and
 // splices each of its groups into the bucket that the group names, where it stays as it is until
-// somebody looks into that bucket. Returns 0 when it read the body to its end and -1 when it stopped
-// before; `status` gets format, encoding, counts and damage.
+// somebody looks into that bucket. Returns 0 when it read the body to its end and -1 when it
+// stopped before; `status` gets format, encoding, counts and damage.
 //
 // Nothing that an image says is trusted: a count or a length that exceeds what is left of the
 // stream is a short read, and is found out before anything is allocated for it. What was read

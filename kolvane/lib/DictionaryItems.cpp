@@ -75,8 +75,8 @@ uint32_t ByteRunKey::Write(std::ostream& out, bool binary, const int*) const {
 }
 
 // Looks at nine bytes at most: every one of a key of up to nine, then every second, and so on. Each
-// is added to the hash so far, shifted left by five, modulo n; nine such steps need 49 bits, so that
-// the remainder can be taken once, at the end.
+// is added to the hash so far, shifted left by five, modulo n; nine such steps need 49 bits, so
+// that the remainder can be taken once, at the end.
 uint32_t ByteRunKey::Hash(uint32_t n) const noexcept {
   const uint32_t step = std::max(length / 5, 1u);
   uint64_t hash = 0;

@@ -85,11 +85,13 @@ inline bool ByteRunKey::Equals(const HashItem& other) const noexcept {
 
 class DictionaryEntry;
 
-// The value of an entry, with the entry's key before it: all that a lookup looks into, side by side.
+// The value of an entry, with the entry's key before it: all that a lookup looks into, side by
+// side.
 class KeyedRun final : public ByteRunValue {
  public:
   // Copies both. Throws std::bad_alloc.
-  static KeyedRun* Create(Arena& arena, std::span<const uint8_t> key, std::span<const uint8_t> bytes);
+  static KeyedRun* Create(Arena& arena, std::span<const uint8_t> key,
+                          std::span<const uint8_t> bytes);
 
   std::span<const uint8_t> Key() const noexcept { return {KeyBytes(), keyLength}; }
 
@@ -134,8 +136,8 @@ class DictionaryEntry final : public ByteRunKey {
   const KolvaneString& Value() const noexcept { return value; }
   KeyedRun& Run() const noexcept { return run; }
 
-  // The entry behind this one in its chain that has the same key and is found once this one is gone,
-  // or null. The table keeps it.
+  // The entry behind this one in its chain that has the same key and is found once this one is
+  // gone, or null. The table keeps it.
   DictionaryEntry* hidden = nullptr;
 
  private:

@@ -89,7 +89,8 @@ void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
   const auto split = tovali_private::SplitKolvane(tovali_private::EntryText(line));
   if (!split) return StoredLine::kDropped;
-  boost::container::small_vector<uint8_t, 256> narrowed(split->key.size(), boost::container::default_init);
+  boost::container::small_vector<uint8_t, 256> narrowed(split->key.size(),
+                                                        boost::container::default_init);
   std::transform(split->key.begin(), split->key.end(), narrowed.begin(),
                  [](uint16_t unit) { return static_cast<uint8_t>(unit); });
   const ByteRunKey key(narrowed.data(), static_cast<uint32_t>(narrowed.size()), false);

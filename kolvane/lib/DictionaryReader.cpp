@@ -96,7 +96,8 @@ void UnicodeReader::TakeHeldUnits() {
     const std::span<uint16_t> block = line.Extend(std::min(held.size() / 2, kBlock));
     std::memcpy(block.data(), held.data(), block.size_bytes());
     if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), Swapped);
-    const size_t run = RunBefore(std::span<const uint16_t>(block), [](uint16_t unit) { return unit == 0 || EndsLine(unit); });
+    const size_t run = RunBefore(std::span<const uint16_t>(block),
+                                 [](uint16_t unit) { return unit == 0 || EndsLine(unit); });
     line.SetLength(line.Length() - static_cast<uint32_t>(block.size() - run));
     Skip(2 * run);
     if (run < kBlock) return;

@@ -37,7 +37,8 @@ class DictionaryReader {
   DictionaryReader(std::istream* input, TextEncoding inputEncoding)
       : stream(input), encoding(inputEncoding) {}
 
-  // Reads up to `count` bytes and sets `count` to those that came before the stream ended or failed.
+  // Reads up to `count` bytes and sets `count` to those that came before the stream ended or
+  // failed.
   void ReadBytes(uint8_t* bytes, uint32_t& count) { ReadStreamBytes(stream, bytes, count); }
   static void ReadStreamBytes(std::istream* stream, uint8_t* bytes, uint32_t& count);
 

@@ -10,7 +10,8 @@ using tovali_private::StoredImage;
 
 namespace {
 
-// Entries are met in the order in which they are asked for; the one that counts is the image's first.
+// Entries are met in the order in which they are asked for; the one that counts is the image's
+// first.
 void NoteWrongBucket(LoadStatus& status, uint64_t offset) {
   const bool isBefore = status.damage == LoadDamage::kWrongBucket && offset < status.damageOffset;
   if (status.damage != LoadDamage::kNone && !isBefore) return;

@@ -93,7 +93,8 @@ class DictionaryTable {
   tovali_private::KeyedRun* FindRun(const ByteRunKey& key);
   void Settle(uint32_t bucket);
   void SettleLastOf(tovali_private::StoredGroup& group);
-  bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry, bool canBeFound) noexcept;
+  bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry,
+                  bool canBeFound) noexcept;
   void Unlink(tovali_private::HashItem& item) noexcept;
   void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
 

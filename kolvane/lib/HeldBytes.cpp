@@ -16,9 +16,7 @@ struct GetArea : std::streambuf {
     return {reinterpret_cast<const uint8_t*>(next), static_cast<size_t>(end - next)};
   }
 
-  static void Skip(std::streambuf& buffer, int count) noexcept {
-    (buffer.*&GetArea::gbump)(count);
-  }
+  static void Skip(std::streambuf& buffer, int count) noexcept { (buffer.*&GetArea::gbump)(count); }
 };
 
 }  // namespace

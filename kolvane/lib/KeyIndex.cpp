@@ -37,7 +37,8 @@ bool HasKey(const KeyedRun& run, std::span<const uint8_t> key) noexcept {
   __builtin_prefetch(start + 64);
   __builtin_prefetch(start + 128);
   const auto own = run.Key();
-  return own.size() == key.size() && (key.empty() || std::memcmp(own.data(), key.data(), key.size()) == 0);
+  return own.size() == key.size() &&
+         (key.empty() || std::memcmp(own.data(), key.data(), key.size()) == 0);
 }
 
 }  // namespace

@@ -10,8 +10,8 @@
 
 namespace tovali_private {
 
-// A hash table over whole keys that knows at most one run for each. Its hash is seeded anew in every
-// process, so that no image can be made to crowd its slots. It owns no runs.
+// A hash table over whole keys that knows at most one run for each. Its hash is seeded anew in
+// every process, so that no image can be made to crowd its slots. It owns no runs.
 class KeyIndex {
  public:
   KeyIndex();

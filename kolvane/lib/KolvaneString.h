@@ -46,7 +46,9 @@ class ByteRunValue : public RefCountObj {
       : length(byteCount), bytesOffset(offset) {}
   ~ByteRunValue() override = default;
 
-  const uint8_t* Bytes() const noexcept { return reinterpret_cast<const uint8_t*>(this) + bytesOffset; }
+  const uint8_t* Bytes() const noexcept {
+    return reinterpret_cast<const uint8_t*>(this) + bytesOffset;
+  }
 
  private:
   uint32_t length;

@@ -66,8 +66,8 @@ struct StoredImage {
   std::list<StoredImage>::iterator place;
 };
 
-// For every bucket the groups that wait for it, oldest first. Owns their images, each for as long as
-// one of its groups waits.
+// For every bucket the groups that wait for it, oldest first. Owns their images, each for as long
+// as one of its groups waits.
 class WaitingGroups {
  public:
   static constexpr uint32_t kBucketCount = 1021;

@@ -40,8 +40,8 @@ constexpr bool StartsEscape(uint16_t unit) noexcept {
 }
 
 // Decodes caret and backslash escapes, then named characters such as `#{nbsp}`; what it does not
-// know stays as it is. The result is never longer than the text. The second form gives the text back
-// where there is nothing to decode, and otherwise stores in `decoded` what it gives.
+// know stays as it is. The result is never longer than the text. The second form gives the text
+// back where there is nothing to decode, and otherwise stores in `decoded` what it gives.
 KolvaneString Unescape(std::span<const uint16_t> text);
 std::span<const uint16_t> Unescape(std::span<const uint16_t> text, std::vector<uint16_t>& decoded);
 

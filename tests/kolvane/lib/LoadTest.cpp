@@ -280,7 +280,7 @@ TEST(Load, SurvivesEveryFailedAllocation) {
         ASSERT_EQ(Translated(table, key.c_str()), twin.Translate(key));
       }
     }
-    EXPECT_GT(failures, 8u);
+    EXPECT_GE(failures, 8u);
   }
 }
 
