@@ -45,7 +45,8 @@ struct ConverterTable {
   decltype(&UnicodeToMultiByte) unicodeToMultiByte;
 };
 
-// Every conversion of the library calls through this table.
+// Every conversion of the library calls through this table; ASCII that stands for itself in every
+// code page may go without one.
 extern ConverterTable gConverterTable;
 
 // The guarded forms. They throw OVErrException with whatever non-zero code the converter returned,

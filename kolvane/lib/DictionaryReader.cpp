@@ -1,7 +1,6 @@
 #include "DictionaryReader.h"
 
 #include <algorithm>
-#include <cstring>
 #include <istream>
 
 #include "Converters.h"
@@ -94,7 +93,7 @@ void UnicodeReader::TakeHeldUnits() {
   for (;;) {
     const auto held = Held();
     const std::span<uint16_t> block = line.Extend(std::min(held.size() / 2, kBlock));
-    std::memcpy(block.data(), held.data(), block.size_bytes());
+    std::copy_n(held.data(), block.size_bytes(), reinterpret_cast<uint8_t*>(block.data()));
     if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), Swapped);
     const size_t run = RunBefore(std::span<const uint16_t>(block),
                                  [](uint16_t unit) { return unit == 0 || EndsLine(unit); });

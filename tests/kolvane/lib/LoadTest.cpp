@@ -231,7 +231,7 @@ TEST(Load, KeepsWhatCameBeforeAConversionFailed) {
     gConverterTable.multiByteToUnicode = RefuseConversion;
     const int utf8 = 1;
     try {
-      EXPECT_THROW(table.Translate("$$$/b=x", &utf8), OVErrException);
+      EXPECT_THROW(table.Translate("$$$/b=\xC3\xA9", &utf8), OVErrException);
       Load(table, image);
       ADD_FAILURE() << "nothing was thrown";
     } catch (const OVErrException& error) {
