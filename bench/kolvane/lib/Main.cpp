@@ -1,0 +1,158 @@
+// dictionary-bench: what lookups and loads cost, beside what others have for the same purpose.
+#include <fmt/format.h>
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <boost/json/src.hpp>
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <map>
+
+#include "Apart.h"
+#include "KeySet.h"
+#include "Measures.h"
+#include "Subjects.h"
+
+namespace {
+
+namespace json = boost::json;
+namespace fs = std::filesystem;
+
+std::vector<std::string> SubjectNames() {
+  std::vector<std::string> names;
+  for (const SubjectKind& kind : SubjectKinds()) names.push_back(kind.name);
+  return names;
+}
+
+struct Options {
+  std::vector<std::string> sets = KeySetNames();
+  std::vector<size_t> sizes = {1'000, 10'000, 100'000, 1'000'000};
+  std::vector<std::string> subjects = SubjectNames();
+  std::vector<std::string> measures = MeasureNames();
+  int rounds = 7;
+  std::string out;
+};
+
+bool Contains(const std::vector<std::string>& names, const std::string& name) {
+  return std::find(names.begin(), names.end(), name) != names.end();
+}
+
+// A folder for what the subjects load, gone afterwards.
+class Folder {
+ public:
+  Folder() {
+    std::string pattern = fs::temp_directory_path() / "dictionary-bench-XXXXXX";
+    if (mkdtemp(pattern.data()) == nullptr) throw std::runtime_error("no temporary folder");
+    path = pattern;
+  }
+  Folder(const Folder&) = delete;
+  Folder& operator=(const Folder&) = delete;
+  ~Folder() {
+    std::error_code ignored;
+    fs::remove_all(path, ignored);
+  }
+
+  fs::path path;
+};
+
+std::vector<std::unique_ptr<Subject>> MakeSubjects(const Options& options, const KeySet& set,
+                                                   const fs::path& folder) {
+  std::vector<std::unique_ptr<Subject>> subjects;
+  for (const SubjectKind& kind : SubjectKinds()) {
+    if (!Contains(options.subjects, kind.name)) continue;
+    try {
+      subjects.push_back(kind.make(set, folder));
+    } catch (const LeftOut& reason) {
+      fmt::print(stderr, "{} {}: {} left out: {}\n", set.name, set.Size(), kind.name,
+                 reason.what());
+    }
+  }
+  return subjects;
+}
+
+json::array MeasureSet(const Options& options, const std::string& name, size_t size) {
+  const KeySet set = MakeKeySet(name, size);
+  if (set.Size() == 0) return {};
+  const Folder folder;
+  auto subjects = MakeSubjects(options, set, folder.path);
+  Measures measures(set, subjects, options.rounds);
+  measures.CheckAnswers();
+  Results results;
+  // Lookups come last: some subjects remember for good what they were asked.
+  for (const char* measure : {"first-use", "load", "miss", "hit"}) {
+    if (Contains(options.measures, measure)) measures.Run(measure, results);
+  }
+  return results.Records(set);
+}
+
+// A table of one set: a line for each subject, a column for each measure.
+void Print(const json::array& records) {
+  if (records.empty()) return;
+  std::vector<std::string> columns;
+  std::map<std::string, std::map<std::string, double>> lines;
+  for (const json::value& record : records) {
+    const std::string measure(record.at("measure").as_string());
+    if (!Contains(columns, measure)) columns.push_back(measure);
+    lines[record.at("subject").as_string().c_str()][measure] = record.at("value").as_double();
+  }
+  fmt::print("\n{:18}", fmt::format("{} {}", records[0].at("set").as_string().c_str(),
+                                    records[0].at("size").to_number<size_t>()));
+  for (const std::string& column : columns) fmt::print("{:>15}", column);
+  for (const auto& [subject, cells] : lines) {
+    fmt::print("\n{:18}", subject);
+    for (const std::string& column : columns) {
+      fmt::print("{:>15}", cells.contains(column) ? fmt::format("{:.2f}", cells.at(column)) : "-");
+    }
+  }
+  fmt::print("\n");
+  std::fflush(stdout);
+}
+
+json::array MeasureAll(const Options& options) {
+  json::array all;
+  for (const std::string& name : options.sets) {
+    const bool hasOwnSize = name == "iso-codes";
+    for (const size_t size : hasOwnSize ? std::vector<size_t>{0} : options.sizes) {
+      const std::string text = RunApart([&] { return serialize(MeasureSet(options, name, size)); });
+      const json::array records = json::parse(text).as_array();
+      Print(records);
+      all.insert(all.end(), records.begin(), records.end());
+    }
+  }
+  return all;
+}
+
+void WriteFile(const std::string& path, const json::array& records) {
+  std::ofstream stream(path);
+  stream << json::value(records) << '\n';
+  stream.close();
+  if (!stream) throw std::runtime_error("cannot write " + path);
+}
+
+}  // namespace
+
+int main(int argc, char** argv) try {
+  Options options;
+  CLI::App app("Measures what lookups and loads of dictionaries cost.");
+  const auto addNames = [&](const char* option, std::vector<std::string>& names) {
+    app.add_option(option, names)
+        ->delimiter(',')
+        ->check(CLI::IsMember(names))
+        ->capture_default_str();
+  };
+  addNames("--sets", options.sets);
+  addNames("--subjects", options.subjects);
+  addNames("--measures", options.measures);
+  app.add_option("--sizes", options.sizes, "keys in a set")->delimiter(',')->capture_default_str();
+  app.add_option("--rounds", options.rounds, "the fastest counts")->check(CLI::PositiveNumber);
+  app.add_option("--out", options.out, "file for the results, in JSON");
+  CLI11_PARSE(app, argc, argv);
+
+  const json::array records = MeasureAll(options);
+  if (!options.out.empty()) WriteFile(options.out, records);
+  return 0;
+} catch (const std::exception& error) {
+  fmt::print(stderr, "dictionary-bench: {}\n", error.what());
+  return 1;
+}

@@ -1,0 +1,11 @@
+#include "Subjects.h"
+
+const std::vector<SubjectKind>& SubjectKinds() {
+  static const std::vector<SubjectKind> kinds = {
+      {"kolvane-utf16", MakeKolvaneUTF16},   {"kolvane-code-page", MakeKolvaneCodePage},
+      {"kolvane-binary", MakeKolvaneBinary}, {"limit", MakeLimit},
+      {"read-utf16", MakeReadUTF16},         {"read-code-page", MakeReadCodePage},
+      {"read-binary", MakeReadBinary},
+  };
+  return kinds;
+}
