@@ -1,15 +1,25 @@
-// What a map can do that has nothing to parse, to decode or to own: the yardstick for lookups.
+// What a map can do that has nothing to parse, to decode or to own: the yardstick for lookups. Once
+// with the map's own hash of strings, once with a faster one.
 #include <boost/unordered/unordered_flat_map.hpp>
 #include <cstring>
+
+#define XXH_INLINE_ALL
+#include <xxhash.h>
 
 #include "Subjects.h"
 
 namespace {
 
-class LimitSubject final : public AskedSubject<LimitSubject, uint16_t> {
+struct XXH3 {
+  using is_avalanching = void;
+  size_t operator()(std::string_view key) const { return XXH3_64bits(key.data(), key.size()); }
+};
+
+template <class Hash>
+class LimitSubject final : public AskedSubject<LimitSubject<Hash>, uint16_t> {
  public:
-  explicit LimitSubject(const KeySet& set)
-      : AskedSubject("limit"), keys(set.keys), values(set.values) {}
+  LimitSubject(const char* subjectName, const KeySet& set)
+      : AskedSubject<LimitSubject, uint16_t>(subjectName), keys(set.keys), values(set.values) {}
 
   void Load() override {
     const size_t keyBytes = keys.Block().size();
@@ -48,11 +58,15 @@ class LimitSubject final : public AskedSubject<LimitSubject, uint16_t> {
   const PackedTexts<char> keys;
   const PackedTexts<char16_t> values;
   std::unique_ptr<char16_t[]> block;
-  boost::unordered_flat_map<std::string_view, std::u16string_view> map;
+  boost::unordered_flat_map<std::string_view, std::u16string_view, Hash> map;
 };
 
 }  // namespace
 
 std::unique_ptr<Subject> MakeLimit(const KeySet& set, const std::filesystem::path&) {
-  return std::make_unique<LimitSubject>(set);
+  return std::make_unique<LimitSubject<boost::hash<std::string_view>>>("limit", set);
+}
+
+std::unique_ptr<Subject> MakeLimitXXH3(const KeySet& set, const std::filesystem::path&) {
+  return std::make_unique<LimitSubject<XXH3>>("limit-xxh3", set);
 }

@@ -109,6 +109,7 @@ void Measures::Ask(const std::string& measure, const Queries& queries, Results& 
     for (const auto& subject : subjects) {
       if (subject->yields == Yields::kNothing) continue;
       const size_t expected = ExpectedLength(set, *subject, many, measure == "hit");
+      subject->AskAll(queries.Once());  // the other subjects had the caches
       const double time = Time<std::nano>([&] { AskAllOf(*subject, many, expected); });
       results.Note(*subject, measure, time / static_cast<double>(many.size()));
     }

@@ -27,6 +27,7 @@ std::unique_ptr<Subject> MakeKolvaneUTF16(const KeySet&, const std::filesystem::
 std::unique_ptr<Subject> MakeKolvaneCodePage(const KeySet&, const std::filesystem::path&);
 std::unique_ptr<Subject> MakeKolvaneBinary(const KeySet&, const std::filesystem::path&);
 std::unique_ptr<Subject> MakeLimit(const KeySet&, const std::filesystem::path&);
+std::unique_ptr<Subject> MakeLimitXXH3(const KeySet&, const std::filesystem::path&);
 std::unique_ptr<Subject> MakeReadUTF16(const KeySet&, const std::filesystem::path&);
 std::unique_ptr<Subject> MakeReadCodePage(const KeySet&, const std::filesystem::path&);
 std::unique_ptr<Subject> MakeReadBinary(const KeySet&, const std::filesystem::path&);
