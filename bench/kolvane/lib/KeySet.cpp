@@ -85,11 +85,16 @@ PackedTexts<char> OnePattern(size_t count) {
   return keys;
 }
 
+// Leaves out keys all along, so that those which a dictionary lacks lie between those it has.
 void AddSyntheticEntries(KeySet& set, const PackedTexts<char>& keys, size_t size, Random& random) {
-  for (size_t i = 0; i < size; ++i) {
-    AddEntry(set, keys[i], DrawText(random, kFrench, Draw(random, 5, 45)));
+  const size_t interval = keys.Count() / (keys.Count() - size);
+  for (size_t i = 0; i < keys.Count(); ++i) {
+    if (i % interval == interval - 1) {
+      set.missingKeys.Append(keys[i]);
+    } else {
+      AddEntry(set, keys[i], DrawText(random, kFrench, Draw(random, 5, 45)));
+    }
   }
-  for (size_t i = size; i < keys.Count(); ++i) set.missingKeys.Append(keys[i]);
 }
 
 void AddMissingIsoCodes(KeySet& set) {

@@ -62,7 +62,7 @@ std::vector<std::unique_ptr<Subject>> MakeSubjects(const Options& options, const
   for (const SubjectKind& kind : SubjectKinds()) {
     if (!Contains(options.subjects, kind.name)) continue;
     try {
-      subjects.push_back(kind.make(set, folder));
+      if (auto subject = kind.make(set, folder)) subjects.push_back(std::move(subject));
     } catch (const LeftOut& reason) {
       fmt::print(stderr, "{} {}: {} left out: {}\n", set.name, set.Size(), kind.name,
                  reason.what());

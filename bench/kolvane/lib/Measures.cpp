@@ -43,9 +43,13 @@ size_t ExpectedLength(const KeySet& set, const Subject& subject, std::span<const
                       bool areHits) {
   size_t length = 0;
   for (const Query& query : queries) {
-    const size_t hit = subject.yields == Yields::kUTF16 ? set.values[query.number].size()
-                                                        : set.valuesInUTF8[query.number].size();
-    length += areHits ? hit : query.defaultLength;
+    if (!areHits) {
+      length += query.defaultLength;
+    } else if (subject.yields == Yields::kUTF16) {
+      length += set.values[query.number].size();
+    } else {
+      length += set.valuesInUTF8[query.number].size();
+    }
   }
   return length;
 }
@@ -79,8 +83,8 @@ Measures::Measures(const KeySet& keySet, std::vector<std::unique_ptr<Subject>>& 
     : set(keySet),
       subjects(compared),
       rounds(roundCount),
-      hits(set.keys, set.defaultTexts),
-      misses(set.missingKeys, set.missingDefaults) {}
+      hits(set.keys, set.defaultTexts, 0),
+      misses(set.missingKeys, set.missingDefaults, set.Size()) {}
 
 // Apart, for a subject may remember whatever it was ever asked.
 void Measures::CheckAnswers() {

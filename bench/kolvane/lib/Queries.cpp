@@ -19,7 +19,8 @@ void ShuffleAll(Items& items, std::mt19937_64& random) {
 
 }  // namespace
 
-Queries::Queries(const PackedTexts<char>& keys, const PackedTexts<char>& defaultTexts)
+Queries::Queries(const PackedTexts<char>& keys, const PackedTexts<char>& defaultTexts,
+                 size_t firstNumber)
     : keyCount(keys.Count()) {
   std::mt19937_64 random(1);
   std::vector<uint32_t> order(keyCount);
@@ -29,11 +30,11 @@ Queries::Queries(const PackedTexts<char>& keys, const PackedTexts<char>& default
   // Blocks that never move, since queries point into them.
   texts.reserve(keys.Block().size() + defaultTexts.Block().size() + keyCount * 5);
   bareKeys.reserve(keys.Block().size() + keyCount);
-  for (const uint32_t number : order) {
-    const std::string_view key = keys[number], defaultText = defaultTexts[number];
+  for (const uint32_t i : order) {
+    const std::string_view key = keys[i], defaultText = defaultTexts[i];
     queries.push_back({texts.data() + texts.size(), bareKeys.data() + bareKeys.size(),
                        static_cast<uint32_t>(key.size()), static_cast<uint32_t>(defaultText.size()),
-                       number});
+                       static_cast<uint32_t>(firstNumber + i)});
     Append(texts, {"$$$", key, "=", defaultText});
     Append(bareKeys, {key});
   }

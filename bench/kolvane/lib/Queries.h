@@ -13,15 +13,16 @@ struct Query {
   const char* key;   // `/Key`, terminated
   uint32_t keyLength;
   uint32_t defaultLength;
-  uint32_t number;  // of the key in its set
+  uint32_t number;  // of the key; those that a dictionary lacks are numbered after those it has
 
   std::string_view Key() const { return {key, keyLength}; }
+  uint32_t TextLength() const { return 3 + keyLength + 1 + defaultLength; }
   std::string_view DefaultText() const { return {text + 3 + keyLength + 1, defaultLength}; }
 };
 
 class Queries {
  public:
-  Queries(const PackedTexts<char>& keys, const PackedTexts<char>& defaultTexts);
+  Queries(const PackedTexts<char>& keys, const PackedTexts<char>& defaultTexts, size_t firstNumber);
 
   // Every key once, in random order.
   std::span<const Query> Once() const { return {queries.data(), keyCount}; }
