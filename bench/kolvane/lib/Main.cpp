@@ -7,7 +7,6 @@
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
-#include <map>
 
 #include "Apart.h"
 #include "KeySet.h"
@@ -57,25 +56,25 @@ class Folder {
 };
 
 std::vector<std::unique_ptr<Subject>> MakeSubjects(const Options& options, const KeySet& set,
-                                                   const fs::path& folder) {
+                                                   const fs::path& folder, json::object& leftOut) {
   std::vector<std::unique_ptr<Subject>> subjects;
   for (const SubjectKind& kind : SubjectKinds()) {
     if (!Contains(options.subjects, kind.name)) continue;
     try {
       if (auto subject = kind.make(set, folder)) subjects.push_back(std::move(subject));
     } catch (const LeftOut& reason) {
-      fmt::print(stderr, "{} {}: {} left out: {}\n", set.name, set.Size(), kind.name,
-                 reason.what());
+      leftOut[kind.name] = reason.what();
     }
   }
   return subjects;
 }
 
-json::array MeasureSet(const Options& options, const std::string& name, size_t size) {
+json::object MeasureSet(const Options& options, const std::string& name, size_t size) {
   const KeySet set = MakeKeySet(name, size);
   if (set.Size() == 0) return {};
   const Folder folder;
-  auto subjects = MakeSubjects(options, set, folder.path);
+  json::object leftOut;
+  auto subjects = MakeSubjects(options, set, folder.path, leftOut);
   Measures measures(set, subjects, options.rounds);
   measures.CheckAnswers();
   Results results;
@@ -83,27 +82,29 @@ json::array MeasureSet(const Options& options, const std::string& name, size_t s
   for (const char* measure : {"first-use", "load", "miss", "hit"}) {
     if (Contains(options.measures, measure)) measures.Run(measure, results);
   }
-  return results.Records(set);
+  return {{"set", set.name},
+          {"size", set.Size()},
+          {"keyBytes", set.keys.Block().size()},
+          {"valueUnits", set.values.Block().size()},
+          {"leftOut", leftOut},
+          {"results", results.Records()}};
 }
 
-// A table of one set: a line for each subject, a column for each measure.
-void Print(const json::array& records) {
-  if (records.empty()) return;
-  std::vector<std::string> columns;
-  std::map<std::string, std::map<std::string, double>> lines;
-  for (const json::value& record : records) {
-    const std::string measure(record.at("measure").as_string());
-    if (!Contains(columns, measure)) columns.push_back(measure);
-    lines[record.at("subject").as_string().c_str()][measure] = record.at("value").as_double();
-  }
-  fmt::print("\n{:18}", fmt::format("{} {}", records[0].at("set").as_string().c_str(),
-                                    records[0].at("size").to_number<size_t>()));
-  for (const std::string& column : columns) fmt::print("{:>15}", column);
-  for (const auto& [subject, cells] : lines) {
-    fmt::print("\n{:18}", subject);
-    for (const std::string& column : columns) {
-      fmt::print("{:>15}", cells.contains(column) ? fmt::format("{:.2f}", cells.at(column)) : "-");
+// A line for each subject, a column for each measure.
+void Print(const json::object& measured) {
+  fmt::print("\n{:18}", fmt::format("{} {}", measured.at("set").as_string().c_str(),
+                                    measured.at("size").to_number<size_t>()));
+  for (const std::string& column : ResultNames()) fmt::print("{:>15}", column);
+  for (const auto& [subject, measures] : measured.at("results").as_object()) {
+    fmt::print("\n{:18}", std::string_view(subject));
+    for (const std::string& column : ResultNames()) {
+      const json::value* const cell = measures.as_object().if_contains(column);
+      fmt::print("{:>15}",
+                 cell == nullptr ? "-" : fmt::format("{:.2f}", cell->at("least").as_double()));
     }
+  }
+  for (const auto& [subject, reason] : measured.at("leftOut").as_object()) {
+    fmt::print("\n{:18} left out: {}", std::string_view(subject), reason.as_string().c_str());
   }
   fmt::print("\n");
   std::fflush(stdout);
@@ -115,17 +116,26 @@ json::array MeasureAll(const Options& options) {
     const bool hasOwnSize = name == "iso-codes";
     for (const size_t size : hasOwnSize ? std::vector<size_t>{0} : options.sizes) {
       const std::string text = RunApart([&] { return serialize(MeasureSet(options, name, size)); });
-      const json::array records = json::parse(text).as_array();
-      Print(records);
-      all.insert(all.end(), records.begin(), records.end());
+      const json::object measured = json::parse(text).as_object();
+      if (measured.empty()) continue;
+      Print(measured);
+      all.push_back(measured);
     }
   }
   return all;
 }
 
-void WriteFile(const std::string& path, const json::array& records) {
+json::object Libraries() {
+  json::object libraries;
+  for (const SubjectKind& kind : SubjectKinds()) {
+    if (!kind.library.empty()) libraries[kind.name] = kind.library;
+  }
+  return libraries;
+}
+
+void WriteFile(const std::string& path, const json::object& document) {
   std::ofstream stream(path);
-  stream << json::value(records) << '\n';
+  stream << document << '\n';
   stream.close();
   if (!stream) throw std::runtime_error("cannot write " + path);
 }
@@ -149,8 +159,9 @@ int main(int argc, char** argv) try {
   app.add_option("--out", options.out, "file for the results, in JSON");
   CLI11_PARSE(app, argc, argv);
 
-  const json::array records = MeasureAll(options);
-  if (!options.out.empty()) WriteFile(options.out, records);
+  const json::object document = {
+      {"rounds", options.rounds}, {"libraries", Libraries()}, {"sets", MeasureAll(options)}};
+  if (!options.out.empty()) WriteFile(options.out, document);
   return 0;
 } catch (const std::exception& error) {
   fmt::print(stderr, "dictionary-bench: {}\n", error.what());

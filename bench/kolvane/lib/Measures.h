@@ -9,11 +9,14 @@
 #include "Results.h"
 #include "Subject.h"
 
-// hit, miss        ns a query, answer copied
-// load             ms; also `unload`, ms
-// first-use        ms, load and every key once, in a process of its own; also, in bytes an entry,
-//                  `memory-loaded` and `memory-used`: the peaks after the load and in the end
+// `hit` and `miss` are in nanoseconds a query, with the answer copied.
+// `load` is in milliseconds, and has `unload` beside it.
+// `first-use` is the milliseconds of a load and every key once, in a process of its own. Beside it,
+// in bytes an entry, are the peaks after the load and in the end: `memory-loaded`, `memory-used`.
 const std::vector<std::string>& MeasureNames();
+
+// The measures and what is beside them.
+const std::vector<std::string>& ResultNames();
 
 class Measures {
  public:
@@ -31,6 +34,7 @@ class Measures {
 
   const KeySet& set;
   std::vector<std::unique_ptr<Subject>>& subjects;
+  std::vector<Subject*> askable;  // those of them that yield anything
   const int rounds;
   const Queries hits;
   const Queries misses;

@@ -8,10 +8,6 @@
 
 namespace {
 
-#ifndef MSGFMT
-#define MSGFMT "msgfmt"
-#endif
-
 constexpr char kHeader[] = "msgid \"\"\nmsgstr \"Content-Type: text/plain; charset=UTF-8\\n\"\n\n";
 
 void FillCatalogue(std::ostream& stream, const KeySet& set) {

@@ -13,7 +13,7 @@ struct Query {
   const char* key;   // `/Key`, terminated
   uint32_t keyLength;
   uint32_t defaultLength;
-  uint32_t number;  // of the key; those that a dictionary lacks are numbered after those it has
+  uint32_t number;  // of the key; those that the set lacks are numbered after those it has
 
   std::string_view Key() const { return {key, keyLength}; }
   uint32_t TextLength() const { return 3 + keyLength + 1 + defaultLength; }

@@ -2,17 +2,15 @@
 
 #include <algorithm>
 
-boost::json::array Results::Records(const KeySet& set) const {
-  boost::json::array records;
+boost::json::object Results::Records() const {
+  boost::json::object records;
   for (const auto& [what, values] : rounds) {
     std::vector<double> sorted = values;
     std::sort(sorted.begin(), sorted.end());
-    records.push_back({{"set", set.name},
-                       {"size", set.Size()},
-                       {"subject", what.first},
-                       {"measure", what.second},
-                       {"value", sorted.front()},
-                       {"median", sorted[sorted.size() / 2]}});
+    auto& measures = records[what.first];
+    if (!measures.is_object()) measures.emplace_object();
+    measures.as_object()[what.second] = {{"least", sorted.front()},
+                                         {"median", sorted[sorted.size() / 2]}};
   }
   return records;
 }

@@ -1,7 +1,7 @@
 // What was measured of one key set.
 #pragma once
 
-#include <boost/json/array.hpp>
+#include <boost/json/object.hpp>
 #include <map>
 #include <string>
 #include <utility>
@@ -16,8 +16,8 @@ class Results {
     rounds[{subject.name, measure}].push_back(value);
   }
 
-  // A record for each subject and measure, with the least and the median of its rounds.
-  boost::json::array Records(const KeySet& set) const;
+  // By subject and measure, the least and the median of the rounds.
+  boost::json::object Records() const;
 
  private:
   std::map<std::pair<std::string, std::string>, std::vector<double>> rounds;

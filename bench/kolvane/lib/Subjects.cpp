@@ -1,30 +1,35 @@
 #include "Subjects.h"
 
+#include <gnu/libc-version.h>
+
+#include <boost/version.hpp>
+
 namespace {
 
 std::vector<SubjectKind> FindKinds() {
-  std::vector<SubjectKind> kinds = {{"kolvane-binary", MakeKolvaneBinary},
-                                    {"kolvane-utf16", MakeKolvaneUTF16},
-                                    {"kolvane-code-page", MakeKolvaneCodePage},
-                                    {"kernel-message", MakeMessage},
-                                    {"kernel-coercion", MakeCoercion},
-                                    {"limit", MakeLimit},
-                                    {"limit-xxh3", MakeLimitXXH3}};
-#ifdef HAS_ICU
-  kinds.push_back({"icu", MakeICU});
+  std::vector<SubjectKind> kinds;
+  kinds.push_back({"kolvane-binary", MakeKolvaneBinary, {}});
+  kinds.push_back({"kolvane-utf16", MakeKolvaneUTF16, {}});
+  kinds.push_back({"kolvane-code-page", MakeKolvaneCodePage, {}});
+  kinds.push_back({"kernel-message", MakeMessage, {}});
+  kinds.push_back({"kernel-coercion", MakeCoercion, {}});
+  kinds.push_back({"limit", MakeLimit, "Boost.Unordered " BOOST_LIB_VERSION});
+  kinds.push_back({"limit-xxh3", MakeLimitXXH3, {}});
+#ifdef PEER_ICU
+  kinds.push_back({"icu", MakeICU, "ICU " PEER_ICU});
 #endif
-#ifdef HAS_QT
-  kinds.push_back({"qt", MakeQt});
+#ifdef PEER_QT
+  kinds.push_back({"qt", MakeQt, "Qt " PEER_QT});
 #endif
-#ifdef HAS_GETTEXT
-  kinds.push_back({"gettext", MakeGettext});
+#ifdef PEER_GETTEXT
+  kinds.push_back({"gettext", MakeGettext, std::string("glibc ") + gnu_get_libc_version()});
 #endif
-#ifdef HAS_BOOST_LOCALE
-  kinds.push_back({"boost-locale", MakeBoostLocale});
+#ifdef PEER_BOOST_LOCALE
+  kinds.push_back({"boost-locale", MakeBoostLocale, "Boost.Locale " PEER_BOOST_LOCALE});
 #endif
-  kinds.push_back({"read-binary", MakeReadBinary});
-  kinds.push_back({"read-utf16", MakeReadUTF16});
-  kinds.push_back({"read-code-page", MakeReadCodePage});
+  kinds.push_back({"read-binary", MakeReadBinary, {}});
+  kinds.push_back({"read-utf16", MakeReadUTF16, {}});
+  kinds.push_back({"read-code-page", MakeReadCodePage, {}});
   return kinds;
 }
 

@@ -19,6 +19,7 @@ struct SubjectKind {
   // Puts what the subject loads into the folder. Null for a set that the subject is not meant for;
   // throws LeftOut.
   std::unique_ptr<Subject> (*make)(const KeySet& set, const std::filesystem::path& folder);
+  std::string library;  // its name and version, of a subject that is not ours
 };
 
 // Those whose libraries were found.
