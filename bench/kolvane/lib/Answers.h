@@ -8,8 +8,8 @@
 #include "Queries.h"
 #include "Subject.h"
 
-// Throws when the loaded subject answers any of the queries wrongly. Where the set lacks the key, the
-// default text is the right answer.
+// Throws when the loaded subject answers any of the queries wrongly. Where the set lacks the key,
+// the default text is the right answer.
 void CheckEach(Subject& subject, const KeySet& set, std::span<const Query> queries);
 
 // How long the subject's answers to the queries are together.

@@ -17,6 +17,7 @@ class BoostLocaleSubject final : public AskedSubject<BoostLocaleSubject, char> {
     generator.add_messages_path(folder.string());
     generator.add_messages_domain("bench");
     generator.categories(boost::locale::category_t::message);
+    generator.characters(boost::locale::char_facet_t::char_f);
   }
 
   void Load() override {

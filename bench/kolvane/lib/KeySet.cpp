@@ -87,9 +87,9 @@ PackedTexts<char> OnePattern(size_t count) {
 
 // Leaves out keys all along, so that those which a dictionary lacks lie between those it has.
 void AddSyntheticEntries(KeySet& set, const PackedTexts<char>& keys, size_t size, Random& random) {
-  const size_t interval = keys.Count() / (keys.Count() - size);
-  for (size_t i = 0; i < keys.Count(); ++i) {
-    if (i % interval == interval - 1) {
+  const size_t all = keys.Count(), missing = all - size;
+  for (size_t i = 0; i < all; ++i) {
+    if (i * missing / all != (i + 1) * missing / all) {
       set.missingKeys.Append(keys[i]);
     } else {
       AddEntry(set, keys[i], DrawText(random, kFrench, Draw(random, 5, 45)));

@@ -154,7 +154,10 @@ int main(int argc, char** argv) try {
   addNames("--sets", options.sets);
   addNames("--subjects", options.subjects);
   addNames("--measures", options.measures);
-  app.add_option("--sizes", options.sizes, "keys in a set")->delimiter(',')->capture_default_str();
+  app.add_option("--sizes", options.sizes, "keys in a set")
+      ->delimiter(',')
+      ->check(CLI::PositiveNumber)
+      ->capture_default_str();
   app.add_option("--rounds", options.rounds, "the fastest counts")->check(CLI::PositiveNumber);
   app.add_option("--out", options.out, "file for the results, in JSON");
   CLI11_PARSE(app, argc, argv);
