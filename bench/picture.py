@@ -109,7 +109,8 @@ def grid(x_scale, y_scale, sizes, times):
 def curve(line, points, x_scale, y_scale):
     places = [(x_scale(size), y_scale(time)) for size, time in points]
     path = "M" + "L".join(f"{x:.1f} {y:.1f}" for x, y in places)
-    dots = "".join(f'<circle class="{line.subject}-fill" cx="{x:.1f}" cy="{y:.1f}" r="{5 if line.style == "ours" else 3.5}"/>'
+    radius = 5 if line.style == "ours" else 3.5
+    dots = "".join(f'<circle class="{line.subject}-fill" cx="{x:.1f}" cy="{y:.1f}" r="{radius}"/>'
                    for x, y in places)
     return f'<path class="line {line.subject} {line.style}" d="{path}"/>{dots}'
 
@@ -133,7 +134,7 @@ def draw(results):
              f'height="{HEIGHT}" role="img" aria-label="Time of a lookup by number of keys">',
              f"<style>\n{style()}</style>", f'<rect class="background" width="{WIDTH}" height="{HEIGHT}"/>',
              f'<text class="title" x="{LEFT}" y="28">Time of a lookup, by number of keys</text>',
-             f'<text x="{LEFT}" y="48">nanoseconds, the answer copied; less is better</text>']
+             f'<text x="{LEFT}" y="48">nanoseconds, the answer copied; mixed paths; less is better</text>']
     parts += grid(x_scale, y_scale, sizes, marks)
     parts += [curve(line, points, x_scale, y_scale) for line, points in found.items()]
     parts += labels(found, y_scale) if found else []

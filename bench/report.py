@@ -1,7 +1,7 @@
 #!/usr/bin/env python3
 """Turn the results of dictionary-bench into docs/performance.md and its picture.
 
-    report.py RESULTS.json FOLDER --compiler TEXT
+    report.py RESULTS.json FOLDER
 """
 
 import argparse
@@ -12,7 +12,7 @@ import platform
 
 import picture
 import targets
-from results import OURS, PEERS, SUBJECTS, Results, number
+from results import OURS, SUBJECTS, Results, number
 
 SET_TITLES = {
     "mixed-paths": "Mixed paths",
@@ -25,8 +25,8 @@ INTRODUCTION = """\
 
 ![Time of a lookup by number of keys](performance.svg)
 
-This page is written by `scripts/bench`, which installs what is missing, builds, measures, and takes a
-quarter of an hour. `scripts/bench --sizes 1000,100000 --subjects kolvane-binary,limit`, or any other
+This page is written by `scripts/bench`, which installs what is missing, builds, measures, and takes some
+ten minutes. `scripts/bench --sizes 1000,100000 --subjects kolvane-binary,limit`, or any other
 options of `dictionary-bench`, measures that much only and writes nothing.
 """
 
@@ -40,7 +40,8 @@ ROWS = """\
 | kolvane, code-page text | the same, loaded from a text dictionary in windows-1252 | UTF-16 |
 | kolvane, message | the UTF-16 text in a translator object, asked by messages through the kernel | UTF-16 |
 | kolvane, coercion | the same, asked by letting the kernel coerce keys that are kept as data | UTF-16 |
-| limit | `boost::unordered_flat_map` from views of keys to views of values, all in one block; its load copies two arrays and fills the reserved map: nothing is parsed, decoded or checked | UTF-16 |
+| limit | `boost::unordered_flat_map` of views into one block; its load copies two arrays and fills the reserved map: \
+nothing is parsed, decoded or checked | UTF-16 |
 | limit, XXH3 | the same with XXH3 for the map's own hash of strings | UTF-16 |
 | ICU | a resource bundle by `genrb`, `ures_openDirect` and `ures_getStringByKey` | UTF-16 |
 | Qt | `QTranslator` with a catalogue by `lrelease` | UTF-16 |
@@ -68,12 +69,12 @@ length of the answers is.
 """
 
 
-def machine(compiler, libraries):
+def machine(results):
     with open("/proc/cpuinfo", encoding="utf-8") as lines:
         models = [line.partition(":")[2].strip() for line in lines if line.startswith("model name")]
-    versions = ", ".join(dict.fromkeys(libraries.values()))
+    versions = ", ".join(dict.fromkeys(results.libraries.values())).replace("_", ".")
     return (f"Measured on {datetime.date.today()}: {models[0] if models else platform.machine()}, "
-            f"{os.cpu_count()} cores, {platform.system()} {platform.release()}; {compiler}; {versions}.\n")
+            f"{os.cpu_count()} cores, {platform.system()} {platform.release()}; {results.compiler}; {versions}.\n")
 
 
 def table(header, lines):
@@ -107,13 +108,13 @@ class SetTables:
             yield [SUBJECTS[subject].title] + [ratio_cell(*pair) for pair in zip(values, bases)]
 
     def peer_line(self, measure):
-        """How many times faster than the fastest peer that gives UTF-16 the slowest image is."""
+        """What the fastest peer that gives UTF-16 takes, in terms of the slowest image."""
         cells = []
         for size in self.sizes:
             ours = self.results.slowest(self.set_name, size, measure)
             peer, least = self.results.fastest_peer(self.set_name, size, measure)
-            cells.append(f"{number(least / ours)} times ({SUBJECTS[peer].title})" if ours and peer else "–")
-        return ["*slowest kolvane row faster than the fastest UTF-16 peer*"] + cells
+            cells.append(f"{number(least / ours)} ({SUBJECTS[peer].title})" if ours and peer else "–")
+        return ["*the fastest UTF-16 peer, times the slowest kolvane row*"] + cells
 
     def lookups(self, measure):
         subjects = [name for name in SUBJECTS if not name.startswith("read-")]
@@ -140,7 +141,7 @@ class SetTables:
                      for size in sizes]
             if any(None not in pair for pair in pairs):
                 lines.append([SUBJECTS[subject].title] +
-                             ["–" if None in pair else " / ".join(f"{value:.0f}" for value in pair) for pair in pairs])
+                             ["–" if None in pair else "{:.0f} / {:.0f}".format(*pair) for pair in pairs])
         size_line = ["*keys and values*"] + [f"{self.results.payload(self.set_name, size):.0f}" for size in sizes]
         return table(["bytes an entry, loaded / all asked"] + [f"{size:,} keys" for size in sizes],
                      [size_line] + lines) if sizes else ""
@@ -168,8 +169,8 @@ def targets_chapter(results):
             "UTF-16. Sizes stand before the colons.\n\n" + head + body)
 
 
-def page(results, compiler):
-    chapters = [INTRODUCTION, machine(compiler, results.libraries), targets_chapter(results),
+def page(results):
+    chapters = [INTRODUCTION, machine(results), targets_chapter(results),
                 ROWS.format(rounds=results.rounds)]
     chapters += [set_chapter(results, name) for name in SET_TITLES if results.sizes(name)]
     return "\n".join(chapters)
@@ -179,11 +180,10 @@ def main():
     parser = argparse.ArgumentParser(description=__doc__, formatter_class=argparse.RawDescriptionHelpFormatter)
     parser.add_argument("results")
     parser.add_argument("folder")
-    parser.add_argument("--compiler", default="compiler not named")
     arguments = parser.parse_args()
     with open(arguments.results, encoding="utf-8") as stream:
         results = Results(json.load(stream))
-    outputs = {"performance.md": page(results, arguments.compiler), "performance.svg": picture.draw(results)}
+    outputs = {"performance.md": page(results), "performance.svg": picture.draw(results)}
     for name, text in outputs.items():
         with open(os.path.join(arguments.folder, name), "w", encoding="utf-8") as stream:
             stream.write(text)

@@ -37,7 +37,7 @@ def number(value):
 
 class Results:
     def __init__(self, document):
-        self.rounds = document["rounds"]
+        self.rounds, self.compiler = document["rounds"], document["compiler"]
         self.libraries = document["libraries"]
         self.sets = {(entry["set"], entry["size"]): entry for entry in document["sets"]}
 

@@ -18,6 +18,12 @@ namespace {
 namespace json = boost::json;
 namespace fs = std::filesystem;
 
+#ifdef __clang__
+constexpr char kCompiler[] = "Clang " __clang_version__;
+#else
+constexpr char kCompiler[] = "GCC " __VERSION__;
+#endif
+
 std::vector<std::string> SubjectNames() {
   std::vector<std::string> names;
   for (const SubjectKind& kind : SubjectKinds()) names.push_back(kind.name);
@@ -162,8 +168,10 @@ int main(int argc, char** argv) try {
   app.add_option("--out", options.out, "file for the results, in JSON");
   CLI11_PARSE(app, argc, argv);
 
-  const json::object document = {
-      {"rounds", options.rounds}, {"libraries", Libraries()}, {"sets", MeasureAll(options)}};
+  const json::object document = {{"compiler", kCompiler},
+                                 {"libraries", Libraries()},
+                                 {"rounds", options.rounds},
+                                 {"sets", MeasureAll(options)}};
   if (!options.out.empty()) WriteFile(options.out, document);
   return 0;
 } catch (const std::exception& error) {

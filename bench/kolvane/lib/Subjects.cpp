@@ -1,10 +1,15 @@
 #include "Subjects.h"
 
+#include <fmt/format.h>
 #include <gnu/libc-version.h>
+#include <xxhash.h>
 
 #include <boost/version.hpp>
 
 namespace {
+
+const std::string kXXHash =
+    fmt::format("xxHash {}.{}.{}", XXH_VERSION_MAJOR, XXH_VERSION_MINOR, XXH_VERSION_RELEASE);
 
 std::vector<SubjectKind> FindKinds() {
   std::vector<SubjectKind> kinds;
@@ -14,7 +19,7 @@ std::vector<SubjectKind> FindKinds() {
   kinds.push_back({"kernel-message", MakeMessage, {}});
   kinds.push_back({"kernel-coercion", MakeCoercion, {}});
   kinds.push_back({"limit", MakeLimit, "Boost.Unordered " BOOST_LIB_VERSION});
-  kinds.push_back({"limit-xxh3", MakeLimitXXH3, {}});
+  kinds.push_back({"limit-xxh3", MakeLimitXXH3, kXXHash});
 #ifdef PEER_ICU
   kinds.push_back({"icu", MakeICU, "ICU " PEER_ICU});
 #endif
