@@ -1,0 +1,30 @@
+// What the benchmark translates: keys that a dictionary has, keys that it lacks, and translations.
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+#include "PackedTexts.h"
+
+struct KeySet {
+  std::string name;
+  PackedTexts<char> keys;             // `/Path/Of/Key`, all different
+  PackedTexts<char16_t> values;       // one for each key
+  PackedTexts<char> valuesInUTF8;     // the same
+  PackedTexts<char> missingKeys;      // of the same kind, none of them in `keys`
+  PackedTexts<char> defaultTexts;     // ASCII without escapes, one for each key
+  PackedTexts<char> missingDefaults;  // one for each missing key
+
+  size_t Size() const { return keys.Count(); }
+};
+
+const std::vector<std::string>& KeySetNames();
+
+// The sets are the same in every run and on every machine. `iso-codes` has a size of its own and
+// ignores the one given; it is empty where the package is not installed.
+KeySet MakeKeySet(const std::string& name, size_t size);
+
+// How the sets are put together; for MakeKeySet and IsoCodes.cpp.
+void AddEntry(KeySet& set, std::string_view key, std::string_view valueInUTF8);
+void AddIsoCodes(KeySet& set);

@@ -1,0 +1,41 @@
+// Questions to a dictionary, laid out in the order in which they are asked first.
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <string_view>
+#include <vector>
+
+#include "KeySet.h"
+
+struct Query {
+  const char* text;  // `$$$/Key=Default text`
+  const char* key;   // `/Key`, terminated
+  uint32_t keyLength;
+  uint32_t defaultLength;
+  uint32_t number;  // of the key; those that the set lacks are numbered after those it has
+
+  std::string_view Key() const { return {key, keyLength}; }
+  uint32_t TextLength() const { return 3 + keyLength + 1 + defaultLength; }
+  std::string_view DefaultText() const { return {text + 3 + keyLength + 1, defaultLength}; }
+};
+
+class Queries {
+ public:
+  Queries(const PackedTexts<char>& keys, const PackedTexts<char>& defaultTexts, size_t firstNumber);
+
+  // Every key once, in random order.
+  std::span<const Query> Once() const { return {queries.data(), keyCount}; }
+
+  // Every key equally often and kLeast queries at least, each time round in another random order:
+  // no processor learns so many by heart.
+  std::span<const Query> Many() const { return queries; }
+
+ private:
+  static constexpr size_t kLeast = 100'000;
+
+  size_t keyCount;
+  std::vector<char> texts;
+  std::vector<char> bareKeys;
+  std::vector<Query> queries;
+};

@@ -1,0 +1,24 @@
+// What was measured of one key set.
+#pragma once
+
+#include <boost/json/object.hpp>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "Subject.h"
+
+class Results {
+ public:
+  // One more round of a measure.
+  void Note(const Subject& subject, const std::string& measure, double value) {
+    rounds[{subject.name, measure}].push_back(value);
+  }
+
+  // By subject and measure, the least and the median of the rounds.
+  boost::json::object Records() const;
+
+ private:
+  std::map<std::pair<std::string, std::string>, std::vector<double>> rounds;
+};
