@@ -35,6 +35,11 @@ void* Arena::HandOut(Chunk& chunk, uint8_t* place) noexcept {
   return ::new (place) Header{&chunk} + 1;
 }
 
+void Arena::Expect(uint64_t byteCount) noexcept {
+  const uint64_t most = std::min<uint64_t>(byteCount, platform::kHugePage);
+  nextChunkSize = std::max(nextChunkSize, static_cast<size_t>(most));
+}
+
 void* Arena::Allocate(uint64_t size) {
   constexpr uint64_t kAlignment = alignof(Header);
   const uint64_t needed = sizeof(Header) + (size + kAlignment - 1) / kAlignment * kAlignment;

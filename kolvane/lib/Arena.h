@@ -18,6 +18,9 @@ class Arena {
   Arena& operator=(const Arena&) = delete;
   ~Arena() { Retire(); }
 
+  // Has the next chunk be large enough for this many bytes, as far as chunks become so large.
+  void Expect(uint64_t byteCount) noexcept;
+
   // Aligned for pointers. Throws std::bad_alloc.
   void* Allocate(uint64_t size);
 

@@ -29,6 +29,14 @@ Recognised Recognise(std::istream& image) {
   return isBinary ? Recognised::kBinary : Recognised::kText;
 }
 
+// Leaves the stream at its start.
+uint64_t SizeOf(std::istream& image) {
+  image.seekg(0, std::ios::end);
+  const std::streamoff end = image.tellg();
+  image.seekg(0);
+  return end > 0 ? static_cast<uint64_t>(end) : 0;
+}
+
 // Whether a text image, whose last line has been read, ended there and ended well.
 void CheckTextEnd(std::istream& image, TextEncoding encoding, LoadStatus& status) {
   if (image.bad()) return;  // and leaves the load interrupted
@@ -69,6 +77,9 @@ void DictionaryTable::Load(std::istream& image) {
 void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
   lastLoad->format = ImageFormat::kText;
   lastLoad->encoding = reader.Encoding();
+  const uint64_t size = SizeOf(image);
+  memory.runs.Expect(size);
+  memory.entries.Expect(size / 2);
   while (const uint16_t* line = reader.GetNextLine()) {
     if (line[0] == 0) continue;
     switch (StoreLine({line, reader.LineLength()})) {

@@ -5,14 +5,11 @@
 
 #include "Converters.h"
 #include "DictionaryTable.h"
-#include "Scan.h"
 #include "TextSyntax.h"
 
 using tovali_private::ConvertToUnicode;
 using tovali_private::KeyedRun;
-using tovali_private::RunBefore;
 using tovali_private::SplitKolvane;
-using tovali_private::StartsEscape;
 using tovali_private::Unescape;
 using tovali_private::UnicodeBuffer;
 
@@ -24,18 +21,16 @@ void DictionaryTable::MakeDefault() noexcept {
 
 namespace {
 
-// Whether it is its own translation in every code page, and with nothing to decode.
-bool IsPlain(std::span<const char> text) noexcept {
-  const auto isSpecial = [](char byte) {
-    const auto value = static_cast<uint8_t>(byte);
-    return value >= 0x80 || StartsEscape(value);
-  };
-  return RunBefore(text, isSpecial) == text.size();
+// Whether it is ASCII, which stands for itself in every code page.
+bool IsASCII(std::span<const char> text) noexcept {
+  uint8_t all = 0;
+  for (const char byte : text) all |= static_cast<uint8_t>(byte);
+  return all < 0x80;
 }
 
 KolvaneString DecodeDefaultText(std::span<const char> text, const int* selector) {
   const bool isMultibyte = selector != nullptr && *selector != 0;
-  if (isMultibyte && !IsPlain(text)) {
+  if (isMultibyte && !IsASCII(text)) {
     UnicodeBuffer units;
     ConvertToUnicode(text.data(), text.size(), units, selector);
     return Unescape({units.Data(), units.Length()});

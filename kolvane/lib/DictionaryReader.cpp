@@ -14,16 +14,12 @@ namespace {
 constexpr uint16_t kByteOrderMark = 0xFEFF;
 constexpr uint16_t kSwappedByteOrderMark = 0xFFFE;
 
-constexpr bool EndsLine(uint16_t unit) noexcept {
-  return unit == 0x000A || unit == 0x000D || unit == 0x2028 || unit == 0x2029;
-}
+// What ends a line, and the zero that ends the input too.
+using UnicodeEnds = UnitSet<0, 0x000A, 0x000D, 0x2028, 0x2029>;
+using MultibyteEnds = UnitSet<0, 0x0A, 0x0D>;
 
 constexpr uint16_t Swapped(uint16_t unit) noexcept {
   return static_cast<uint16_t>(unit << 8 | unit >> 8);
-}
-
-constexpr bool EndsLine(uint8_t byte) noexcept {
-  return byte == 0x0A || byte == 0x0D;
 }
 
 }  // namespace
@@ -79,7 +75,7 @@ const uint16_t* UnicodeReader::GetNextLine() {
       if (line.Length() == 0) return nullptr;
       break;
     }
-    if (EndsLine(unit)) break;
+    if (UnicodeEnds::Has(unit)) break;
     line.Append(unit);
   }
   line.Append(0);
@@ -95,8 +91,7 @@ void UnicodeReader::TakeHeldUnits() {
     const std::span<uint16_t> block = line.Extend(std::min(held.size() / 2, kBlock));
     std::copy_n(held.data(), block.size_bytes(), reinterpret_cast<uint8_t*>(block.data()));
     if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), Swapped);
-    const size_t run = RunBefore(std::span<const uint16_t>(block),
-                                 [](uint16_t unit) { return unit == 0 || EndsLine(unit); });
+    const size_t run = UnicodeEnds::RunBefore(std::span<const uint16_t>(block));
     line.SetLength(line.Length() - static_cast<uint32_t>(block.size() - run));
     Skip(2 * run);
     if (run < kBlock) return;
@@ -128,7 +123,7 @@ const uint16_t* MultibyteReader::GetNextLine() {
       if (bytes.Length() == 0) return nullptr;
       break;
     }
-    if (EndsLine(byte)) break;
+    if (MultibyteEnds::Has(byte)) break;
     bytes.Append(byte);
   }
   ConvertToUnicode(reinterpret_cast<const char*>(bytes.Data()), bytes.Length(), line);
@@ -139,7 +134,7 @@ const uint16_t* MultibyteReader::GetNextLine() {
 // Takes the bytes up to the first that ends the line or the input.
 void MultibyteReader::TakeHeldBytes() {
   const auto held = Held();
-  const size_t run = RunBefore(held, [](uint8_t byte) { return byte == 0 || EndsLine(byte); });
+  const size_t run = MultibyteEnds::RunBefore(held);
   const std::span<uint8_t> block = bytes.Extend(run);
   std::copy_n(held.data(), run, block.data());
   Skip(run);

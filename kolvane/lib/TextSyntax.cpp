@@ -15,19 +15,19 @@ constexpr uint16_t kQuote = '"';
 constexpr uint16_t kCaret = '^';
 constexpr uint16_t kBackslash = '\\';
 
-size_t FindUnit(std::span<const char> text, char unit) noexcept {
-  return std::min(std::string_view(text.data(), text.size()).find(unit), text.size());
+size_t KeyLength(std::span<const char> text) noexcept {
+  return std::min(std::string_view(text.data(), text.size()).find('='), text.size());
 }
 
-size_t FindUnit(Units text, uint16_t unit) noexcept {
-  return RunBefore(text, [unit](uint16_t each) { return each == unit; });
+size_t KeyLength(Units text) noexcept {
+  return UnitSet<'='>::RunBefore(text);
 }
 
 // The place of the first double quote from `start` on that no backslash immediately precedes, or
 // the line's length. Only the one unit before a quote counts.
 size_t FindQuote(Units line, size_t start) noexcept {
   for (size_t at = start;; ++at) {
-    at += FindUnit(line.subspan(at), kQuote);
+    at += UnitSet<kQuote>::RunBefore(line.subspan(at));
     if (at == line.size() || at == 0 || line[at - 1] != kBackslash) return at;
   }
 }
@@ -123,7 +123,7 @@ std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept
     if (text.size() < 3 || text[1] != '$' || text[2] != '$') return std::nullopt;
     text = text.subspan(3);
   }
-  const size_t keyLength = FindUnit(text, Unit{'='});
+  const size_t keyLength = KeyLength(text);
   const size_t valueStart = std::min(keyLength + 1, text.size());
   return SplitText<Unit>{text.first(keyLength), text.subspan(valueStart)};
 }
@@ -132,7 +132,7 @@ template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noex
 template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
 Units Unescape(Units text, std::vector<uint16_t>& decoded) {
-  if (RunBefore(text, StartsEscape) == text.size()) return text;
+  if (EscapeStarts::RunBefore(text) == text.size()) return text;
   decoded.resize(text.size());
   uint16_t* const end = ExpandNamedCharacters(decoded.data(), DecodeEscapes(text, decoded.data()));
   decoded.resize(static_cast<size_t>(end - decoded.data()));

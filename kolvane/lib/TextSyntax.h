@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "KolvaneString.h"
+#include "Scan.h"
 
 namespace tovali_private {
 
@@ -34,10 +35,8 @@ std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept
 extern template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noexcept;
 extern template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
-// Whether the unit can be the first of something that Unescape decodes.
-constexpr bool StartsEscape(uint16_t unit) noexcept {
-  return unit == '^' || unit == '\\' || unit == '#';
-}
+// What can begin something that Unescape decodes.
+using EscapeStarts = UnitSet<'^', '\\', '#'>;
 
 // Decodes caret and backslash escapes, then named characters such as `#{nbsp}`; what it does not
 // know stays as it is. The result is never longer than the text. The second form gives the text
