@@ -8,14 +8,21 @@ namespace {
 bool gWatching = false;
 bool gFailed = false;
 size_t gTotalBytes = 0;
+ptrdiff_t gLiveBlocks = 0;
 size_t gUntilFailure = 0;
 
 bool MayAllocate(size_t size) {
   if (!gWatching) return true;
   gTotalBytes += size;
-  if (gUntilFailure == 0 || --gUntilFailure != 0) return true;
-  gFailed = true;
-  return false;
+  gFailed |= gUntilFailure == 1;
+  if (gUntilFailure != 0 && --gUntilFailure == 0) return false;
+  ++gLiveBlocks;
+  return true;
+}
+
+void Free(void* block) {
+  if (gWatching && block != nullptr) --gLiveBlocks;
+  std::free(block);
 }
 
 }  // namespace
@@ -23,6 +30,7 @@ bool MayAllocate(size_t size) {
 AllocationMeter::AllocationMeter(size_t failAt) {
   gFailed = false;
   gTotalBytes = 0;
+  gLiveBlocks = 0;
   gUntilFailure = failAt;
   gWatching = true;
 }
@@ -33,6 +41,9 @@ AllocationMeter::~AllocationMeter() {
 
 size_t AllocationMeter::TotalBytes() const {
   return gTotalBytes;
+}
+ptrdiff_t AllocationMeter::LiveBlocks() const {
+  return gLiveBlocks;
 }
 bool AllocationMeter::Failed() const {
   return gFailed;
@@ -55,20 +66,20 @@ void* operator new[](size_t size, const std::nothrow_t& tag) noexcept {
   return operator new(size, tag);
 }
 void operator delete(void* block) noexcept {
-  std::free(block);
+  Free(block);
 }
 void operator delete[](void* block) noexcept {
-  std::free(block);
+  Free(block);
 }
 void operator delete(void* block, size_t) noexcept {
-  std::free(block);
+  Free(block);
 }
 void operator delete[](void* block, size_t) noexcept {
-  std::free(block);
+  Free(block);
 }
 void operator delete(void* block, const std::nothrow_t&) noexcept {
-  std::free(block);
+  Free(block);
 }
 void operator delete[](void* block, const std::nothrow_t&) noexcept {
-  std::free(block);
+  Free(block);
 }

@@ -13,5 +13,6 @@ class AllocationMeter {
   AllocationMeter& operator=(const AllocationMeter&) = delete;
 
   size_t TotalBytes() const;
+  ptrdiff_t LiveBlocks() const;  // those freed that were allocated before count less than nothing
   bool Failed() const;
 };

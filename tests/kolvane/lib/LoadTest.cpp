@@ -4,6 +4,9 @@
 #include <algorithm>
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <chrono>
+#include <cstdio>
+#include <fstream>
+#include <optional>
 #include <random>
 #include <sstream>
 
@@ -262,15 +265,21 @@ TEST(Load, SurvivesEveryFailedAllocation) {
     size_t failures = 0;
     for (bool failed = true; failed; failures += failed) {
       DictionaryTable table;
+      bool loaded = false;
       boost::interprocess::ibufferstream stream(image.data(), image.size());
       {
         const AllocationMeter meter(failures + 1);
         try {
           table.Load(stream);
+          loaded = true;
           table.Translate("$$$/none=x^ny", nullptr);
+          table.LastLoad();  // looks into every bucket
         } catch (const std::bad_alloc&) {
         }
         failed = meter.Failed();
+      }
+      if (loaded) {
+        ASSERT_EQ(ContentsOf(table), twin.AllContents());
       }
       for (const auto& entry : ContentsOf(table)) {
         ASSERT_NE(std::find(possible.begin(), possible.end(), entry), possible.end());
@@ -282,6 +291,56 @@ TEST(Load, SurvivesEveryFailedAllocation) {
     }
     EXPECT_GE(failures, 8u);
   }
+}
+
+// Dictionaries that are loaded over and over again, and a translation that outlives its own.
+TEST(Load, KeepsNoMemoryOfWhatItReplaced) {
+  std::string image;
+  for (int i = 0; i < 500; ++i) image += "\"$$$/key" + std::to_string(i) + "=value " + std::to_string(i) + "\"\n";
+  const AllocationMeter meter;
+  {
+    std::optional<TranslatedString> kept;
+    {
+      DictionaryTable table;
+      ptrdiff_t most = 0;
+      for (int round = 0; round < 40; ++round) {
+        boost::interprocess::ibufferstream stream(image.data(), image.size());
+        table.Load(stream);
+        if (round < 4) most = std::max(most, meter.LiveBlocks());
+        ASSERT_LE(meter.LiveBlocks(), most + 2) << round;
+      }
+      kept.emplace(table.Translate("$$$/key77=none", nullptr));
+    }
+    EXPECT_LE(meter.LiveBlocks(), 1);
+    uint16_t units[9];
+    kept->CopyTo(units, 9, true);
+    EXPECT_TRUE(std::equal(units, units + 9, u"value 77"));
+  }
+  EXPECT_EQ(meter.LiveBlocks(), 0);
+}
+
+// Streams that hold all, a little, or nothing of what they read in memory.
+TEST(Load, ReadsEveryKindOfStream) {
+  const std::string path = testing::TempDir() + "kolvane-image";
+  std::vector<std::string> images = ValidImages();
+  for (size_t i = 0; i < 3; ++i) images.push_back(images[i] + images[i].substr(2) + images[i].substr(1));  // shifted by a byte
+  for (const std::string& image : images) {
+    std::ofstream(path, std::ios::binary) << image;
+    DictionaryTable expected;
+    Load(expected, image);
+    for (const std::streamsize held : {0, 1, 7, 8, 4096}) {
+      std::vector<char> memory(static_cast<size_t>(held));
+      std::ifstream stream;
+      stream.rdbuf()->pubsetbuf(held != 0 ? memory.data() : nullptr, held);
+      stream.open(path, std::ios::binary);
+      DictionaryTable table;
+      table.Load(stream);
+      ASSERT_EQ(ContentsOf(table), ContentsOf(expected)) << held;
+      ASSERT_EQ(table.LastLoad().damage, expected.LastLoad().damage) << held;
+      ASSERT_EQ(table.LastLoad().damageOffset, expected.LastLoad().damageOffset) << held;
+    }
+  }
+  std::remove(path.c_str());
 }
 
 // Counts that promise the world.
