@@ -54,8 +54,9 @@ uint32_t HashItem::WriteValue(std::ostream& out, bool binary, const int* selecto
 }
 
 ByteRunKey::ByteRunKey(const uint8_t* bytes, uint32_t byteCount, bool copy)
-    : ByteRunKey(copy ? CopyOf({bytes, byteCount}) : bytes, byteCount,
-                 copy ? Storage::kAllocated : Storage::kBorrowed) {}
+    : ByteRunKey(bytes, byteCount, copy ? Storage::kAllocated : Storage::kBorrowed) {
+  if (copy) data = CopyOf(Bytes());
+}
 
 ByteRunKey::ByteRunKey(const ByteRunKey& other) : ByteRunKey(other.data, other.length, true) {}
 
