@@ -44,9 +44,9 @@ struct Writer {
 
   template <class Units>
   bool PutAll(const char* bytes, size_t count, const Units& units) noexcept {
-    if (count > capacity) return false;
-    for (size_t i = 0; i < count; ++i) out[i] = units[static_cast<uint8_t>(bytes[i])];
-    total = count;
+    if (count > capacity - total) return false;
+    for (size_t i = 0; i < count; ++i) out[total + i] = units[static_cast<uint8_t>(bytes[i])];
+    total += count;
     return true;
   }
 

@@ -8,12 +8,13 @@
 namespace platform {
 namespace {
 
-constexpr bool IsLarge(size_t size) noexcept {
-  return size >= kHugePage / 2;
-}
-
 constexpr size_t WholePages(size_t size) noexcept {
   return (size + kHugePage - 1) / kHugePage * kHugePage;
+}
+
+// Huge pages are for what fills them.
+constexpr bool FillsHugePages(size_t size) noexcept {
+  return size <= SIZE_MAX - 2 * kHugePage && WholePages(size) - size <= size / 8;
 }
 
 // They begin at multiples of their size.
@@ -34,12 +35,11 @@ void* MapHugePages(size_t size) noexcept {
 }  // namespace
 
 void* AllocateMemory(size_t size) noexcept {
-  if (!IsLarge(size)) return ::operator new(size, std::nothrow);
-  return size <= SIZE_MAX - 2 * kHugePage ? MapHugePages(WholePages(size)) : nullptr;
+  return FillsHugePages(size) ? MapHugePages(WholePages(size)) : ::operator new(size, std::nothrow);
 }
 
 void FreeMemory(void* memory, size_t size) noexcept {
-  if (!IsLarge(size)) {
+  if (!FillsHugePages(size)) {
     ::operator delete(memory);
   } else if (memory != nullptr) {
     munmap(memory, WholePages(size));

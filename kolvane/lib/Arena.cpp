@@ -36,8 +36,9 @@ void* Arena::HandOut(Chunk& chunk, uint8_t* place) noexcept {
 }
 
 void Arena::Expect(uint64_t byteCount) noexcept {
-  const uint64_t most = std::min<uint64_t>(byteCount, platform::kHugePage);
-  nextChunkSize = std::max(nextChunkSize, static_cast<size_t>(most));
+  constexpr size_t kMost = platform::kHugePage;
+  const size_t expected = byteCount < kMost / 2 ? static_cast<size_t>(byteCount) : kMost;
+  nextChunkSize = std::max(nextChunkSize, expected);
 }
 
 void* Arena::Allocate(uint64_t size) {

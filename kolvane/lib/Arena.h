@@ -8,7 +8,7 @@ namespace tovali_private {
 
 // Hands memory out of chunks, in the order in which it lies there. A chunk is given back when all
 // that was handed out of it has been freed, which may be after the arena's own end; until then what
-// was freed is not used again. Chunks grow with what the arena holds.
+// was freed is not used again. Chunks grow with what the arena has handed out, to two megabytes.
 //
 // An arena and all that it hands out stay on one thread at a time.
 class Arena {

@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <istream>
 #include <limits>
-#include <memory>
 #include <utility>
 
 #include "Converters.h"
@@ -86,10 +85,7 @@ struct Tables1_5 {
 // are in UTF-16 already.
 class BinaryLoader {
  public:
-  BinaryLoader(std::istream& image, const std::shared_ptr<LoadStatus>& loadStatus)
-      : source(image), status(*loadStatus) {
-    stored.status = loadStatus;
-  }
+  BinaryLoader(std::istream& image, LoadStatus& loadStatus) : source(image), status(loadStatus) {}
 
   // Hands the groups to the table, and returns whether the body was there to its end.
   bool LoadInto(DictionaryTable& table);
@@ -136,7 +132,6 @@ bool BinaryLoader::LoadInto(DictionaryTable& table) {
     return whole;
   }
   StoredImage converted;
-  converted.status = stored.status;
   converted.keysChecked = true;
   try {
     ConvertValues(converted);
@@ -188,7 +183,6 @@ bool BinaryLoader::ReadTables(Tables1_5& tables) {
 
 bool BinaryLoader::ParseGroups1_5(const Tables1_5& tables) {
   const size_t groupCount = tables.counts.size() / 4;
-  stored.groups.reserve(groupCount);
   StoredGroup group;
   for (size_t i = 0; i < groupCount; ++i) {
     const uint64_t lengthsEnd = uint64_t{4} * Read32(&tables.counts[4 * i]);
@@ -200,7 +194,7 @@ bool BinaryLoader::ParseGroups1_5(const Tables1_5& tables) {
     group.entryCount = 0;
     CheckBucket(group.bucket, tables.bucketsAt + 2 * i);
     const bool whole = TakeEntries1_5(group, static_cast<size_t>(lengthsEnd));
-    stored.groups.push_back(group);
+    if (group.entryCount != 0) stored.groups.push_back(group);
     if (!whole) return false;
   }
   return true;
@@ -232,7 +226,10 @@ bool BinaryLoader::ParseBody1_0() {
   stored.dataOffset = source.Position() + 4;
   stored.lengthsBetween = 8;
   source.ReadUpTo(stored.data, std::numeric_limits<uint64_t>::max());
-  return ParseGroups1_0(records, recordsAt);
+  const bool whole = ParseGroups1_0(records, recordsAt);
+  stored.data.resize(stored.groups.empty() ? 0 : stored.groups.back().dataEnd);
+  stored.data.shrink_to_fit();
+  return whole;
 }
 
 // Entries follow one another; offsets only tell, by their differences, where one group ends.
@@ -246,7 +243,7 @@ bool BinaryLoader::ParseGroups1_0(const Bytes& records, uint64_t recordsAt) {
     group.entryCount = 0;
     CheckBucket(group.bucket, recordsAt + at);
     const bool whole = TakeEntries1_0(group, place, end);
-    stored.groups.push_back(group);
+    if (group.entryCount != 0) stored.groups.push_back(group);
     if (!whole) return false;
     if (place != end) Note(LoadDamage::kBadOffset, recordsAt + endAt);
   }
@@ -329,13 +326,12 @@ bool BinaryLoader::Stop(LoadDamage met, uint64_t offset) {
 
 }  // namespace
 
-int LoadBinary(DictionaryTable& table, std::istream& image,
-               const std::shared_ptr<LoadStatus>& status) {
-  status->format = ImageFormat::kBinaryOther;
+int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status) {
+  status.format = ImageFormat::kBinaryOther;
   BinaryLoader loader(image, status);
   const bool whole = loader.LoadInto(table);
-  status->damage = loader.Damage();
-  status->damageOffset = loader.DamageOffset();
+  status.damage = loader.Damage();
+  status.damageOffset = loader.DamageOffset();
   return whole ? 0 : -1;
 }
 

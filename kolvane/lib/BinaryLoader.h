@@ -12,7 +12,6 @@
 #pragma once
 
 #include <iosfwd>
-#include <memory>
 #include <string_view>
 
 #include "LoadStatus.h"
@@ -31,7 +30,6 @@ inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
 // Nothing that an image says is trusted: a count or a length that exceeds what is left of the
 // stream is a short read, and is found out before anything is allocated for it. What was read
 // before a stop, or before a value whose conversion throws OVErrException, stays in the table.
-int LoadBinary(DictionaryTable& table, std::istream& image,
-               const std::shared_ptr<LoadStatus>& status);
+int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status);
 
 }  // namespace tovali_private

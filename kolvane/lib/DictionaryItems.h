@@ -89,7 +89,8 @@ class DictionaryEntry;
 // side.
 class KeyedRun final : public ByteRunValue {
  public:
-  // Copies both. Throws std::bad_alloc.
+  // Copies both. Goes with the last handle to it, of which there is none yet. Throws
+  // std::bad_alloc.
   static KeyedRun* Create(Arena& arena, std::span<const uint8_t> key,
                           std::span<const uint8_t> bytes);
 
@@ -126,6 +127,7 @@ class DictionaryEntry final : public ByteRunKey {
   static std::unique_ptr<DictionaryEntry> Create(EntryMemory& memory, const ByteRunKey& key,
                                                  std::span<const uint16_t> text);
 
+  ~DictionaryEntry() override { run.entry = nullptr; }
   static void operator delete(void* entry) noexcept { Arena::Free(entry); }
 
   uint32_t SerializedSize() const override;

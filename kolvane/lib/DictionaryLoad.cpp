@@ -58,12 +58,13 @@ void CheckTextEnd(std::istream& image, TextEncoding encoding, LoadStatus& status
 }  // namespace
 
 void DictionaryTable::Load(std::istream& image) {
-  lastLoad = std::make_shared<LoadStatus>();
-  lastLoad->damage = LoadDamage::kInterrupted;  // until the load has come to an end
+  lastLoad = {};
+  ++loadNumber;
+  lastLoad.damage = LoadDamage::kInterrupted;  // until the load has come to an end
   const auto reader = DictionaryReader::Create(&image);
   switch (Recognise(image)) {
     case Recognised::kTooShort:
-      lastLoad->damage = LoadDamage::kTooShort;
+      lastLoad.damage = LoadDamage::kTooShort;
       break;
     case Recognised::kText:
       LoadText(image, *reader);
@@ -75,8 +76,8 @@ void DictionaryTable::Load(std::istream& image) {
 }
 
 void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
-  lastLoad->format = ImageFormat::kText;
-  lastLoad->encoding = reader.Encoding();
+  lastLoad.format = ImageFormat::kText;
+  lastLoad.encoding = reader.Encoding();
   const uint64_t size = SizeOf(image);
   memory.runs.Expect(size);
   memory.entries.Expect(size / 2);
@@ -84,17 +85,17 @@ void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
     if (line[0] == 0) continue;
     switch (StoreLine({line, reader.LineLength()})) {
       case StoredLine::kDropped:
-        ++lastLoad->linesDropped;
+        ++lastLoad.linesDropped;
         break;
       case StoredLine::kReplaced:
-        ++lastLoad->entriesReplaced;
+        ++lastLoad.entriesReplaced;
         [[fallthrough]];
       case StoredLine::kAdded:
-        ++lastLoad->entriesAdded;
+        ++lastLoad.entriesAdded;
         break;
     }
   }
-  CheckTextEnd(image, reader.Encoding(), *lastLoad);
+  CheckTextEnd(image, reader.Encoding(), lastLoad);
 }
 
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
@@ -107,7 +108,7 @@ StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
   const ByteRunKey key(narrowed.data(), static_cast<uint32_t>(narrowed.size()), false);
   index.Prepare(key.Bytes());
   auto entry = DictionaryEntry::Create(memory, key, split->value);
-  index.ReserveOne();
+  MakeRoom(key.Hash(kBucketCount));
   const bool replaces = Detach(key) != nullptr;
   Insert(std::move(entry));
   return replaces ? StoredLine::kReplaced : StoredLine::kAdded;

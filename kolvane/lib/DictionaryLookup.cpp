@@ -2,9 +2,11 @@
 #include <algorithm>
 #include <boost/container/small_vector.hpp>
 #include <cstring>
+#include <limits>
 
 #include "Converters.h"
 #include "DictionaryTable.h"
+#include "OVErrException.h"
 #include "TextSyntax.h"
 
 using tovali_private::ConvertToUnicode;
@@ -29,6 +31,8 @@ bool IsASCII(std::span<const char> text) noexcept {
 }
 
 KolvaneString DecodeDefaultText(std::span<const char> text, const int* selector) {
+  constexpr size_t kMost = std::numeric_limits<int>::max();
+  if (text.size() > kMost) throw OVErrException(kErrorConversionFailed);
   const bool isMultibyte = selector != nullptr && *selector != 0;
   if (isMultibyte && !IsASCII(text)) {
     UnicodeBuffer units;

@@ -23,7 +23,7 @@ void NoteWrongBucket(LoadStatus& status, uint64_t offset) {
 
 DictionaryTable::~DictionaryTable() {
   if (defaultDictionary == this) defaultDictionary = nullptr;
-  Clear();
+  DestroyEntries();
 }
 
 KeyedRun* DictionaryTable::FindRun(const ByteRunKey& key) {
@@ -57,19 +57,23 @@ void DictionaryTable::Unlink(HashItem& item) noexcept {
 
 void DictionaryTable::Insert(std::unique_ptr<DictionaryEntry> entry) {
   const uint32_t bucket = entry->Hash(kBucketCount);
-  if (waiting.Any()) Settle(bucket);
-  index.ReserveOne();
+  MakeRoom(bucket);
   LinkAtHead(bucket, std::move(entry), true);
 }
 
-void DictionaryTable::Defer(tovali_private::StoredImage&& image) {
-  const std::shared_ptr<LoadStatus> status = image.status;
-  status->entriesAdded += waiting.Add(std::move(image));
+void DictionaryTable::MakeRoom(uint32_t bucket) {
+  if (waiting.Any()) Settle(bucket);
+  index.ReserveOne();
+}
+
+void DictionaryTable::Defer(StoredImage&& image) {
+  image.load = loadNumber;
+  lastLoad.entriesAdded += waiting.Add(std::move(image));
 }
 
 const LoadStatus& DictionaryTable::LastLoad() {
   for (uint32_t bucket = 0; waiting.Any() && bucket < kBucketCount; ++bucket) Settle(bucket);
-  return *lastLoad;
+  return lastLoad;
 }
 
 const HashItem* DictionaryTable::Bucket(uint32_t bucket) {
@@ -94,13 +98,18 @@ void DictionaryTable::SettleLastOf(StoredGroup& group) {
   if (canBeFound) index.ReserveOne();
   const bool hides = LinkAtHead(group.bucket, std::move(entry), canBeFound);
   image.DropLastOf(group);
-  if (hides) ++image.status->entriesReplaced;
-  if (!canBeFound && !image.keysChecked) NoteWrongBucket(*image.status, stored.offset);
+  if (image.load != loadNumber) return;
+  if (hides) ++lastLoad.entriesReplaced;
+  if (!canBeFound && !image.keysChecked) NoteWrongBucket(lastLoad, stored.offset);
 }
 
 void DictionaryTable::Clear() noexcept {
   waiting.Clear();
   index.Clear();
+  DestroyEntries();
+}
+
+void DictionaryTable::DestroyEntries() noexcept {
   for (HashItem*& head : buckets) {
     while (head != nullptr) {
       const std::unique_ptr<HashItem> item(head);

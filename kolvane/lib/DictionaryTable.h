@@ -23,7 +23,8 @@ class DictionaryReader;
 enum class StoredLine : uint8_t { kDropped, kAdded, kReplaced };
 
 // Owns its entries. Not for concurrent use: even a lookup writes to the table, and values are
-// shared with plain reference counts.
+// shared with plain reference counts. The memory of an entry that is replaced comes back with that
+// of the entries that were made next to it.
 class DictionaryTable {
  public:
   using DictionaryEntry = tovali_private::DictionaryEntry;
@@ -59,7 +60,8 @@ class DictionaryTable {
   //
   // The selector (Converters.h) says what the default text is encoded in; with null and 0 each of
   // its bytes becomes the unit of the same value. Keys are compared as bytes. Throws OVErrException
-  // when the default text cannot be converted.
+  // when the default text cannot be converted, and std::bad_alloc. The first lookup in a bucket
+  // also takes what it takes to make the entries that a binary image has there.
   TranslatedString Translate(const char* text, const int* selector);
 
   // Puts the definition of one line of text (TextSyntax.h) in place of the one that its key had. A
@@ -75,7 +77,8 @@ class DictionaryTable {
   // Takes out what Find finds; an equal key behind it is found from then on.
   std::unique_ptr<DictionaryEntry> Detach(const ByteRunKey& key);
 
-  // Puts an entry at the head of its bucket, in front of any of the same key.
+  // Puts an entry at the head of its bucket, in front of any of the same key. Destroys it when it
+  // throws.
   void Insert(std::unique_ptr<DictionaryEntry> entry);
 
   // The first item of a bucket's chain, or null.
@@ -92,6 +95,8 @@ class DictionaryTable {
  private:
   tovali_private::KeyedRun* FindRun(const ByteRunKey& key);
   void Settle(uint32_t bucket);
+  void MakeRoom(uint32_t bucket);
+  void DestroyEntries() noexcept;
   void SettleLastOf(tovali_private::StoredGroup& group);
   bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry,
                   bool canBeFound) noexcept;
@@ -106,7 +111,8 @@ class DictionaryTable {
   tovali_private::WaitingGroups waiting;
   tovali_private::KeyIndex index;
 
-  std::shared_ptr<LoadStatus> lastLoad = std::make_shared<LoadStatus>();
+  LoadStatus lastLoad;
+  uint64_t loadNumber = 0;  // of the latest load
 
   static DictionaryTable* defaultDictionary;  // owned by whoever owns the table
 };

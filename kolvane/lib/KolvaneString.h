@@ -9,7 +9,8 @@
 namespace tovali_private {
 
 // Counts its handles and destroys itself when the last one lets go. The count is a plain integer:
-// handles that share an object stay on one thread at a time.
+// handles that share an object stay on one thread at a time, and so do all that come from one
+// dictionary, which share memory.
 class RefCountObj {
  public:
   RefCountObj(const RefCountObj&) = delete;
@@ -31,7 +32,8 @@ class RefCountObj {
 // A run of bytes, in one block of memory with the object.
 class ByteRunValue : public RefCountObj {
  public:
-  // Copies the bytes. Throws std::bad_alloc.
+  // Copies the bytes. Goes with the last handle to it, of which there is none yet. Throws
+  // std::bad_alloc.
   static ByteRunValue* Create(const uint8_t* bytes, uint32_t byteCount);
 
   // Null when there are none.

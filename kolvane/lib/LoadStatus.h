@@ -42,7 +42,8 @@ struct LoadStatus {
   uint32_t entriesReplaced = 0;  // those of them whose key the table held already: in text the
                                  // older entry is gone, in a binary image it stays, hidden
   uint32_t linesDropped = 0;     // lines whose text begins with `$` or `$$` but not `$$$`
-  LoadDamage damage = LoadDamage::kNone;  // what ended the load, or else the first that it met
+  LoadDamage damage = LoadDamage::kNone;  // what ended the load, or else the first of its groups,
+                                          // or else of its keys
 
   // Where that was, in bytes from the image's start: the field that is wrong or cut short; for a
   // binary image that was interrupted, the entry. 0 where there is no such place.

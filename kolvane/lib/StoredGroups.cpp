@@ -46,21 +46,25 @@ void StoredImage::DropLastOf(StoredGroup& group) const noexcept {
 
 uint32_t WaitingGroups::Add(StoredImage&& image) {
   if (newest == nullptr) newest = std::make_unique<Queues>();
-  images.push_front(std::move(image));
-  StoredImage& stored = images.front();
-  stored.place = images.begin();
+  images.push_back(std::make_unique<StoredImage>(std::move(image)));
+  StoredImage& stored = *images.back();
+  stored.place = images.size() - 1;
   uint32_t entryCount = 0;
   for (StoredGroup& group : stored.groups) {
-    if (group.entryCount == 0 || group.bucket >= kBucketCount) continue;
-    StoredGroup*& last = (*newest)[group.bucket];
-    group.next = last != nullptr ? std::exchange(last->next, &group) : &group;
-    last = &group;
-    group.image = &stored;
-    ++stored.waitingGroups;
+    if (group.bucket >= kBucketCount) continue;
+    Enqueue(group, stored);
     entryCount += group.entryCount;
   }
-  if (stored.waitingGroups == 0) images.pop_front();
+  if (stored.waitingGroups == 0) images.pop_back();
   return entryCount;
+}
+
+void WaitingGroups::Enqueue(StoredGroup& group, StoredImage& image) noexcept {
+  StoredGroup*& last = (*newest)[group.bucket];
+  group.next = last != nullptr ? std::exchange(last->next, &group) : &group;
+  last = &group;
+  group.image = &image;
+  ++image.waitingGroups;
 }
 
 StoredGroup* WaitingGroups::Oldest(uint32_t bucket) const noexcept {
@@ -74,7 +78,14 @@ void WaitingGroups::DropOldest(uint32_t bucket) noexcept {
   last->next = oldest->next;
   if (oldest == last) last = nullptr;
   StoredImage& image = *oldest->image;
-  if (--image.waitingGroups == 0) images.erase(image.place);
+  if (--image.waitingGroups == 0) Drop(image);
+}
+
+void WaitingGroups::Drop(StoredImage& image) noexcept {
+  const size_t place = image.place;
+  images.back()->place = place;
+  std::swap(images[place], images.back());
+  images.pop_back();
 }
 
 void WaitingGroups::Clear() noexcept {

@@ -8,13 +8,11 @@
 #include <boost/container/vector.hpp>
 #include <cstddef>
 #include <cstdint>
-#include <list>
 #include <memory>
 #include <span>
 #include <vector>
 
 #include "DictionaryItems.h"
-#include "LoadStatus.h"
 
 namespace tovali_private {
 
@@ -56,14 +54,14 @@ struct StoredImage {
   Bytes lengths;  // 32 bits for the key of each entry, and for its value
   Bytes data;     // the key of each entry, and its value
   std::vector<StoredGroup> groups;
-  std::shared_ptr<LoadStatus> status;  // of the load
-  bool keysChecked = false;            // whether they were found to belong to their buckets or not
+  uint64_t load = 0;         // the number of the load that brought it
+  bool keysChecked = false;  // whether they were found to belong to their buckets or not
 
   uint64_t dataOffset = 0;      // of the first key in the image that was loaded,
   uint32_t lengthsBetween = 0;  // where this many bytes stand between a value and the next key
 
   uint32_t waitingGroups = 0;  // these two belong to WaitingGroups
-  std::list<StoredImage>::iterator place;
+  size_t place = 0;
 };
 
 // For every bucket the groups that wait for it, oldest first. Owns their images, each for as long
@@ -74,8 +72,8 @@ class WaitingGroups {
 
   bool Any() const noexcept { return !images.empty(); }
 
-  // Adds those groups of an image that have entries, and a bucket. Returns the number of entries.
-  // Throws std::bad_alloc, and has then added none.
+  // Adds those groups of an image whose buckets there are; all have entries. Returns the number of
+  // entries. Throws std::bad_alloc, and has then added none.
   uint32_t Add(StoredImage&& image);
 
   // The bucket's oldest group, or null.
@@ -87,7 +85,10 @@ class WaitingGroups {
   void Clear() noexcept;
 
  private:
-  std::list<StoredImage> images;
+  void Enqueue(StoredGroup& group, StoredImage& image) noexcept;
+  void Drop(StoredImage& image) noexcept;
+
+  std::vector<std::unique_ptr<StoredImage>> images;
 
   // The newest group of each bucket; behind it, in a ring, stands the oldest.
   using Queues = std::array<StoredGroup*, kBucketCount>;

@@ -5,7 +5,8 @@
 
 #include "KolvaneString.h"
 
-// Holds on to the translation, whose text it shares with the dictionary and which outlives it.
+// Holds on to the translation, whose text it shares with the dictionary and which outlives it, with
+// up to two megabytes of the dictionary's memory. Stays on the dictionary's thread.
 class TranslatedString {
  public:
   explicit TranslatedString(const KolvaneString& translation) noexcept : text(translation) {}
