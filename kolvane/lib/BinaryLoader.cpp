@@ -183,6 +183,8 @@ bool BinaryLoader::ReadTables(Tables1_5& tables) {
 
 bool BinaryLoader::ParseGroups1_5(const Tables1_5& tables) {
   const size_t groupCount = tables.counts.size() / 4;
+  const size_t entryCount = stored.lengths.size() / StoredImage::kLengthsSize;
+  stored.groups.reserve(std::min(groupCount, entryCount));
   StoredGroup group;
   for (size_t i = 0; i < groupCount; ++i) {
     const uint64_t lengthsEnd = uint64_t{4} * Read32(&tables.counts[4 * i]);
