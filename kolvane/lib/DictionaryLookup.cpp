@@ -51,12 +51,12 @@ TranslatedString DictionaryTable::Translate(const char* text, const int* selecto
   if (text == nullptr || *text == 0) return TranslatedString(KolvaneString());
   const auto split = SplitKolvane<char>({text, std::strlen(text)});
   if (!split) return TranslatedString(KolvaneString());
-  const ByteRunKey key(reinterpret_cast<const uint8_t*>(split->key.data()),
-                       static_cast<uint32_t>(split->key.size()), false);
+  const std::span<const uint8_t> key(reinterpret_cast<const uint8_t*>(split->key.data()),
+                                     split->key.size());
   KeyedRun* found = FindRun(key);
   const bool fallsBack = defaultDictionary != nullptr && defaultDictionary != this;
   if (found == nullptr && fallsBack) found = defaultDictionary->FindRun(key);
-  if (found != nullptr) return TranslatedString(KolvaneString(*found));
+  if (found != nullptr) return TranslatedString(*found);
   if (split->value.empty()) return TranslatedString(KolvaneString());
   return TranslatedString(DecodeDefaultText(split->value, selector));
 }

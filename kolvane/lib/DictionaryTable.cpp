@@ -26,13 +26,16 @@ DictionaryTable::~DictionaryTable() {
   DestroyEntries();
 }
 
-KeyedRun* DictionaryTable::FindRun(const ByteRunKey& key) {
-  if (waiting.Any()) Settle(key.Hash(kBucketCount));
-  return index.Find(key.Bytes());
+KeyedRun* DictionaryTable::FindRun(std::span<const uint8_t> key) {
+  if (waiting.Any()) {
+    const ByteRunKey probe(key.data(), static_cast<uint32_t>(key.size()), false);
+    Settle(probe.Hash(kBucketCount));
+  }
+  return index.Find(key);
 }
 
 DictionaryTable::DictionaryEntry* DictionaryTable::Find(const ByteRunKey& key) {
-  const KeyedRun* const run = FindRun(key);
+  const KeyedRun* const run = FindRun(key.Bytes());
   return run != nullptr ? run->entry : nullptr;
 }
 

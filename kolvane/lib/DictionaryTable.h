@@ -93,7 +93,7 @@ class DictionaryTable {
   void Clear() noexcept;
 
  private:
-  tovali_private::KeyedRun* FindRun(const ByteRunKey& key);
+  tovali_private::KeyedRun* FindRun(std::span<const uint8_t> key);
   void Settle(uint32_t bucket);
   void MakeRoom(uint32_t bucket);
   void DestroyEntries() noexcept;

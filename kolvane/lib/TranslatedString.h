@@ -10,6 +10,8 @@
 class TranslatedString {
  public:
   explicit TranslatedString(const KolvaneString& translation) noexcept : text(translation) {}
+  explicit TranslatedString(tovali_private::ByteRunValue& translation) noexcept
+      : text(translation) {}
 
   // Code units, one more than the translation has: room for a terminator.
   uint32_t BufferSize() const noexcept { return text.Length() + 1; }

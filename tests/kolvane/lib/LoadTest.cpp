@@ -386,7 +386,7 @@ TEST(Load, KeepsNoMemoryOfWhatItReplaced) {
 
 // Streams that hold all, a little, or nothing of what they read in memory.
 TEST(Load, ReadsEveryKindOfStream) {
-  const std::string path = testing::TempDir() + "kolvane-image";
+  const std::string path = testing::TempDir() + "kolvane-image" + std::to_string(std::random_device()());
   std::vector<std::string> images = ValidImages();
   for (size_t i = 0; i < 3; ++i) images.push_back(images[i] + images[i].substr(2) + images[i].substr(1));  // shifted by a byte
   for (const std::string& image : images) {
@@ -423,8 +423,8 @@ TEST(Load, AllocatesNoMoreThanTheImageJustifies) {
   }
 }
 
-// Keys of which every one falls into the same bucket: loading them four times as often must not
-// take sixteen times as long.
+// Keys of which every one falls into the same bucket: loading eight times as many must not take
+// sixty-four times as long.
 TEST(Load, TakesTimeLinearInTheImage) {
   const auto secondsFor = [](int count) {
     std::string image;
@@ -435,7 +435,7 @@ TEST(Load, TakesTimeLinearInTheImage) {
       image += "\"$$$" + key + "=x\"\n";
     }
     double best = 1e9;
-    for (int round = 0; round < 3; ++round) {
+    for (int round = 0; round < 5; ++round) {
       const auto start = std::chrono::steady_clock::now();
       DictionaryTable table;
       Load(table, image);
@@ -444,7 +444,7 @@ TEST(Load, TakesTimeLinearInTheImage) {
     }
     return best;
   };
-  EXPECT_LT(secondsFor(40000), 10 * secondsFor(10000));
+  EXPECT_LT(secondsFor(80000), 25 * secondsFor(10000));
 }
 
 }  // namespace
