@@ -33,9 +33,9 @@ uint64_t ProcessSeed() {
 
 // Whoever has found the run copies its bytes next: they are on their way while keys are compared.
 bool HasKey(const KeyedRun& run, std::span<const uint8_t> key) noexcept {
-  const auto start = reinterpret_cast<uintptr_t>(&run);
-  __builtin_prefetch(reinterpret_cast<const void*>(start + 64));
-  __builtin_prefetch(reinterpret_cast<const void*>(start + 128));
+  const auto* const start = reinterpret_cast<const char*>(&run);
+  __builtin_prefetch(start + 64);
+  __builtin_prefetch(start + 128);
   const auto own = run.Key();
   return own.size() == key.size() &&
          (key.empty() || std::memcmp(own.data(), key.data(), key.size()) == 0);
