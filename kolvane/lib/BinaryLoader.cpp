@@ -15,6 +15,11 @@ namespace {
 
 using Bytes = StoredImage::Bytes;
 
+// Of version 1.0: a record's size, where its offset stands in it, and the size of a length.
+constexpr size_t kRecordSize = 6;
+constexpr size_t kOffsetInRecord = 2;
+constexpr size_t kLengthSize = 4;
+
 // An image's stream, with what is left of it known beforehand.
 class ImageSource {
  public:
@@ -224,9 +229,9 @@ bool BinaryLoader::ParseBody1_0() {
   const uint64_t recordsAt = source.Position();
   if (recordCount == 0) return Stop(LoadDamage::kNoGroups, recordsAt - sizeof recordCount);
   Bytes records;
-  if (!source.Read(records, uint64_t{6} * recordCount)) return StopShort();
-  stored.dataOffset = source.Position() + 4;
-  stored.lengthsBetween = 8;
+  if (!source.Read(records, uint64_t{kRecordSize} * recordCount)) return StopShort();
+  stored.dataOffset = source.Position() + kLengthSize;
+  stored.lengthsBetween = 2 * kLengthSize;
   source.ReadUpTo(stored.data, std::numeric_limits<uint64_t>::max());
   const bool whole = ParseGroups1_0(records, recordsAt);
   stored.data.resize(stored.groups.empty() ? 0 : stored.groups.back().dataEnd);
@@ -236,10 +241,10 @@ bool BinaryLoader::ParseBody1_0() {
 
 // Entries follow one another; offsets only tell, by their differences, where one group ends.
 bool BinaryLoader::ParseGroups1_0(const Bytes& records, uint64_t recordsAt) {
-  uint64_t place = Read32(&records[2]);
+  uint64_t place = Read32(&records[kOffsetInRecord]);
   StoredGroup group;
-  for (size_t at = 0; at + 6 < records.size(); at += 6) {
-    const size_t endAt = at + 8;
+  for (size_t at = 0; at + kRecordSize < records.size(); at += kRecordSize) {
+    const size_t endAt = at + kRecordSize + kOffsetInRecord;
     const uint32_t end = Read32(&records[endAt]);
     group.bucket = Read16(&records[at]);
     group.entryCount = 0;
@@ -266,7 +271,7 @@ bool BinaryLoader::TakeEntry1_0(StoredGroup& group) {
   std::span<const uint8_t> key, value;
   if (!TakeField1_0(key) || !TakeField1_0(value)) return false;
   for (const auto field : {key, value}) {
-    stored.lengths.insert(stored.lengths.end(), field.data() - 4, field.data());
+    stored.lengths.insert(stored.lengths.end(), field.data() - kLengthSize, field.data());
     std::copy(field.begin(), field.end(), stored.data.data() + group.dataEnd);
     group.dataEnd += field.size();
   }
@@ -278,11 +283,11 @@ bool BinaryLoader::TakeEntry1_0(StoredGroup& group) {
 bool BinaryLoader::TakeField1_0(std::span<const uint8_t>& field) {
   const auto left = std::span<const uint8_t>(stored.data).subspan(taken1_0);
   const uint64_t offset = source.Position() - left.size();
-  if (left.size() < 4) return Stop(LoadDamage::kShortRead, offset);
+  if (left.size() < kLengthSize) return Stop(LoadDamage::kShortRead, offset);
   const uint32_t length = Read32(left.data());
-  if (length > left.size() - 4) return Stop(LoadDamage::kShortRead, offset + 4);
-  field = left.subspan(4, length);
-  taken1_0 += size_t{4} + length;
+  if (length > left.size() - kLengthSize) return Stop(LoadDamage::kShortRead, offset + kLengthSize);
+  field = left.subspan(kLengthSize, length);
+  taken1_0 += kLengthSize + length;
   return true;
 }
 

@@ -5,7 +5,6 @@
 #include <cstring>
 #include <iosfwd>
 #include <memory>
-#include <new>
 #include <span>
 
 #include "Arena.h"
@@ -105,7 +104,7 @@ class KeyedRun final : public ByteRunValue {
 
   const uint8_t* KeyBytes() const noexcept { return reinterpret_cast<const uint8_t*>(this + 1); }
 
-  uint32_t keyLength;
+  uint32_t keyLength;  // fills the gap that the base leaves
 
  public:
   DictionaryEntry* entry = nullptr;  // while there is one

@@ -72,8 +72,8 @@ class WaitingGroups {
 
   bool Any() const noexcept { return !images.empty(); }
 
-  // Adds those groups of an image whose buckets there are; all have entries. Returns the number of
-  // entries. Throws std::bad_alloc, and has then added none.
+  // Adds those groups of an image whose buckets there are, and returns how many entries they have.
+  // Throws std::bad_alloc, and has then added none.
   uint32_t Add(StoredImage&& image);
 
   // The bucket's oldest group, or null.
