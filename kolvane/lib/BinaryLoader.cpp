@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <istream>
 #include <limits>
+#include <optional>
 #include <utility>
 
 #include "Converters.h"
@@ -86,21 +87,20 @@ struct Tables1_5 {
   uint64_t bucketsAt = 0;
 };
 
-// Takes an image apart into groups, with a look at lengths, but none at keys, nor at values that
-// are in UTF-16 already.
-class BinaryLoader {
+// Takes an image apart into groups, with a look at lengths, but none at keys and values.
+class BinaryParser {
  public:
-  BinaryLoader(std::istream& image, LoadStatus& loadStatus) : source(image), status(loadStatus) {}
+  BinaryParser(std::istream& image, StoredImage& storedImage, LoadStatus& loadStatus)
+      : source(image), stored(storedImage), status(loadStatus) {}
 
-  // Hands the groups to the table, and returns whether the body was there to its end.
-  bool LoadInto(DictionaryTable& table);
+  // Returns whether the body was there to its end.
+  bool Parse();
 
-  // What ended the load, or else the first damage that it met.
+  // What ended the reading, or else the first damage that it met.
   LoadDamage Damage() const noexcept { return damage; }
   uint64_t DamageOffset() const noexcept { return damageOffset; }
 
  private:
-  bool Parse();
   bool ParseBody1_5();
   bool ReadTables(Tables1_5& tables);
   bool ParseGroups1_5(const Tables1_5& tables);
@@ -112,58 +112,35 @@ class BinaryLoader {
   bool TakeEntry1_0(StoredGroup& group);
   bool TakeField1_0(std::span<const uint8_t>& field);
 
-  void ConvertValues(StoredImage& converted);
-  std::span<const uint8_t> Converted(std::span<const uint8_t> value);
-
   void CheckBucket(uint32_t bucket, uint64_t offset);
   void Note(LoadDamage met, uint64_t offset);
   bool Stop(LoadDamage met, uint64_t offset);
   bool StopShort() { return Stop(LoadDamage::kShortRead, source.Position()); }
 
   ImageSource source;
-  StoredImage stored;
+  StoredImage& stored;
   LoadStatus& status;
   LoadDamage damage = LoadDamage::kNone;
   uint64_t damageOffset = 0;
-  int valueEncoding = 0;  // as stored, and the selector of its conversion
-  size_t taken1_0 = 0;    // bytes of a version 1.0 body
-  UnicodeBuffer valueUnits;
+  size_t taken1_0 = 0;  // bytes of a version 1.0 body
 };
 
-bool BinaryLoader::LoadInto(DictionaryTable& table) {
-  const bool whole = Parse();
-  if (valueEncoding == 0) {
-    table.Defer(std::move(stored));
-    return whole;
-  }
-  StoredImage converted;
-  converted.keysChecked = true;
-  try {
-    ConvertValues(converted);
-  } catch (...) {
-    table.Defer(std::move(converted));
-    throw;
-  }
-  table.Defer(std::move(converted));
-  return whole;
-}
-
-bool BinaryLoader::Parse() {
+bool BinaryParser::Parse() {
   Bytes header;
   if (!source.Read(header, kBinaryMagic.size() + 3)) return StopShort();
   const uint8_t* const fields = header.data() + kBinaryMagic.size();
   const int major = static_cast<int8_t>(fields[0]);
   const int minor = static_cast<int8_t>(fields[1]);
-  valueEncoding = static_cast<int8_t>(fields[2]);
-  status.encoding = valueEncoding == 0   ? TextEncoding::kUTF16LE
-                    : valueEncoding == 1 ? TextEncoding::kUTF8
-                                         : TextEncoding::kCodePage;
+  const int valueEncoding = static_cast<int8_t>(fields[2]);
+  status.encoding = valueEncoding == 0               ? TextEncoding::kUTF16LE
+                    : valueEncoding == kUTF8Selector ? TextEncoding::kUTF8
+                                                     : TextEncoding::kCodePage;
   if (major == 1 && minor == 5) return ParseBody1_5();
   if (major == 1 && minor == 0) return ParseBody1_0();
   return Stop(LoadDamage::kUnsupportedVersion, kBinaryMagic.size());
 }
 
-bool BinaryLoader::ParseBody1_5() {
+bool BinaryParser::ParseBody1_5() {
   status.format = ImageFormat::kBinary1_5;
   Tables1_5 tables;
   if (!ReadTables(tables)) return false;
@@ -174,7 +151,7 @@ bool BinaryLoader::ParseBody1_5() {
   return ParseGroups1_5(tables);
 }
 
-bool BinaryLoader::ReadTables(Tables1_5& tables) {
+bool BinaryParser::ReadTables(Tables1_5& tables) {
   uint32_t groupCount = 0;
   if (!source.Read(groupCount)) return StopShort();
   if (groupCount == 0) return Stop(LoadDamage::kNoGroups, source.Position() - sizeof groupCount);
@@ -186,7 +163,7 @@ bool BinaryLoader::ReadTables(Tables1_5& tables) {
   return source.Read(tables.buckets, uint64_t{2} * groupCount) || StopShort();
 }
 
-bool BinaryLoader::ParseGroups1_5(const Tables1_5& tables) {
+bool BinaryParser::ParseGroups1_5(const Tables1_5& tables) {
   const size_t groupCount = tables.counts.size() / 4;
   const size_t entryCount = stored.lengths.size() / StoredImage::kLengthsSize;
   stored.groups.reserve(std::min(groupCount, entryCount));
@@ -207,7 +184,7 @@ bool BinaryLoader::ParseGroups1_5(const Tables1_5& tables) {
   return true;
 }
 
-bool BinaryLoader::TakeEntries1_5(StoredGroup& group, size_t lengthsEnd) {
+bool BinaryParser::TakeEntries1_5(StoredGroup& group, size_t lengthsEnd) {
   for (; group.lengthsEnd < lengthsEnd; group.lengthsEnd += StoredImage::kLengthsSize) {
     const uint8_t* const lengths = &stored.lengths[group.lengthsEnd];
     const size_t keyLength = Read32(lengths);
@@ -222,7 +199,7 @@ bool BinaryLoader::TakeEntries1_5(StoredGroup& group, size_t lengthsEnd) {
   return true;
 }
 
-bool BinaryLoader::ParseBody1_0() {
+bool BinaryParser::ParseBody1_0() {
   status.format = ImageFormat::kBinary1_0;
   uint16_t recordCount = 0;
   if (!source.Read(recordCount)) return StopShort();
@@ -240,7 +217,7 @@ bool BinaryLoader::ParseBody1_0() {
 }
 
 // Entries follow one another; offsets only tell, by their differences, where one group ends.
-bool BinaryLoader::ParseGroups1_0(const Bytes& records, uint64_t recordsAt) {
+bool BinaryParser::ParseGroups1_0(const Bytes& records, uint64_t recordsAt) {
   uint64_t place = Read32(&records[kOffsetInRecord]);
   StoredGroup group;
   for (size_t at = 0; at + kRecordSize < records.size(); at += kRecordSize) {
@@ -257,7 +234,7 @@ bool BinaryLoader::ParseGroups1_0(const Bytes& records, uint64_t recordsAt) {
   return true;
 }
 
-bool BinaryLoader::TakeEntries1_0(StoredGroup& group, uint64_t& place, uint32_t end) {
+bool BinaryParser::TakeEntries1_0(StoredGroup& group, uint64_t& place, uint32_t end) {
   while (place < end) {
     const size_t entryAt = taken1_0;
     if (!TakeEntry1_0(group)) return false;
@@ -267,7 +244,7 @@ bool BinaryLoader::TakeEntries1_0(StoredGroup& group, uint64_t& place, uint32_t 
 }
 
 // Moves the entry's key and value, which stand among the lengths, up to those before them.
-bool BinaryLoader::TakeEntry1_0(StoredGroup& group) {
+bool BinaryParser::TakeEntry1_0(StoredGroup& group) {
   std::span<const uint8_t> key, value;
   if (!TakeField1_0(key) || !TakeField1_0(value)) return false;
   for (const auto field : {key, value}) {
@@ -280,7 +257,7 @@ bool BinaryLoader::TakeEntry1_0(StoredGroup& group) {
   return true;
 }
 
-bool BinaryLoader::TakeField1_0(std::span<const uint8_t>& field) {
+bool BinaryParser::TakeField1_0(std::span<const uint8_t>& field) {
   const auto left = std::span<const uint8_t>(stored.data).subspan(taken1_0);
   const uint64_t offset = source.Position() - left.size();
   if (left.size() < kLengthSize) return Stop(LoadDamage::kShortRead, offset);
@@ -291,54 +268,85 @@ bool BinaryLoader::TakeField1_0(std::span<const uint8_t>& field) {
   return true;
 }
 
-// Stores the same entries with their values in UTF-16; those before a value that cannot be
-// converted also when it throws.
-void BinaryLoader::ConvertValues(StoredImage& converted) {
-  size_t lengthsAt = 0;
-  size_t dataAt = 0;
-  for (const StoredGroup& group : stored.groups) {
-    converted.BeginGroup(group.bucket);
-    for (; lengthsAt < group.lengthsEnd; lengthsAt += StoredImage::kLengthsSize) {
-      const StoredEntry entry = stored.EntryAt(lengthsAt, dataAt);
-      dataAt += entry.key.size() + entry.value.size();
-      status.damageOffset = entry.offset;  // should it interrupt the load
-      converted.Append(entry.key, Converted(entry.value));
-      const bool canBeFound = entry.Key().Hash(DictionaryTable::kBucketCount) == group.bucket;
-      if (!canBeFound) Note(LoadDamage::kWrongBucket, entry.offset);
-    }
-  }
-}
-
-std::span<const uint8_t> BinaryLoader::Converted(std::span<const uint8_t> value) {
-  ConvertToUnicode(reinterpret_cast<const char*>(value.data()), value.size(), valueUnits,
-                   &valueEncoding);
-  return {reinterpret_cast<const uint8_t*>(valueUnits.Data()), size_t{valueUnits.Length()} * 2};
-}
-
-void BinaryLoader::CheckBucket(uint32_t bucket, uint64_t offset) {
+void BinaryParser::CheckBucket(uint32_t bucket, uint64_t offset) {
   if (bucket >= DictionaryTable::kBucketCount) Note(LoadDamage::kBadBucket, offset);
 }
 
-void BinaryLoader::Note(LoadDamage met, uint64_t offset) {
+void BinaryParser::Note(LoadDamage met, uint64_t offset) {
   if (damage != LoadDamage::kNone) return;
   damage = met;
   damageOffset = offset;
 }
 
-bool BinaryLoader::Stop(LoadDamage met, uint64_t offset) {
+bool BinaryParser::Stop(LoadDamage met, uint64_t offset) {
   damage = met;
   damageOffset = offset;
   return false;
 }
 
+// Stores the same entries with their values in UTF-16; those before a value that cannot be
+// converted also when it throws. `misfiled` is where the
+// first entry stands that belongs to another bucket.
+void ConvertValues(const StoredImage& stored, StoredImage& converted, LoadStatus& status,
+                   std::optional<uint64_t>& misfiled) {
+  const int* const selector = SelectorFor(status.encoding);
+  UnicodeBuffer units;
+  const StoredGroup* current = nullptr;
+  converted.keysChecked = true;
+  stored.ForEachEntry([&](const StoredGroup& group, const StoredEntry& entry) {
+    if (std::exchange(current, &group) != &group) converted.BeginGroup(group.bucket);
+    status.damageOffset = entry.offset;  // should it interrupt the load
+    ConvertToUnicode(reinterpret_cast<const char*>(entry.value.data()), entry.value.size(), units,
+                     selector);
+    converted.Append(entry.key,
+                     {reinterpret_cast<const uint8_t*>(units.Data()), size_t{units.Length()} * 2});
+    const bool canBeFound = entry.Key().Hash(DictionaryTable::kBucketCount) == group.bucket;
+    if (!canBeFound && !misfiled) misfiled = entry.offset;
+  });
+}
+
+void DeferConverted(DictionaryTable& table, const StoredImage& stored, LoadStatus& status,
+                    std::optional<uint64_t>& misfiled) {
+  StoredImage converted;
+  try {
+    ConvertValues(stored, converted, status, misfiled);
+  } catch (...) {
+    table.Defer(std::move(converted));
+    throw;
+  }
+  table.Defer(std::move(converted));
+}
+
 }  // namespace
 
-int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status) {
+const int* SelectorFor(TextEncoding encoding) noexcept {
+  return encoding == TextEncoding::kUTF8 ? &kUTF8Selector : kDefaultSelector;
+}
+
+bool ParseBinary(std::istream& image, StoredImage& stored, LoadStatus& status) {
   status.format = ImageFormat::kBinaryOther;
-  BinaryLoader loader(image, status);
-  const bool whole = loader.LoadInto(table);
-  status.damage = loader.Damage();
-  status.damageOffset = loader.DamageOffset();
+  BinaryParser parser(image, stored, status);
+  const bool whole = parser.Parse();
+  status.damage = parser.Damage();
+  status.damageOffset = parser.DamageOffset();
+  return whole;
+}
+
+int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status) {
+  StoredImage stored;
+  LoadStatus parsed = status;
+  const bool whole = ParseBinary(image, stored, parsed);
+  status.format = parsed.format;
+  status.encoding = parsed.encoding;
+  std::optional<uint64_t> misfiled;
+  if (parsed.encoding == TextEncoding::kUTF16LE) {
+    table.Defer(std::move(stored));
+  } else {
+    DeferConverted(table, stored, status, misfiled);
+  }
+  const bool keyIsFirst = misfiled && parsed.damage == LoadDamage::kNone;
+  status.damage = keyIsFirst ? LoadDamage::kWrongBucket : parsed.damage;
+  status.damageOffset = keyIsFirst ? *misfiled : parsed.damageOffset;
   return whole ? 0 : -1;
 }
 

@@ -20,15 +20,26 @@ class DictionaryTable;
 
 namespace tovali_private {
 
+struct StoredImage;
+
 inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
 
-// Loads the image, whose stream stands at offset 0 and is known to begin with the magic, and
-// splices each of its groups into the bucket that the group names, where it stays as it is until
-// somebody looks into that bucket. Returns 0 when it read the body to its end and -1 when it
-// stopped before; `status` gets format, encoding, counts and damage.
+// Takes the image apart, whose stream stands at offset 0 and is known to begin with the magic:
+// `stored` gets its groups in their order, values as they are stored, and `status` format, encoding
+// and damage, but none of keys. Returns whether the body was there to its end.
 //
 // Nothing that an image says is trusted: a count or a length that exceeds what is left of the
-// stream is a short read, and is found out before anything is allocated for it. What was read
+// stream is a short read, and is found out before anything is allocated for it. Throws
+// std::bad_alloc.
+bool ParseBinary(std::istream& image, StoredImage& stored, LoadStatus& status);
+
+// The selector of the conversion (Converters.h) of values that are stored in `encoding`, which is
+// not UTF-16.
+const int* SelectorFor(TextEncoding encoding) noexcept;
+
+// Loads such an image and splices each of its groups into the bucket that the group names, where it
+// stays as it is until somebody looks into that bucket. Returns 0 when it read the body to its end
+// and -1 when it stopped before; `status` gets format, encoding, counts and damage. What was read
 // before a stop, or before a value whose conversion throws OVErrException, stays in the table.
 int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status);
 

@@ -8,8 +8,6 @@
 namespace tovali_private {
 namespace {
 
-constexpr int kSelectUTF8 = 1;
-
 uint32_t PlatformFailure() noexcept {
   const bool isShort = platform::GetLastError() == platform::kErrorInsufficientBuffer;
   return isShort ? kErrorBufferTooSmall : kErrorConversionFailed;
@@ -30,7 +28,7 @@ ConverterTable gConverterTable = {MultiByteToUnicodeLength, MultiByteToUnicode,
                                   UnicodeToMultiByteLength, UnicodeToMultiByte};
 
 uint32_t CodePageFor(const int* selector) noexcept {
-  const bool isUTF8 = selector != nullptr && *selector == kSelectUTF8;
+  const bool isUTF8 = selector != nullptr && *selector == kUTF8Selector;
   return isUTF8 ? platform::kCodePageUTF8 : platform::kCodePageSystem;
 }
 

@@ -17,6 +17,8 @@ namespace tovali_private {
 // The selector that stands in for a missing one; itself missing, and so the default code page.
 inline constexpr const int* kDefaultSelector = nullptr;
 
+inline constexpr int kUTF8Selector = 1;
+
 uint32_t CodePageFor(const int* selector) noexcept;
 
 // The four converters. They never throw: each returns 0, or kErrorBufferTooSmall when the output is

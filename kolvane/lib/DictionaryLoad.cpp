@@ -1,7 +1,5 @@
 // The road of an image into a dictionary.
-#include <algorithm>
 #include <array>
-#include <boost/container/small_vector.hpp>
 #include <istream>
 #include <string_view>
 #include <utility>
@@ -101,10 +99,7 @@ void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
   const auto split = tovali_private::SplitKolvane(tovali_private::EntryText(line));
   if (!split) return StoredLine::kDropped;
-  boost::container::small_vector<uint8_t, 256> narrowed(split->key.size(),
-                                                        boost::container::default_init);
-  std::transform(split->key.begin(), split->key.end(), narrowed.begin(),
-                 [](uint16_t unit) { return static_cast<uint8_t>(unit); });
+  const auto narrowed = tovali_private::NarrowKey(split->key);
   const ByteRunKey key(narrowed.data(), static_cast<uint32_t>(narrowed.size()), false);
   index.Prepare(key.Bytes());
   auto entry = DictionaryEntry::Create(memory, key, split->value);

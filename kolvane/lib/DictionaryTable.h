@@ -64,8 +64,8 @@ class DictionaryTable {
   // also takes what it takes to make the entries that a binary image has there.
   TranslatedString Translate(const char* text, const int* selector);
 
-  // Puts the definition of one line of text (TextSyntax.h) in place of the one that its key had. A
-  // key's units are narrowed to their low 8 bits. When it throws, the table is as it was.
+  // Puts the definition of one line of text (TextSyntax.h) in place of the one that its key had.
+  // When it throws, the table is as it was.
   StoredLine StoreLine(std::span<const uint16_t> line);
 
   // These work on the table's chains, and may have to make a bucket's entries first that a binary

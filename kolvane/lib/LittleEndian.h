@@ -18,6 +18,11 @@ inline uint32_t Read32(const uint8_t* bytes) noexcept {
   return Read16(bytes) | static_cast<uint32_t>(Read16(bytes + 2)) << 16;
 }
 
+inline void Write16(uint8_t* bytes, uint16_t value) noexcept {
+  bytes[0] = static_cast<uint8_t>(value);
+  bytes[1] = static_cast<uint8_t>(value >> 8);
+}
+
 inline void Write32(uint8_t* bytes, uint32_t value) noexcept {
   for (int i = 0; i < 4; ++i) bytes[i] = static_cast<uint8_t>(value >> (8 * i));
 }

@@ -33,7 +33,7 @@ struct StoredEntry {
   ByteRunKey Key() const { return {key.data(), static_cast<uint32_t>(key.size()), false}; }
 
   std::span<const uint8_t> key;
-  std::span<const uint8_t> value;  // UTF-16
+  std::span<const uint8_t> value;  // in a table UTF-16
   uint64_t offset;                 // of the key in the image that was loaded
 };
 
@@ -46,6 +46,20 @@ struct StoredImage {
   // Append puts an entry into the group that was begun last. Both throw std::bad_alloc.
   void BeginGroup(uint32_t bucket);
   void Append(std::span<const uint8_t> key, std::span<const uint8_t> value);
+
+  // Visits every entry, with its group, in their order; before any was dropped.
+  template <class Visit>
+  void ForEachEntry(Visit visit) const {
+    size_t lengthsAt = 0;
+    size_t dataAt = 0;
+    for (const StoredGroup& group : groups) {
+      for (; lengthsAt < group.lengthsEnd; lengthsAt += kLengthsSize) {
+        const StoredEntry entry = EntryAt(lengthsAt, dataAt);
+        dataAt += entry.key.size() + entry.value.size();
+        visit(group, entry);
+      }
+    }
+  }
 
   StoredEntry EntryAt(size_t lengthsAt, size_t dataAt) const noexcept;
   StoredEntry LastOf(const StoredGroup& group) const noexcept;  // there must be one

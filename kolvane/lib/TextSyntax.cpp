@@ -60,20 +60,10 @@ const Escape* FindEscape(uint16_t escapeCharacter, uint16_t letter) noexcept {
 
 // Returns where the decoded text ends.
 uint16_t* DecodeEscapes(Units text, uint16_t* out) noexcept {
-  for (size_t i = 0; i < text.size(); ++i) {
-    const uint16_t unit = text[i];
-    const bool escapes = IsEscapeCharacter(unit) && i + 1 < text.size();
-    if (!escapes) {
-      *out++ = unit;
-      continue;
-    }
-    const uint16_t letter = text[++i];
-    if (const Escape* escape = FindEscape(unit, letter)) {
-      *out++ = escape->character;
-    } else {
-      *out++ = unit;
-      if (letter != unit) *out++ = letter;
-    }
+  while (!text.empty()) {
+    const DecodedStart start = DecodeStart(text);
+    out = std::copy_n(start.units, start.count, out);
+    text = text.subspan(start.taken);
   }
   return out;
 }
@@ -108,6 +98,43 @@ constexpr char LetterFor(uint16_t unit) noexcept {
   }
 }
 
+bool IsWritableKey(std::span<const uint8_t> key) noexcept {
+  for (size_t i = 0; i < key.size(); ++i) {
+    const uint8_t byte = key[i];
+    if (byte == 0 || byte == '\n' || byte == '\r' || byte == '=') return false;
+    if (byte == kQuote && (i == 0 || key[i - 1] != kBackslash)) return false;
+  }
+  return true;
+}
+
+LineObstacle ObstacleIn(Units value) noexcept {
+  for (; !value.empty(); value = value.subspan(1)) {
+    switch (value.front()) {
+      case 0:
+        return LineObstacle::kZeroCharacter;
+      case 0x2028:
+      case 0x2029:
+        return LineObstacle::kLineSeparator;
+      case '#':
+        if (MatchNamedCharacter(value) != nullptr) return LineObstacle::kNamedCharacter;
+    }
+  }
+  return LineObstacle::kNone;
+}
+
+void AppendEscaped(uint16_t unit, std::vector<uint16_t>& line) {
+  const Escape* const escape =
+      std::find_if(std::begin(kBackslashEscapes), std::end(kBackslashEscapes),
+                   [unit](const Escape& each) { return each.character == unit; });
+  if (escape != std::end(kBackslashEscapes)) {
+    line.push_back(kBackslash);
+    unit = static_cast<uint16_t>(escape->letter);
+  } else if (IsEscapeCharacter(unit)) {
+    line.push_back(unit);
+  }
+  line.push_back(unit);
+}
+
 }  // namespace
 
 Units EntryText(Units line) noexcept {
@@ -115,6 +142,24 @@ Units EntryText(Units line) noexcept {
   if (opening == line.size()) return line;
   const size_t closing = FindQuote(line, opening + 1);
   return line.subspan(opening + 1, closing - opening - 1);
+}
+
+KeyBytes NarrowKey(Units key) {
+  KeyBytes bytes(key.size(), boost::container::default_init);
+  std::transform(key.begin(), key.end(), bytes.begin(),
+                 [](uint16_t unit) { return static_cast<uint8_t>(unit); });
+  return bytes;
+}
+
+DecodedStart DecodeStart(Units text) noexcept {
+  const uint16_t unit = text[0];
+  if (!IsEscapeCharacter(unit)) return {DecodedStart::kPlain, 1, 1, {unit}};
+  if (text.size() == 1) return {DecodedStart::kUnfinishedEscape, 1, 1, {unit}};
+  const uint16_t letter = text[1];
+  if (letter == unit) return {DecodedStart::kEscape, 2, 1, {unit}};
+  const Escape* const escape = FindEscape(unit, letter);
+  if (escape == nullptr) return {DecodedStart::kUnknownEscape, 2, 2, {unit, letter}};
+  return {DecodedStart::kEscape, 2, 1, {escape->character}};
 }
 
 template <class Unit>
@@ -156,6 +201,18 @@ std::optional<std::vector<uint16_t>> EscapeForText(Units text) {
     written.push_back(letter != 0 ? static_cast<uint16_t>(letter) : unit);
   }
   return written;
+}
+
+LineObstacle AppendLine(std::span<const uint8_t> key, Units value, std::vector<uint16_t>& line) {
+  if (!IsWritableKey(key)) return LineObstacle::kKey;
+  const LineObstacle obstacle = ObstacleIn(value);
+  if (obstacle != LineObstacle::kNone) return obstacle;
+  line.insert(line.end(), {kQuote, '$', '$', '$'});
+  line.insert(line.end(), key.begin(), key.end());
+  line.push_back('=');
+  for (const uint16_t unit : value) AppendEscaped(unit, line);
+  if (line.back() != kBackslash) line.push_back(kQuote);
+  return LineObstacle::kNone;
 }
 
 }  // namespace tovali_private

@@ -5,6 +5,7 @@
 // The functions take code units or bytes and give back parts of them; nothing here keeps state.
 #pragma once
 
+#include <boost/container/small_vector.hpp>
 #include <cstdint>
 #include <optional>
 #include <span>
@@ -38,6 +39,24 @@ extern template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const 
 // What can begin something that Unescape decodes.
 using EscapeStarts = UnitSet<'^', '\\', '#'>;
 
+// Keys are bytes: of each unit the low 8 bits.
+using KeyBytes = boost::container::small_vector<uint8_t, 256>;
+KeyBytes NarrowKey(std::span<const uint16_t> key);
+
+// What the first pass of Unescape, over the escapes, makes of the start of a text.
+struct DecodedStart {
+  enum Kind : uint8_t { kPlain, kEscape, kUnknownEscape, kUnfinishedEscape };
+
+  Kind kind = kPlain;
+  uint8_t taken = 1;  // units of the text, and what they decode to
+  uint8_t count = 1;
+  uint16_t units[2] = {};
+};
+
+// The text is not empty. An escape that is not known, and one without the unit that it escapes, is
+// given back as it is.
+DecodedStart DecodeStart(std::span<const uint16_t> text) noexcept;
+
 // Decodes caret and backslash escapes, then named characters such as `#{nbsp}`; what it does not
 // know stays as it is. The result is never longer than the text. The second form gives the text
 // back where there is nothing to decode, and otherwise stores in `decoded` what it gives.
@@ -48,5 +67,20 @@ std::span<const uint16_t> Unescape(std::span<const uint16_t> text, std::vector<u
 // none of them. Unescape undoes these escapes, but it also decodes what the text itself held of
 // escapes and named characters.
 std::optional<std::vector<uint16_t>> EscapeForText(std::span<const uint16_t> text);
+
+// Why no line defines a key with a value.
+enum class LineObstacle : uint8_t {
+  kNone,
+  kKey,            // the key has a zero, a line end, an equals sign, or a quote without a backslash
+  kZeroCharacter,  // the value has a zero,
+  kLineSeparator,  // or U+2028 or U+2029,
+  kNamedCharacter  // or the name of a named character spelt out: `#{amp}`
+};
+
+// Appends the line that defines the key, which is bytes, with the value: StoreLine stores exactly
+// them. No terminator is appended, and nothing at all where there is an obstacle. Where the value
+// ends in a backslash, the line has no closing quote: it would be taken for an escaped one.
+LineObstacle AppendLine(std::span<const uint8_t> key, std::span<const uint16_t> value,
+                        std::vector<uint16_t>& line);
 
 }  // namespace tovali_private

@@ -71,3 +71,10 @@ std::vector<std::string> CommandLine::Parse(int argc, const char* const* argv) {
   }
   return Operands(app.remaining());
 }
+
+void CheckFiles(const std::vector<std::string>& files) {
+  if (files.empty()) throw UsageError("no file is named");
+  if (std::count(files.begin(), files.end(), "-") > 1) {
+    throw UsageError("standard input is named twice");
+  }
+}

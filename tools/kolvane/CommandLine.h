@@ -29,3 +29,7 @@ class CommandLine {
  private:
   CLI::App app;
 };
+
+// For operands that name files to read: throws UsageError where there is none, and where standard
+// input (`-`), which can be read once, is named twice.
+void CheckFiles(const std::vector<std::string>& files);

@@ -3,10 +3,8 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <boost/interprocess/streams/bufferstream.hpp>
 #include <iostream>
 #include <limits>
-#include <map>
 #include <new>
 #include <optional>
 #include <string>
@@ -14,10 +12,11 @@
 
 #include "CommandLine.h"
 #include "Console.h"
+#include "DictionaryFile.h"
+#include "EncodingOption.h"
 #include "Exceptions.h"
 #include "ImageFile.h"
 #include "KernelTrace.h"
-#include "KolvaneDictionary.h"
 #include "LoadWarnings.h"
 #include "ResultText.h"
 #include "StandardOutput.h"
@@ -54,9 +53,6 @@ struct Request {
 };
 
 void AddOptions(CLI::App& options, Request& request) {
-  static const std::map<std::string, FileEncoding> kEncodings = {{"auto", FileEncoding::kAuto},
-                                                                 {"image", FileEncoding::kImage},
-                                                                 {"utf-8", FileEncoding::kUTF8}};
   const auto addFiles = [&](const char* name, std::vector<std::string>& files, const char* text) {
     options.add_option(name, files, text)
         ->type_name("FILE")
@@ -67,13 +63,7 @@ void AddOptions(CLI::App& options, Request& request) {
            "Look keys up in FILE; of several, the later wins");
   addFiles("--default-dictionary", request.defaultDictionaries,
            "Look up in FILE what the dictionaries lack");
-  options
-      .add_option_function<std::string>(
-          "--encoding", [&](const std::string& name) { request.encoding = kEncodings.at(name); },
-          "How FILE is handed over")
-      ->check(CLI::IsMember(&kEncodings))
-      ->type_name("HOW")
-      ->group("Dictionaries");
+  AddEncodingOption(options, request.encoding);
   options.add_flag("--nul", request.nul, "Keys and translations end in NUL, not in a line end")
       ->group("Input and output");
   options.add_flag("--trace", request.trace, "Print the calls to the kernel on standard error")
@@ -118,12 +108,10 @@ void Load(const ImageFile& file, Translator& translator) {
        [&] { translator.SetTranslations(image.units.get(), image.unitCount); });
 }
 
-// A translator does not tell how the loading of an image went; a dictionary does.
+// A translator does not tell how the loading of an image went; a table does.
 void Warn(const ImageFile& file) {
-  KolvaneDictionary dictionary;
-  boost::interprocess::ibufferstream image(file.bytes.data(), file.bytes.size());
-  dictionary.Load(image);
-  for (const std::string& warning : WarningsOf(file, dictionary.LastLoad())) Say(warning);
+  DictionaryTable table;
+  for (const std::string& warning : WarningsOf(file, LoadInto(table, file))) Say(warning);
 }
 
 // Loads the files in order, with their warnings. Returns whether all of them could be loaded.

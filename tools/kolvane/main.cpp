@@ -10,7 +10,10 @@
 #include <vector>
 
 #include "CommandLine.h"
+#include "CompileCommand.h"
 #include "Console.h"
+#include "ConvertCommand.h"
+#include "DumpCommand.h"
 #include "Messages.h"
 #include "OVErrException.h"
 #include "StandardOutput.h"
@@ -25,6 +28,9 @@ struct Command {
 };
 
 constexpr Command kCommands[] = {
+    {"compile", "make a binary image of dictionaries", RunCompile},
+    {"convert", "change the encoding of a text dictionary", RunConvert},
+    {"dump", "print a dictionary as text", RunDump},
     {"translate", "translate keys with dictionaries", RunTranslate},
 };
 
@@ -59,8 +65,7 @@ void PrintHelp() {
 
 void PrintVersion() {
   WriteOutput(
-      fmt::format("kolvane {}\nreads binary dictionaries of versions 1.0 and 1.5, and "
-                  "writes none\n",
+      fmt::format("kolvane {}\nreads and writes binary dictionaries of versions 1.0 and 1.5\n",
                   KOLVANE_VERSION));
 }
 

@@ -67,5 +67,7 @@ ImageFile ReadImageFile(const std::string& name, FileEncoding encoding) {
   std::string bytes = ReadBytes(name);
   const bool isUTF8 =
       encoding == FileEncoding::kUTF8 || (encoding == FileEncoding::kAuto && IsTextInUTF8(bytes));
-  return {name, isUTF8 && !bytes.empty() ? RecodedFromUTF8(name, bytes) : std::move(bytes)};
+  if (!isUTF8 || bytes.empty()) return {name, std::move(bytes), {}};
+  std::string image = RecodedFromUTF8(name, bytes);
+  return {name, std::move(image), std::move(bytes)};
 }

@@ -14,6 +14,7 @@ enum class FileEncoding {
 struct ImageFile {
   std::string name;   // as the user gave it; `-` is standard input
   std::string bytes;  // the image
+  std::string utf8;   // what the file holds, where the image is a recoding of it; else empty
 };
 
 // Throws Failure, with the file's name and the system's reason, for a file that cannot be read, and

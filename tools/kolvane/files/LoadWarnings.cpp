@@ -5,26 +5,9 @@
 #include <cstdint>
 
 #include "Messages.h"
+#include "TextLines.h"
 
 namespace {
-
-// The number, from 1, of the line of a text image that holds the byte at `offset`. CR LF ends one
-// line.
-size_t LineAt(std::string_view image, TextEncoding encoding, uint64_t offset) {
-  const size_t unitSize = encoding == TextEncoding::kCodePage ? 1 : 2;
-  const size_t low = encoding == TextEncoding::kUTF16BE ? 1 : 0;
-  size_t line = 1;
-  uint32_t before = 0;
-  for (size_t at = 0; at + unitSize <= offset; at += unitSize) {
-    uint32_t unit = static_cast<uint8_t>(image[at + low]);
-    if (unitSize == 2) unit |= uint32_t{static_cast<uint8_t>(image[at + 1 - low])} << 8;
-    const bool separator = unitSize == 2 && (unit == 0x2028 || unit == 0x2029);
-    const bool afterReturn = unit == '\n' && before == '\r';
-    if ((unit == '\n' && !afterReturn) || unit == '\r' || separator) ++line;
-    before = unit;
-  }
-  return line;
-}
 
 std::string DamageText(const ImageFile& file, const LoadStatus& status) {
   const uint64_t at = status.damageOffset;
@@ -37,7 +20,7 @@ std::string DamageText(const ImageFile& file, const LoadStatus& status) {
       return file.bytes.empty() ? "the file is empty" : "the file is too short for a dictionary";
     case LoadDamage::kZeroCharacter:
       return fmt::format("the text ends at a zero character at the start of line {}",
-                         LineAt(file.bytes, status.encoding, at));
+                         LineCounter(file.bytes, status.encoding).LineAt(at));
     case LoadDamage::kHalfUnit:
       return fmt::format("the text is cut short: byte {} is half a character", at);
     case LoadDamage::kShortRead:

@@ -1,38 +1,68 @@
 #include "Text.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <cstddef>
 
 #include "Converters.h"
 
-namespace {
+using tovali_private::kUTF8Selector;
 
-constexpr int kUTF8 = 1;
-
-}  // namespace
-
-std::string ToUTF8(std::span<const uint16_t> units) {
-  using namespace tovali_private;
-  const int size = CountMultiByte(units.data(), units.size(), &kUTF8);
+std::string ToMultiByte(std::span<const uint16_t> units, const int* selector) {
+  const int size = tovali_private::CountMultiByte(units.data(), units.size(), selector);
   std::string text(static_cast<size_t>(size), '\0');
-  ConvertToMultiByte(units.data(), units.size(), text.data(), size, &kUTF8);
+  tovali_private::ConvertToMultiByte(units.data(), units.size(), text.data(), size, selector);
   text.pop_back();
   return text;
 }
 
-std::vector<uint16_t> ToUTF16(std::string_view text) {
+std::vector<uint16_t> FromMultiByte(std::string_view text, const int* selector) {
   tovali_private::UnicodeBuffer units;
-  tovali_private::ConvertToUnicode(text.data(), text.size(), units, &kUTF8);
+  tovali_private::ConvertToUnicode(text.data(), text.size(), units, selector);
   return {units.Data(), units.Data() + units.Length()};
 }
 
-// Whatever is malformed becomes a replacement character beside those that the text holds itself.
+std::string ToUTF8(std::span<const uint16_t> units) {
+  return ToMultiByte(units, &kUTF8Selector);
+}
+
+std::vector<uint16_t> ToUTF16(std::string_view text) {
+  return FromMultiByte(text, &kUTF8Selector);
+}
+
+// What is malformed does not come back as it was.
+std::optional<size_t> MalformedUTF8At(std::string_view text) {
+  const std::string back = ToUTF8(ToUTF16(text));
+  const auto differs = std::ranges::mismatch(text, back);
+  if (differs.in1 == text.end() && differs.in2 == back.end()) return std::nullopt;
+  return static_cast<size_t>(differs.in1 - text.begin());
+}
+
 bool IsValidUTF8(std::string_view text) {
-  constexpr std::string_view kReplacement = "\xEF\xBF\xBD";
-  std::ptrdiff_t own = 0;
-  for (size_t at = text.find(kReplacement); at != text.npos; at = text.find(kReplacement, at + 3)) {
-    ++own;
-  }
-  const std::vector<uint16_t> units = ToUTF16(text);
-  return std::count(units.begin(), units.end(), uint16_t{0xFFFD}) == own;
+  return !MalformedUTF8At(text);
+}
+
+std::string KeyText(std::span<const uint8_t> key) {
+  const std::string_view text(reinterpret_cast<const char*>(key.data()), key.size());
+  if (IsValidUTF8(text)) return std::string(text);
+  return ToUTF8(std::vector<uint16_t>(key.begin(), key.end()));
+}
+
+char32_t CodePointAt(std::span<const uint16_t> units, size_t at) noexcept {
+  const char32_t first = units[at];
+  if (first < 0xD800 || first > 0xDBFF || at + 1 == units.size()) return first;
+  const char32_t second = units[at + 1];
+  if (second < 0xDC00 || second > 0xDFFF) return first;
+  return 0x10000 + ((first - 0xD800) << 10) + (second - 0xDC00);
+}
+
+size_t CodePointCount(std::span<const uint16_t> units) noexcept {
+  size_t count = 0;
+  for (size_t at = 0; at<units.size(); at += CodePointAt(units, at)> 0xFFFF ? 2 : 1) ++count;
+  return count;
+}
+
+std::string CodePointText(char32_t codePoint) {
+  return fmt::format("U+{:04X}", static_cast<uint32_t>(codePoint));
 }

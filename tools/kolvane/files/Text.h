@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -12,4 +13,23 @@
 std::string ToUTF8(std::span<const uint16_t> units);
 std::vector<uint16_t> ToUTF16(std::string_view text);
 
+// The same in the code page that a selector names (Converters.h).
+std::string ToMultiByte(std::span<const uint16_t> units, const int* selector);
+std::vector<uint16_t> FromMultiByte(std::string_view text, const int* selector);
+
+// The place of the first byte that belongs to no character.
+std::optional<size_t> MalformedUTF8At(std::string_view text);
 bool IsValidUTF8(std::string_view text);
+
+// A key, which is bytes, to be shown: as it is where it is UTF-8, else with a character for each
+// byte.
+std::string KeyText(std::span<const uint8_t> key);
+
+// The code point that begins at a unit of the text; an unpaired surrogate is one of its own.
+char32_t CodePointAt(std::span<const uint16_t> units, size_t at) noexcept;
+
+// Pairs of surrogates count once.
+size_t CodePointCount(std::span<const uint16_t> units) noexcept;
+
+// "U+0142"
+std::string CodePointText(char32_t codePoint);

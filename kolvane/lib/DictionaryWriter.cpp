@@ -1,0 +1,189 @@
+#include "DictionaryWriter.h"
+
+#include <algorithm>
+#include <limits>
+#include <ostream>
+#include <span>
+#include <sstream>
+#include <stdexcept>
+#include <string_view>
+
+#include "BinaryLoader.h"
+#include "Converters.h"
+#include "DictionaryTable.h"
+#include "LittleEndian.h"
+#include "StoredGroups.h"
+
+namespace tovali_private {
+namespace {
+
+using Entries = std::vector<const DictionaryEntry*>;
+using Bytes = std::span<const uint8_t>;
+using Units = std::span<const uint16_t>;
+
+constexpr uint64_t kMostImageBytes = std::numeric_limits<int32_t>::max() - 1;
+constexpr size_t kHeaderSize = kBinaryMagic.size() + 3;
+
+bool ComesBefore(const DictionaryEntry* one, const DictionaryEntry* other) noexcept {
+  const Bytes a = one->Bytes();
+  const Bytes b = other->Bytes();
+  return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end());
+}
+
+// What the header says of the values' encoding.
+uint8_t EncodingByte(TextEncoding values) noexcept {
+  switch (values) {
+    case TextEncoding::kUTF8:
+      return kUTF8Selector;
+    case TextEncoding::kCodePage:
+      return 2;
+    default:
+      return 0;
+  }
+}
+
+// Where what comes back from the encoding begins to differ, or else the value's length.
+size_t CarriedUnits(TextEncoding encoding, Bytes stored, Units value) {
+  if (encoding == TextEncoding::kUTF16LE) return value.size();
+  UnicodeBuffer buffer;
+  ConvertToUnicode(reinterpret_cast<const char*>(stored.data()), stored.size(), buffer,
+                   SelectorFor(encoding));
+  const Units back(buffer.Data(), buffer.Length());
+  const auto differs = std::ranges::mismatch(value, back);
+  const bool isSame = differs.in1 == value.end() && differs.in2 == back.end();
+  return isSame ? value.size() : static_cast<size_t>(differs.in1 - value.begin());
+}
+
+// Lays entries out as an image stores them, group by group.
+class ImageComposer {
+ public:
+  explicit ImageComposer(TextEncoding valueEncoding)
+      : encoding(valueEncoding), encodingByte(EncodingByte(valueEncoding)) {
+    written.exceptions(std::ios::badbit);
+  }
+
+  void Append(const DictionaryEntry& entry) {
+    const uint32_t bucket = entry.Hash(DictionaryTable::kBucketCount);
+    if (image.groups.empty() || image.groups.back().bucket != bucket) image.BeginGroup(bucket);
+    const int selector = encodingByte;
+    written.seekp(0);
+    const size_t keySize = entry.WriteKey(written, true, nullptr);
+    const size_t valueSize = entry.WriteValue(written, true, selector == 0 ? nullptr : &selector);
+    const std::string_view both = written.view();
+    const Bytes bytes(reinterpret_cast<const uint8_t*>(both.data()), keySize + valueSize);
+    image.Append(bytes.first(keySize), bytes.subspan(keySize));
+    const Units value = entry.Value().Units();
+    const size_t carried = CarriedUnits(encoding, bytes.subspan(keySize), value);
+    if (carried < value.size()) lost.push_back({&entry, carried});
+  }
+
+  const std::vector<LostValue>& Lost() const noexcept { return lost; }
+
+  // There is no image without a group.
+  const StoredImage& Finish() {
+    if (image.groups.empty()) image.BeginGroup(0);
+    return image;
+  }
+
+ private:
+  TextEncoding encoding;
+  uint8_t encodingByte;
+  std::ostringstream written;
+  StoredImage image;
+  std::vector<LostValue> lost;
+};
+
+void Put(std::ostream& out, Bytes bytes) {
+  out.write(reinterpret_cast<const char*>(bytes.data()),
+            static_cast<std::streamsize>(bytes.size()));
+}
+
+void Put16(std::ostream& out, size_t value) {
+  uint8_t bytes[2];
+  Write16(bytes, static_cast<uint16_t>(value));
+  Put(out, bytes);
+}
+
+void Put32(std::ostream& out, size_t value) {
+  uint8_t bytes[4];
+  Write32(bytes, static_cast<uint32_t>(value));
+  Put(out, bytes);
+}
+
+void PutHeader(std::ostream& out, BinaryVersion version, TextEncoding values) {
+  const uint8_t fields[] = {1, uint8_t{version == BinaryVersion::k1_5 ? uint8_t{5} : uint8_t{0}},
+                            EncodingByte(values)};
+  out.write(kBinaryMagic.data(), kBinaryMagic.size());
+  Put(out, fields);
+}
+
+void PutBody1_5(std::ostream& out, const StoredImage& image) {
+  Put32(out, image.groups.size());
+  for (const StoredGroup& group : image.groups) Put32(out, group.lengthsEnd / 4);
+  Put(out, image.lengths);
+  for (const StoredGroup& group : image.groups) Put16(out, group.bucket);
+  Put(out, image.data);
+}
+
+uint64_t Size1_5(const StoredImage& image) noexcept {
+  return kHeaderSize + 4 + 6 * uint64_t{image.groups.size()} + image.lengths.size() +
+         image.data.size();
+}
+
+// Each offset is the place in the file where the group before ends.
+void PutBody1_0(std::ostream& out, const StoredImage& image) {
+  const size_t recordCount = image.groups.size() + 1;
+  const size_t dataAt = kHeaderSize + 2 + 6 * recordCount;
+  size_t offset = dataAt;
+  Put16(out, recordCount);
+  for (const StoredGroup& group : image.groups) {
+    Put16(out, group.bucket);
+    Put32(out, offset);
+    offset = dataAt + group.lengthsEnd + group.dataEnd;
+  }
+  Put16(out, 0);
+  Put32(out, offset);
+  image.ForEachEntry([&](const StoredGroup&, const StoredEntry& entry) {
+    Put32(out, entry.key.size());
+    Put(out, entry.key);
+    Put32(out, entry.value.size());
+    Put(out, entry.value);
+  });
+}
+
+uint64_t Size1_0(const StoredImage& image) noexcept {
+  return kHeaderSize + 2 + 6 * (uint64_t{image.groups.size()} + 1) + image.lengths.size() +
+         image.data.size();
+}
+
+}  // namespace
+
+Entries FoundEntries(DictionaryTable& table) {
+  Entries entries;
+  for (uint32_t bucket = 0; bucket < DictionaryTable::kBucketCount; ++bucket) {
+    const auto begin = static_cast<std::ptrdiff_t>(entries.size());
+    for (const HashItem* item = table.Bucket(bucket); item != nullptr; item = item->next) {
+      const auto* const entry = static_cast<const DictionaryEntry*>(item);
+      if (table.Find(*entry) == entry) entries.push_back(entry);
+    }
+    std::sort(entries.begin() + begin, entries.end(), ComesBefore);
+  }
+  return entries;
+}
+
+std::vector<LostValue> WriteBinary(DictionaryTable& table, BinaryVersion version,
+                                   TextEncoding values, std::ostream& out) {
+  ImageComposer composer(values);
+  for (const DictionaryEntry* entry : FoundEntries(table)) composer.Append(*entry);
+  if (!composer.Lost().empty()) return composer.Lost();
+  const StoredImage& image = composer.Finish();
+  const bool is1_5 = version == BinaryVersion::k1_5;
+  if ((is1_5 ? Size1_5(image) : Size1_0(image)) > kMostImageBytes) {
+    throw std::length_error("the image would be larger than a dictionary may be (2 GiB)");
+  }
+  PutHeader(out, version, values);
+  is1_5 ? PutBody1_5(out, image) : PutBody1_0(out, image);
+  return {};
+}
+
+}  // namespace tovali_private

@@ -1,0 +1,133 @@
+#include "CompileCommand.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <map>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "CommandLine.h"
+#include "DictionaryFile.h"
+#include "DictionaryTable.h"
+#include "DictionaryWriter.h"
+#include "EncodingOption.h"
+#include "ImageFile.h"
+#include "LoadWarnings.h"
+#include "OutputFile.h"
+#include "Text.h"
+
+namespace {
+
+using tovali_private::BinaryVersion;
+using tovali_private::DictionaryEntry;
+
+constexpr const char* kAbout =
+    R"(Make one binary image of dictionaries.
+
+Examples:
+  kolvane compile de.txt -o de.kdict
+  kolvane compile common.txt de.txt -o de.kdict --values utf-8
+
+A translator that loads the image answers as one that loads each INPUT in turn: of two definitions of
+a key the later one wins. Equal contents give equal bytes. INPUT may be text, a binary image, or '-' for
+standard input. Nothing is written where an input is damaged, or where the encoding of the values
+lacks a character of one of them.)";
+
+struct Request {
+  std::vector<std::string> inputs;
+  std::string output;
+  BinaryVersion version = BinaryVersion::k1_5;
+  TextEncoding values = TextEncoding::kUTF16LE;
+  FileEncoding encoding = FileEncoding::kAuto;
+};
+
+template <class Value>
+void AddChoice(CLI::App& options, const char* name, const std::map<std::string, Value>& choices,
+               Value& chosen, const char* type, const char* text) {
+  options
+      .add_option_function<std::string>(
+          name, [&](const std::string& word) { chosen = choices.at(word); }, text)
+      ->check(CLI::IsMember(&choices))
+      ->type_name(type)
+      ->group("Image");
+}
+
+void AddOptions(CLI::App& options, Request& request) {
+  static const std::map<std::string, BinaryVersion> kVersions = {{"1.0", BinaryVersion::k1_0},
+                                                                 {"1.5", BinaryVersion::k1_5}};
+  static const std::map<std::string, TextEncoding> kValues = {
+      {"utf-16", TextEncoding::kUTF16LE},
+      {"utf-8", TextEncoding::kUTF8},
+      {"code-page", TextEncoding::kCodePage}};
+  options.add_option("-o,--output", request.output, "Write the image to FILE")
+      ->required()
+      ->type_name("FILE")
+      ->group("Image");
+  AddChoice(options, "--format", kVersions, request.version, "VERSION",
+            "Its version of the binary format, else 1.5");
+  AddChoice(options, "--values", kValues, request.values, "ENCODING",
+            "The encoding of its translations, else utf-16");
+  AddEncodingOption(options, request.encoding);
+}
+
+// Returns whether the file could be read and is whole, and says what is wrong with it.
+bool Load(const std::string& name, FileEncoding encoding, DictionaryTable& table) {
+  try {
+    const ImageFile file = ReadImageFile(name, encoding);
+    const LoadStatus status = LoadInto(table, file);
+    for (const std::string& warning : WarningsOf(file, status)) Say(warning);
+    return status.Complete();
+  } catch (const Failure& failure) {
+    Say(failure.what());
+    return false;
+  }
+}
+
+std::string LossText(const tovali_private::LostValue& lost, TextEncoding encoding) {
+  const std::string character = CodePointText(CodePointAt(lost.entry->Value().Units(), lost.unit));
+  return fmt::format("'{}': its translation holds {}, which {} cannot carry",
+                     Excerpt(KeyText(lost.entry->Bytes())), character,
+                     encoding == TextEncoding::kUTF8 ? "UTF-8" : "the code page");
+}
+
+bool LoadAll(const Request& request, DictionaryTable& table) {
+  bool loadedAll = true;
+  for (const std::string& name : request.inputs) {
+    loadedAll = Load(name, request.encoding, table) && loadedAll;
+  }
+  return loadedAll;
+}
+
+void RefuseLosses(const std::vector<tovali_private::LostValue>& lost, TextEncoding encoding) {
+  constexpr size_t kMostReports = 20;
+  if (lost.empty()) return;
+  for (size_t i = 0; i < std::min(lost.size(), kMostReports); ++i) {
+    Say(LossText(lost[i], encoding));
+  }
+  throw Failure(fmt::format(
+      "nothing was written, for {} would be lost; utf-16 carries them all",
+      lost.size() == 1 ? "a translation" : fmt::format("{} translations", lost.size())));
+}
+
+ExitStatus Compile(const Request& request) {
+  DictionaryTable table;
+  if (!LoadAll(request, table)) throw Failure("nothing was written, for an input is not whole");
+  std::ostringstream image;
+  image.exceptions(std::ios::badbit);
+  RefuseLosses(WriteBinary(table, request.version, request.values, image), request.values);
+  WriteFile(request.output, image.view());
+  return ExitStatus::kDone;
+}
+
+}  // namespace
+
+ExitStatus RunCompile(int argc, const char* const* argv) {
+  Request request;
+  CommandLine commandLine("kolvane compile", "INPUT... -o OUT", kAbout);
+  AddOptions(commandLine.Options(), request);
+  request.inputs = commandLine.Parse(argc, argv);
+  CheckFiles(request.inputs);
+  return Compile(request);
+}

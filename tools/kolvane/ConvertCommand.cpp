@@ -1,0 +1,191 @@
+#include "ConvertCommand.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <map>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "BinaryLoader.h"
+#include "CommandLine.h"
+#include "Converters.h"
+#include "EncodingOption.h"
+#include "ImageFile.h"
+#include "LittleEndian.h"
+#include "OutputFile.h"
+#include "Text.h"
+
+namespace {
+
+using Units = std::span<const uint16_t>;
+
+constexpr const char* kAbout =
+    R"(Change the encoding of a text dictionary, and nothing else.
+
+Examples:
+  kolvane convert pl.txt -o pl-utf16.txt --to utf-16le
+  kolvane convert es.txt -o - --to utf-8
+
+Lines, their order, ends and spacing stay as they are. UTF-16 gets a byte-order mark, the other
+encodings have none. A character that the target lacks, and input that is malformed, is named with its
+line, and nothing is written. INPUT may be '-' for standard input.)";
+
+struct Request {
+  std::string input;
+  std::string output;
+  TextEncoding target = TextEncoding::kUTF8;
+  FileEncoding encoding = FileEncoding::kAuto;
+};
+
+void AddOptions(CLI::App& options, Request& request) {
+  static const std::map<std::string, TextEncoding> kTargets = {
+      {"utf-8", TextEncoding::kUTF8},
+      {"utf-16le", TextEncoding::kUTF16LE},
+      {"utf-16be", TextEncoding::kUTF16BE},
+      {"code-page", TextEncoding::kCodePage}};
+  options.add_option("-o,--output", request.output, "Write to FILE")
+      ->required()
+      ->type_name("FILE")
+      ->group("Output");
+  options
+      .add_option_function<std::string>(
+          "--to", [&](const std::string& name) { request.target = kTargets.at(name); },
+          "The encoding to write")
+      ->required()
+      ->check(CLI::IsMember(&kTargets))
+      ->type_name("ENCODING")
+      ->group("Output");
+  AddEncodingOption(options, request.encoding);
+}
+
+// With its line end, which CR LF is one of.
+size_t LengthOfLine(Units text) noexcept {
+  for (size_t i = 0; i < text.size(); ++i) {
+    const uint16_t unit = text[i];
+    const bool isReturn = unit == '\r' && (i + 1 == text.size() || text[i + 1] != '\n');
+    if (isReturn || unit == '\n' || unit == 0x2028 || unit == 0x2029) return i + 1;
+  }
+  return text.size();
+}
+
+std::vector<uint16_t> DecodedUTF16(std::string_view bytes, bool isBigEndian) {
+  std::vector<uint16_t> units(bytes.size() / 2);
+  for (size_t i = 0; i < units.size(); ++i) {
+    const auto* const unit = reinterpret_cast<const uint8_t*>(bytes.data()) + 2 * i;
+    const uint16_t value = tovali_private::Read16(unit);
+    units[i] = isBigEndian ? static_cast<uint16_t>(value << 8 | value >> 8) : value;
+  }
+  return units;
+}
+
+// Throws Failure for what is no text, or malformed.
+std::vector<uint16_t> Decoded(const ImageFile& file) {
+  const std::string name = Printable(file.name);
+  if (file.bytes.starts_with(tovali_private::kBinaryMagic)) {
+    throw Failure(name +
+                  ": a binary dictionary has no encoding to change; 'kolvane dump' prints it");
+  }
+  if (const auto bad = MalformedUTF8At(file.utf8)) {
+    const std::string_view before = std::string_view(file.utf8).substr(0, *bad);
+    throw Failure(fmt::format("{}:{}: byte {} is malformed UTF-8", name,
+                              1 + std::ranges::count(before, '\n'), *bad));
+  }
+  const bool isLittle = file.bytes.starts_with("\xFF\xFE");
+  const bool isBig = file.bytes.starts_with("\xFE\xFF");
+  if (!isLittle && !isBig) return FromMultiByte(file.bytes, tovali_private::kDefaultSelector);
+  if (file.bytes.size() % 2 != 0) {
+    throw Failure(fmt::format("{}: byte {} is half a character", name, file.bytes.size() - 1));
+  }
+  return DecodedUTF16(std::string_view(file.bytes).substr(2), isBig);
+}
+
+std::string BytesOf(Units units, bool isBigEndian) {
+  std::string bytes;
+  bytes.reserve(units.size_bytes());
+  for (const uint16_t unit : units) {
+    const char low = static_cast<char>(unit & 0xFF);
+    const char high = static_cast<char>(unit >> 8);
+    bytes += isBigEndian ? high : low;
+    bytes += isBigEndian ? low : high;
+  }
+  return bytes;
+}
+
+// One line after the other in the target's encoding; says which cannot be.
+class Encoder {
+ public:
+  Encoder(const std::string& fileName, TextEncoding targetEncoding)
+      : name(Printable(fileName)), target(targetEncoding) {
+    if (target == TextEncoding::kUTF16LE) text = "\xFF\xFE";
+    if (target == TextEncoding::kUTF16BE) text = "\xFE\xFF";
+  }
+
+  void Append(Units line) {
+    ++lineNumber;
+    if (target == TextEncoding::kUTF16LE || target == TextEncoding::kUTF16BE) {
+      text += BytesOf(line, target == TextEncoding::kUTF16BE);
+      return;
+    }
+    const int* const selector = tovali_private::SelectorFor(target);
+    const std::string encoded = ToMultiByte(line, selector);
+    const std::vector<uint16_t> back = FromMultiByte(encoded, selector);
+    if (std::ranges::equal(back, line)) {
+      text += encoded;
+    } else {
+      ReportLoss(line, back);
+    }
+  }
+
+  size_t LossCount() const noexcept { return losses; }
+  const std::string& Text() const noexcept { return text; }
+
+ private:
+  static constexpr size_t kMostReports = 20;
+
+  void ReportLoss(Units line, Units back) {
+    if (++losses > kMostReports) return;
+    const auto at = static_cast<size_t>(std::ranges::mismatch(line, back).in1 - line.begin());
+    Say(fmt::format("{}:{}:{}: {} has no place in {}", name, lineNumber,
+                    1 + CodePointCount(line.first(at)), CodePointText(CodePointAt(line, at)),
+                    target == TextEncoding::kUTF8 ? "UTF-8" : "the code page"));
+  }
+
+  std::string name;
+  TextEncoding target;
+  std::string text;
+  size_t lineNumber = 0;
+  size_t losses = 0;
+};
+
+ExitStatus Convert(const Request& request) {
+  const ImageFile file = ReadImageFile(request.input, request.encoding);
+  const std::vector<uint16_t> units = Decoded(file);
+  Encoder encoder(file.name, request.target);
+  for (Units rest(units); !rest.empty();) {
+    const size_t length = LengthOfLine(rest);
+    encoder.Append(rest.first(length));
+    rest = rest.subspan(length);
+  }
+  if (encoder.LossCount() != 0) {
+    throw Failure(fmt::format(
+        "nothing was written, for {} cannot be converted",
+        encoder.LossCount() == 1 ? "a line" : fmt::format("{} lines", encoder.LossCount())));
+  }
+  WriteFile(request.output, encoder.Text());
+  return ExitStatus::kDone;
+}
+
+}  // namespace
+
+ExitStatus RunConvert(int argc, const char* const* argv) {
+  Request request;
+  CommandLine commandLine("kolvane convert", "INPUT -o OUT --to ENCODING", kAbout);
+  AddOptions(commandLine.Options(), request);
+  const std::vector<std::string> inputs = commandLine.Parse(argc, argv);
+  CheckFiles(inputs);
+  if (inputs.size() != 1) throw UsageError("more than one input is named");
+  request.input = inputs.front();
+  return Convert(request);
+}

@@ -1,0 +1,53 @@
+#include "TextLines.h"
+
+LineCounter::LineCounter(std::string_view textImage, TextEncoding encoding) noexcept
+    : image(textImage),
+      unitSize(encoding == TextEncoding::kCodePage ? 1 : 2),
+      lowByte(encoding == TextEncoding::kUTF16BE ? 1 : 0) {}
+
+uint32_t LineCounter::UnitAt(size_t at) const noexcept {
+  const uint32_t unit = static_cast<uint8_t>(image[at + lowByte]);
+  if (unitSize == 1) return unit;
+  return unit | uint32_t{static_cast<uint8_t>(image[at + 1 - lowByte])} << 8;
+}
+
+size_t LineCounter::LineAt(uint64_t offset) noexcept {
+  for (; position + unitSize <= offset && position + unitSize <= image.size();
+       position += unitSize) {
+    const uint32_t unit = UnitAt(position);
+    const bool separator = unitSize == 2 && (unit == 0x2028 || unit == 0x2029);
+    const bool afterReturn = unit == '\n' && before == '\r';
+    if ((unit == '\n' && !afterReturn) || unit == '\r' || separator) ++line;
+    before = unit;
+  }
+  return line;
+}
+
+TextLines::TextLines(std::string_view textImage)
+    : image(textImage),
+      stream(image.data(), image.size()),
+      reader(tovali_private::DictionaryReader::Create(&stream)),
+      counter(image, reader->Encoding()) {
+  stream.clear();
+  stream.seekg(0);
+}
+
+bool TextLines::Next(TextLine& line) {
+  for (;;) {
+    const uint64_t start = Position();
+    const uint16_t* const text = reader->GetNextLine();
+    if (text == nullptr) return false;
+    if (reader->LineLength() == 0) continue;
+    const uint64_t end = Position();
+    const bool isWide = reader->Encoding() != TextEncoding::kCodePage;
+    const bool endsInText = stream.good();
+    const bool lastIsZero = image[end - 1] == 0 && (!isWide || image[end - 2] == 0);
+    line = {counter.LineAt(start), {text, reader->LineLength()}, endsInText && lastIsZero};
+    return true;
+  }
+}
+
+uint64_t TextLines::Position() {
+  const std::streamoff at = stream.rdbuf()->pubseekoff(0, std::ios::cur, std::ios::in);
+  return static_cast<uint64_t>(at);
+}

@@ -1,0 +1,54 @@
+// The lines of a text dictionary, and where they stand.
+#pragma once
+
+#include <boost/interprocess/streams/bufferstream.hpp>
+#include <cstdint>
+#include <memory>
+#include <span>
+#include <string_view>
+
+#include "DictionaryReader.h"
+
+// Numbers the lines of a text image from 1, for offsets in bytes that never fall. CR LF ends one
+// line.
+class LineCounter {
+ public:
+  LineCounter(std::string_view textImage, TextEncoding encoding) noexcept;
+
+  // The number of the line that holds the byte at `offset`.
+  size_t LineAt(uint64_t offset) noexcept;
+
+ private:
+  uint32_t UnitAt(size_t at) const noexcept;
+
+  std::string_view image;
+  size_t unitSize;
+  size_t lowByte;
+  size_t position = 0;
+  size_t line = 1;
+  uint32_t before = 0;
+};
+
+struct TextLine {
+  size_t number = 0;               // from 1
+  std::span<const uint16_t> text;  // without its end
+  bool endsAtZero = false;         // it is a zero character that ends it
+};
+
+// Gives the lines that a translator would, without the empty ones. The first line of UTF-16 begins
+// with its byte-order mark. Borrows the image.
+class TextLines {
+ public:
+  explicit TextLines(std::string_view textImage);
+
+  // Returns false after the last line; a line is valid until the next call.
+  bool Next(TextLine& line);
+
+ private:
+  uint64_t Position();
+
+  std::string_view image;
+  boost::interprocess::ibufferstream stream;
+  std::unique_ptr<tovali_private::DictionaryReader> reader;
+  LineCounter counter;
+};
