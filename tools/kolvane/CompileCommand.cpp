@@ -21,7 +21,6 @@
 namespace {
 
 using tovali_private::BinaryVersion;
-using tovali_private::DictionaryEntry;
 
 constexpr const char* kAbout =
     R"(Make one binary image of dictionaries.

@@ -94,10 +94,10 @@ class TextDump {
     return nullptr;
   }
 
+  // Of UTF-16 there must be an entry: a mark on a line of its own is taken for one.
   void Finish() {
-    const std::vector<uint16_t> padding(unitCount < kLeastUnits ? kLeastUnits - unitCount : 0,
-                                        '\n');
-    Write(padding);
+    if (unitCount == 0) return WriteOutput(std::string(kLeastUnits, '\n'));
+    Write(std::vector<uint16_t>(kLeastUnits - std::min(unitCount, kLeastUnits), '\n'));
   }
 
  private:
@@ -105,7 +105,7 @@ class TextDump {
   static constexpr size_t kLeastUnits = 21;
 
   void Write(const std::vector<uint16_t>& units) {
-    if (utf16 && unitCount == 0 && !units.empty()) WriteOutput("\xFF\xFE");
+    if (utf16 && unitCount == 0) WriteOutput("\xFF\xFE");
     unitCount += units.size();
     utf16 ? WriteOutput({reinterpret_cast<const char*>(units.data()), units.size() * 2})
           : WriteOutput(ToUTF8(units));

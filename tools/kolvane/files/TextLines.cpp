@@ -34,11 +34,11 @@ TextLines::TextLines(std::string_view textImage)
 
 bool TextLines::Next(TextLine& line) {
   for (;;) {
-    const uint64_t start = Position();
+    const size_t start = Position();
     const uint16_t* const text = reader->GetNextLine();
     if (text == nullptr) return false;
     if (reader->LineLength() == 0) continue;
-    const uint64_t end = Position();
+    const size_t end = Position();
     const bool isWide = reader->Encoding() != TextEncoding::kCodePage;
     const bool endsInText = stream.good();
     const bool lastIsZero = image[end - 1] == 0 && (!isWide || image[end - 2] == 0);
@@ -47,7 +47,7 @@ bool TextLines::Next(TextLine& line) {
   }
 }
 
-uint64_t TextLines::Position() {
+size_t TextLines::Position() {
   const std::streamoff at = stream.rdbuf()->pubseekoff(0, std::ios::cur, std::ios::in);
-  return static_cast<uint64_t>(at);
+  return static_cast<size_t>(at);
 }

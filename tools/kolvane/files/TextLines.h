@@ -45,7 +45,7 @@ class TextLines {
   bool Next(TextLine& line);
 
  private:
-  uint64_t Position();
+  size_t Position();
 
   std::string_view image;
   boost::interprocess::ibufferstream stream;
