@@ -1,10 +1,13 @@
 #include "Images.h"
 
+#include <boost/interprocess/streams/bufferstream.hpp>
 #include <fstream>
-#include <vector>
+#include <sstream>
+#include <stdexcept>
 
 #include "CodePage.h"
 #include "DictionaryTable.h"
+#include "DictionaryWriter.h"
 #include "Subjects.h"
 
 namespace {
@@ -63,51 +66,18 @@ std::string CodePageImage(const KeySet& set) {
   return image;
 }
 
-void AppendNumber(std::string& image, size_t number, int byteCount) {
-  for (int i = 0; i < byteCount; ++i) image += static_cast<char>(number >> (8 * i) & 0xFF);
-}
-
-// The numbers of the entries, by bucket.
-std::vector<std::vector<size_t>> Buckets(const KeySet& set) {
-  std::vector<std::vector<size_t>> buckets(DictionaryTable::kBucketCount);
-  for (size_t i = 0; i < set.Size(); ++i) {
-    const std::string_view key = set.keys[i];
-    const tovali_private::ByteRunKey run(reinterpret_cast<const uint8_t*>(key.data()),
-                                         static_cast<uint32_t>(key.size()), false);
-    buckets[run.Hash(DictionaryTable::kBucketCount)].push_back(i);
-  }
-  return buckets;
-}
-
-// The parts of a version 1.5 image, in its order (BinaryLoader.h).
-struct BinaryParts {
-  size_t groupCount = 0;
-  size_t lengthCount = 0;
-  std::string counts, lengths, buckets, entries;
-};
-
-void AppendEntry(BinaryParts& parts, std::string_view key, std::u16string_view value) {
-  AppendNumber(parts.lengths, key.size(), 4);
-  AppendNumber(parts.lengths, value.size() * 2, 4);
-  parts.lengthCount += 2;
-  parts.entries += key;
-  AppendUnits(parts.entries, value);
-}
-
 std::string BinaryImage(const KeySet& set) {
-  BinaryParts parts;
-  const auto buckets = Buckets(set);
-  for (size_t bucket = 0; bucket < buckets.size(); ++bucket) {
-    if (buckets[bucket].empty()) continue;
-    for (const size_t i : buckets[bucket]) AppendEntry(parts, set.keys[i], set.values[i]);
-    AppendNumber(parts.counts, parts.lengthCount, 4);
-    AppendNumber(parts.buckets, bucket, 2);
-    ++parts.groupCount;
+  const std::string text = UTF16Image(set);
+  boost::interprocess::ibufferstream stream(text.data(), text.size());
+  DictionaryTable table;
+  table.Load(stream);
+  std::ostringstream image;
+  image.exceptions(std::ios::badbit);
+  if (!WriteBinary(table, tovali_private::BinaryVersion::k1_5, TextEncoding::kUTF16LE, image)
+           .empty()) {
+    throw std::logic_error("UTF-16 carries every value");
   }
-  std::string image = "Kolvane Binary Format\1\5";
-  AppendNumber(image, 0, 1);  // values in UTF-16
-  AppendNumber(image, parts.groupCount, 4);
-  return image + parts.counts + parts.lengths + parts.buckets + parts.entries;
+  return image.str();
 }
 
 struct ImageForm {
