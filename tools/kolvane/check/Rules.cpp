@@ -79,9 +79,10 @@ constexpr Rule kAcceleratorExtra = {"accelerator-extra", kWarning,
 constexpr Rule kAcceleratorClash = {"accelerator-clash", kWarning,
                                     "two siblings have the same accelerator"};
 constexpr Rule kLineBreaks = {"line-breaks", kWarning,
-                              "the translation has not as many lines as the reference"};
-constexpr Rule kEdgeSpace = {"edge-space", kWarning,
-                             "white space at the start or end differs from the reference's"};
+                              "the translation has more or fewer line breaks than the reference"};
+constexpr Rule kEdgeSpace = {
+    "edge-space", kWarning,
+    "white space at the start or end is missing, or is not in the reference"};
 constexpr Rule kUntranslated = {"untranslated", kInfo,
                                 "the translation is a copy of the reference"};
 
