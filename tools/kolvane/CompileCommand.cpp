@@ -87,7 +87,7 @@ bool Load(const std::string& name, FileEncoding encoding, DictionaryTable& table
 std::string LossText(const tovali_private::LostValue& lost, TextEncoding encoding) {
   const std::string character = CodePointText(CodePointAt(lost.entry->Value().Units(), lost.unit));
   return fmt::format("'{}': its translation holds {}, which {} cannot carry",
-                     Excerpt(KeyText(lost.entry->Bytes())), character,
+                     Excerpt(KeyText(AsText(lost.entry->Bytes()))), character,
                      encoding == TextEncoding::kUTF8 ? "UTF-8" : "the code page");
 }
 

@@ -13,7 +13,6 @@
 #include "Converters.h"
 #include "EncodingOption.h"
 #include "ImageFile.h"
-#include "LittleEndian.h"
 #include "OutputFile.h"
 #include "Text.h"
 
@@ -70,12 +69,11 @@ size_t LengthOfLine(Units text) noexcept {
   return text.size();
 }
 
-std::vector<uint16_t> DecodedUTF16(std::string_view bytes, bool isBigEndian) {
-  std::vector<uint16_t> units(bytes.size() / 2);
-  for (size_t i = 0; i < units.size(); ++i) {
-    const auto* const unit = reinterpret_cast<const uint8_t*>(bytes.data()) + 2 * i;
-    const uint16_t value = tovali_private::Read16(unit);
-    units[i] = isBigEndian ? static_cast<uint16_t>(value << 8 | value >> 8) : value;
+std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian) {
+  std::vector<uint16_t> units =
+      UnitsOf({reinterpret_cast<const uint8_t*>(text.data()), text.size()});
+  if (isBigEndian) {
+    for (uint16_t& unit : units) unit = static_cast<uint16_t>(unit << 8 | unit >> 8);
   }
   return units;
 }

@@ -122,7 +122,7 @@ ExitStatus PrintText(const Entries& entries, const Request& request) {
     const char* const obstacle = dump.Append(*entry);
     if (obstacle == nullptr) continue;
     Say(fmt::format("{}: '{}' cannot be written as text: {}", Printable(request.file),
-                    Excerpt(KeyText(entry->Bytes())), obstacle));
+                    Excerpt(KeyText(AsText(entry->Bytes()))), obstacle));
     status = ExitStatus::kFindings;
   }
   dump.Finish();

@@ -22,13 +22,13 @@ struct Rule {
 // In a text dictionary a line and a column, in a binary one an entry and a byte offset, and neither
 // for a file as a whole.
 struct Place {
-  std::string file;   // as the user gave it
-  size_t line = 0;    // from 1; 0 where the place is no line
-  size_t column = 0;  // from 1, in code points; 0 with line 0
-  size_t entry = 0;   // from 1; 0 where the place is no entry of a binary image
+  std::string file{};  // as the user gave it
+  size_t line = 0;     // from 1; 0 where the place is no line
+  size_t column = 0;   // from 1, in code points; 0 with line 0
+  size_t entry = 0;    // from 1; 0 where the place is no entry of a binary image
   bool hasOffset = false;
-  uint64_t offset = 0;   // in bytes from the image's start
-  std::string lineText;  // the line in UTF-8 as it is, its end left out; empty with line 0
+  uint64_t offset = 0;     // in bytes from the image's start
+  std::string lineText{};  // the line in UTF-8 as it is, its end left out; empty with line 0
 };
 
 // Another place that has to do with a finding, and what is there.
@@ -41,8 +41,8 @@ struct Note {
 // dictionary holds: control characters are still to be escaped.
 struct Finding {
   const Rule* rule = nullptr;
-  Place place;
-  std::string message;
-  std::string key;  // the key that it is about, in UTF-8; empty where it is about none
-  std::vector<Note> notes;
+  Place place{};
+  std::string message{};
+  std::string key{};  // the key that it is about, in UTF-8; empty where it is about none
+  std::vector<Note> notes{};
 };

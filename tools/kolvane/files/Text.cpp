@@ -6,6 +6,7 @@
 #include <cstddef>
 
 #include "Converters.h"
+#include "LittleEndian.h"
 
 using tovali_private::kUTF8Selector;
 
@@ -43,10 +44,21 @@ bool IsValidUTF8(std::string_view text) {
   return !MalformedUTF8At(text);
 }
 
-std::string KeyText(std::span<const uint8_t> key) {
-  const std::string_view text(reinterpret_cast<const char*>(key.data()), key.size());
-  if (IsValidUTF8(text)) return std::string(text);
-  return ToUTF8(std::vector<uint16_t>(key.begin(), key.end()));
+std::string_view AsText(std::span<const uint8_t> bytes) noexcept {
+  return {reinterpret_cast<const char*>(bytes.data()), bytes.size()};
+}
+
+std::vector<uint16_t> UnitsOf(std::span<const uint8_t> bytes) {
+  std::vector<uint16_t> units(bytes.size() / 2);
+  for (size_t i = 0; i < units.size(); ++i) units[i] = tovali_private::Read16(&bytes[2 * i]);
+  return units;
+}
+
+std::string KeyText(std::string_view key) {
+  if (IsValidUTF8(key)) return std::string(key);
+  std::vector<uint16_t> units;
+  for (const char byte : key) units.push_back(static_cast<unsigned char>(byte));
+  return ToUTF8(units);
 }
 
 char32_t CodePointAt(std::span<const uint16_t> units, size_t at) noexcept {

@@ -21,9 +21,14 @@ std::vector<uint16_t> FromMultiByte(std::string_view text, const int* selector);
 std::optional<size_t> MalformedUTF8At(std::string_view text);
 bool IsValidUTF8(std::string_view text);
 
+std::string_view AsText(std::span<const uint8_t> bytes) noexcept;
+
+// The units that are stored in little-endian order; an odd last byte belongs to none.
+std::vector<uint16_t> UnitsOf(std::span<const uint8_t> bytes);
+
 // A key, which is bytes, to be shown: as it is where it is UTF-8, else with a character for each
 // byte.
-std::string KeyText(std::span<const uint8_t> key);
+std::string KeyText(std::string_view key);
 
 // The code point that begins at a unit of the text; an unpaired surrogate is one of its own.
 char32_t CodePointAt(std::span<const uint16_t> units, size_t at) noexcept;

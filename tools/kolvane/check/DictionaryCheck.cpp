@@ -1,0 +1,109 @@
+#include "DictionaryCheck.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <optional>
+#include <tuple>
+#include <utility>
+
+#include "BinaryLoader.h"
+#include "DictionaryFile.h"
+#include "DictionaryTable.h"
+#include "EncodingCheck.h"
+#include "ImageCheck.h"
+#include "LineCheck.h"
+#include "Messages.h"
+#include "ReferenceCheck.h"
+#include "Rules.h"
+#include "Text.h"
+#include "TextLines.h"
+
+namespace {
+
+// How the file ends for a translator, which a look at its lines does not tell.
+void CheckEnd(const ImageFile& file, std::vector<Finding>& findings) {
+  DictionaryTable table;
+  const LoadStatus status = LoadInto(table, file);
+  Finding finding{.place = {.file = file.name}};
+  switch (status.damage) {
+    case LoadDamage::kTooShort:
+      finding.rule = &rules::kTooShort;
+      finding.message =
+          "a file with fewer than 21 bytes, its byte-order mark not counted, is ignored";
+      break;
+    case LoadDamage::kZeroCharacter:
+      finding.rule = &rules::kZeroCharacter;
+      finding.message = "a zero character at the start of the line ends the file for a translator";
+      finding.place.line = LineCounter(file.bytes, status.encoding).LineAt(status.damageOffset);
+      finding.place.column = 1;
+      break;
+    case LoadDamage::kHalfUnit:
+      finding.rule = &rules::kMalformedInput;
+      finding.message = "the file ends in half of a character";
+      break;
+    default:
+      return;
+  }
+  findings.push_back(std::move(finding));
+}
+
+Definitions CheckText(const ImageFile& file, FileEncoding encoding,
+                      std::vector<Finding>& findings) {
+  Definitions definitions;
+  if (!CheckEncoding(file, encoding, findings)) return definitions;
+  CheckEnd(file, findings);
+  TextLines lines(file.bytes);
+  for (TextLine line; lines.Next(line);) CheckLine(file.name, line, definitions, findings);
+  return definitions;
+}
+
+Definitions CheckFile(const ImageFile& file, FileEncoding encoding,
+                      std::vector<Finding>& findings) {
+  const bool isBinary = file.bytes.starts_with(tovali_private::kBinaryMagic);
+  return isBinary ? CheckImage(file, findings) : CheckText(file, encoding, findings);
+}
+
+// Those of a file as a whole come first.
+void SortByPlace(std::vector<Finding>& findings) {
+  const auto place = [](const Finding& finding) {
+    return std::tuple(finding.place.line, finding.place.column, finding.place.offset);
+  };
+  std::ranges::stable_sort(findings, {}, place);
+}
+
+void CheckAcross(const Definitions& definitions, Definitions& earlier,
+                 std::vector<Finding>& findings) {
+  for (const Definition& definition : definitions.All()) {
+    if (const Definition* const other = earlier.Find(definition.key)) {
+      Finding finding{.rule = &rules::kDuplicateAcrossFiles,
+                      .place = definition.place,
+                      .message = fmt::format("key '{}' is defined in another file too",
+                                             Excerpt(KeyText(definition.key))),
+                      .key = KeyText(definition.key)};
+      finding.notes.push_back({other->place, "defined here"});
+      findings.push_back(std::move(finding));
+    } else {
+      earlier.Put(definition);
+    }
+  }
+}
+
+}  // namespace
+
+std::vector<Finding> CheckDictionaries(const std::vector<ImageFile>& files,
+                                       const ImageFile* reference, FileEncoding encoding) {
+  std::vector<Finding> all, ignored;
+  std::optional<Definitions> source;
+  if (reference != nullptr) source = CheckFile(*reference, encoding, ignored);
+  Definitions earlier;
+  for (const ImageFile& file : files) {
+    std::vector<Finding> findings;
+    const Definitions definitions = CheckFile(file, encoding, findings);
+    CheckTranslations(file.name, definitions, source ? &*source : nullptr, findings);
+    if (files.size() > 1) CheckAcross(definitions, earlier, findings);
+    SortByPlace(findings);
+    std::ranges::move(findings, std::back_inserter(all));
+  }
+  return all;
+}

@@ -1,0 +1,165 @@
+#include "LineCheck.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <optional>
+#include <span>
+#include <utility>
+
+#include "EscapeCheck.h"
+#include "Messages.h"
+#include "Rules.h"
+#include "Text.h"
+#include "TextSyntax.h"
+
+namespace {
+
+using Units = std::span<const uint16_t>;
+using Split = std::optional<tovali_private::SplitText<uint16_t>>;
+
+constexpr uint16_t kByteOrderMark = 0xFEFF;
+
+bool IsSpace(uint16_t unit) noexcept {
+  return unit == ' ' || unit == '\t' || unit == kByteOrderMark;
+}
+
+bool IsSurrogate(char32_t codePoint) noexcept {
+  return codePoint >= 0xD800 && codePoint < 0xE000;
+}
+
+class LineCheck {
+ public:
+  LineCheck(const std::string& fileName, const TextLine& checkedLine, std::vector<Finding>& list)
+      : file(fileName),
+        line(checkedLine),
+        markLength(line.number == 1 && line.text[0] == kByteOrderMark ? 1 : 0),
+        entry(tovali_private::EntryText(line.text)),
+        split(tovali_private::SplitKolvane(entry)),
+        findings(list) {
+    if (!split) return;
+    const auto bytes = tovali_private::NarrowKey(split->key);
+    key.assign(bytes.begin(), bytes.end());
+  }
+
+  void Run(Definitions& definitions) {
+    CheckCharacters();
+    if (line.text.size() == markLength) return;
+    CheckQuotes();
+    if (!split) {
+      Report(rules::kDroppedLine, IndexOf(entry), "the line is dropped: '$$$' is due, or no '$'");
+      return;
+    }
+    CheckKey();
+    CheckDuplicate(definitions);
+    for (const EscapeFault& fault : FaultsOfEscapes(split->value)) {
+      Report(*fault.rule, IndexOf(split->value) + fault.at, fault.message);
+    }
+    const KolvaneString value = tovali_private::Unescape(split->value);
+    definitions.Put({key, {value.Units().begin(), value.Units().end()}, PlaceAt(IndexOf(entry))});
+  }
+
+ private:
+  size_t IndexOf(Units part) const noexcept {
+    return static_cast<size_t>(part.data() - line.text.data());
+  }
+
+  Place PlaceAt(size_t unit) const {
+    Place place{.file = file, .line = line.number};
+    const Units before = line.text.first(std::max(unit, markLength)).subspan(markLength);
+    place.column = 1 + CodePointCount(before);
+    place.lineText = ToUTF8(line.text.subspan(markLength));
+    return place;
+  }
+
+  Finding& Report(const Rule& rule, size_t unit, std::string message) {
+    Finding finding{.rule = &rule, .place = PlaceAt(unit), .message = std::move(message)};
+    if (split) finding.key = ToUTF8(split->key);
+    return findings.emplace_back(std::move(finding));
+  }
+
+  void CheckCharacters() {
+    for (size_t at = 0; at < line.text.size();) {
+      const char32_t codePoint = CodePointAt(line.text, at);
+      if (IsSurrogate(codePoint)) {
+        Report(rules::kMalformedInput, at,
+               fmt::format("{} is half of a character", CodePointText(codePoint)));
+      }
+      at += codePoint > 0xFFFF ? 2 : 1;
+    }
+    if (line.endsAtZero) {
+      Report(rules::kZeroCharacter, line.text.size(), "a zero character ends the line here");
+    }
+  }
+
+  void CheckQuotes() {
+    if (entry.data() == line.text.data()) return;
+    const size_t opening = IndexOf(entry) - 1;
+    const size_t closing = IndexOf(entry) + entry.size();
+    CheckOutside(markLength, opening, "text before the opening quote is ignored");
+    if (closing < line.text.size()) {
+      CheckOutside(closing + 1, line.text.size(),
+                   "text after the closing quote is ignored; a quote in a value is written \\\"");
+    } else if (entry.size() > 1 && entry.back() == '"') {
+      Report(rules::kSwallowedClosingQuote, closing - 1,
+             "the backslash before it makes the last quote a part of the value");
+    } else if (entry.empty() || entry.back() != '\\') {
+      Report(rules::kMissingClosingQuote, opening, "the quote is not closed on this line");
+    }
+  }
+
+  void CheckOutside(size_t begin, size_t end, const char* message) {
+    const Units part = line.text.subspan(begin, std::max(begin, end) - begin);
+    const auto stray = std::find_if_not(part.begin(), part.end(), IsSpace);
+    if (stray == part.end()) return;
+    Report(rules::kTextOutsideQuotes, begin + static_cast<size_t>(stray - part.begin()), message);
+  }
+
+  void CheckKey() {
+    const size_t at = IndexOf(split->key);
+    const bool hasEquals = split->key.data() + split->key.size() != entry.data() + entry.size();
+    if (markLength != 0 && at == 0) {
+      Report(rules::kMarkInKey, 0,
+             "the byte-order mark becomes a part of the key; quotes keep it out");
+    } else if (!hasEquals) {
+      Report(rules::kMissingEquals, at, "without '=' all of it is a key, with an empty value");
+    } else if (key.empty()) {
+      Report(rules::kEmptyKey, at, "the key is empty");
+    } else {
+      CheckMatchable(at);
+    }
+  }
+
+  void CheckMatchable(size_t at) {
+    const auto beyond = std::ranges::find_if(split->key, [](uint16_t unit) { return unit > 0x7F; });
+    if (beyond == split->key.end()) return;
+    const auto index = static_cast<size_t>(beyond - split->key.begin());
+    Report(rules::kUnmatchableKey, at + index,
+           fmt::format("no lookup matches a key of a text dictionary with {}",
+                       CodePointText(CodePointAt(split->key, index))));
+  }
+
+  void CheckDuplicate(const Definitions& definitions) {
+    const Definition* const earlier = definitions.Find(key);
+    if (earlier == nullptr) return;
+    Report(
+        rules::kDuplicateKey, IndexOf(entry),
+        fmt::format("key '{}' is defined again; the last definition wins", Excerpt(KeyText(key))))
+        .notes.push_back({earlier->place, "first defined here"});
+  }
+
+  const std::string& file;
+  const TextLine& line;
+  size_t markLength;
+  Units entry;
+  Split split;
+  std::string key;
+  std::vector<Finding>& findings;
+};
+
+}  // namespace
+
+void CheckLine(const std::string& file, const TextLine& line, Definitions& definitions,
+               std::vector<Finding>& findings) {
+  LineCheck(file, line, findings).Run(definitions);
+}

@@ -1,0 +1,14 @@
+// What a translator silently forgives in a line of text.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "Definitions.h"
+#include "Finding.h"
+#include "TextLines.h"
+
+// Reports what is wrong with a line of the file, and puts what it defines among the definitions of
+// the lines before it.
+void CheckLine(const std::string& file, const TextLine& line, Definitions& definitions,
+               std::vector<Finding>& findings);
