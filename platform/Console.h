@@ -11,6 +11,10 @@ std::vector<std::string> Arguments(int count, char** words);
 
 bool StandardInputIsTerminal() noexcept;
 
+// Whether standard output is a terminal that shows colours. A console that has to be told to show
+// them is told, until the program ends.
+bool StandardOutputShowsColour() noexcept;
+
 // Whether what failed last was a write to a pipe that nobody reads any more. To be asked at once.
 bool HitClosedPipe() noexcept;
 

@@ -1,6 +1,8 @@
 #include <unistd.h>
 
 #include <cerrno>
+#include <cstdlib>
+#include <cstring>
 
 #include "Console.h"
 
@@ -12,6 +14,11 @@ std::vector<std::string> Arguments(int count, char** words) {
 
 bool StandardInputIsTerminal() noexcept {
   return isatty(STDIN_FILENO) != 0;
+}
+
+bool StandardOutputShowsColour() noexcept {
+  const char* const kind = std::getenv("TERM");
+  return isatty(STDOUT_FILENO) != 0 && kind != nullptr && std::strcmp(kind, "dumb") != 0;
 }
 
 bool HitClosedPipe() noexcept {

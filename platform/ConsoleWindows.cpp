@@ -5,6 +5,7 @@
 #include <shellapi.h>
 #include <stdio.h>
 #include <stdlib.h>
+#include <string.h>
 
 #include <memory>
 
@@ -15,6 +16,7 @@ namespace platform {
 namespace {
 
 UINT gCodePageBefore = 0;
+DWORD gConsoleModeBefore = 0;
 
 bool IsConsole(DWORD standardHandle) noexcept {
   DWORD mode = 0;
@@ -34,6 +36,21 @@ std::vector<std::string> Arguments(int, char**) {
 
 bool StandardInputIsTerminal() noexcept {
   return IsConsole(STD_INPUT_HANDLE);
+}
+
+// The console's mode outlives the program.
+bool StandardOutputShowsColour() noexcept {
+  constexpr DWORD kEscapes = 0x0004;  // ENABLE_VIRTUAL_TERMINAL_PROCESSING, since Windows 10
+  const HANDLE output = ::GetStdHandle(STD_OUTPUT_HANDLE);
+  if (::GetConsoleMode(output, &gConsoleModeBefore) == 0) return false;
+  if (const char* const kind = std::getenv("TERM");
+      kind != nullptr && std::strcmp(kind, "dumb") == 0) {
+    return false;
+  }
+  if ((gConsoleModeBefore & kEscapes) != 0) return true;
+  if (::SetConsoleMode(output, gConsoleModeBefore | kEscapes) == 0) return false;
+  std::atexit([] { ::SetConsoleMode(::GetStdHandle(STD_OUTPUT_HANDLE), gConsoleModeBefore); });
+  return true;
 }
 
 bool HitClosedPipe() noexcept {
