@@ -12,6 +12,9 @@ enum class Severity {
   kError     // can break the program, or loses text
 };
 
+// As reports and options name it.
+std::string_view SeverityName(Severity severity) noexcept;
+
 // One kind of finding. Its name is permanent: people silence findings by it.
 struct Rule {
   std::string_view name;

@@ -1,0 +1,73 @@
+#include <fmt/format.h>
+
+#include <cstring>
+
+#include "Messages.h"
+#include "PlaceText.h"
+#include "Reports.h"
+#include "StandardOutput.h"
+
+namespace {
+
+const char* CommandOf(Severity severity) noexcept {
+  switch (severity) {
+    case Severity::kError:
+      return "error";
+    case Severity::kWarning:
+      return "warning";
+    case Severity::kInfo:
+      return "notice";
+  }
+  return "notice";
+}
+
+std::string Escaped(std::string_view text, const char* special) {
+  std::string escaped;
+  for (const char character : text) {
+    if (character != '\0' && std::strchr(special, character) != nullptr) {
+      escaped += fmt::format("%{:02X}", static_cast<unsigned char>(character));
+    } else {
+      escaped += character;
+    }
+  }
+  return escaped;
+}
+
+std::string EscapedMessage(std::string_view text) {
+  return Escaped(text, "%\r\n");
+}
+
+std::string EscapedProperty(std::string_view text) {
+  return Escaped(text, "%\r\n:,");
+}
+
+// A place in a binary image has no property, and stands in the message.
+std::string MessageOf(const Finding& finding) {
+  const std::string position = BinaryPosition(finding.place);
+  std::string message = (position.empty() ? "" : position + ": ") + Printable(finding.message);
+  for (const Note& note : finding.notes) {
+    message += fmt::format("\n{}: note: {}", PlaceText(note.place), Printable(note.text));
+  }
+  return message;
+}
+
+std::string CommandText(const Finding& finding) {
+  const Place& place = finding.place;
+  const std::string position =
+      place.line == 0 ? "" : fmt::format(",line={},col={}", place.line, place.column);
+  return fmt::format("::{} file={}{},title={}::{}\n", CommandOf(finding.rule->severity),
+                     EscapedProperty(PortableName(place.file)), position, finding.rule->name,
+                     EscapedMessage(MessageOf(finding)));
+}
+
+}  // namespace
+
+void WriteGitHubReport(const Report& report) {
+  for (const ReportedFinding& reported : report.findings) {
+    WriteOutput(CommandText(reported.finding));
+  }
+  for (const UnreadFile& unread : report.unreadFiles) {
+    WriteOutput(fmt::format("::error file={}::{}\n", EscapedProperty(PortableName(unread.file)),
+                            EscapedMessage(unread.message)));
+  }
+}
