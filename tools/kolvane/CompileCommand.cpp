@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "ChoiceOption.h"
 #include "CommandLine.h"
 #include "DictionaryFile.h"
 #include "DictionaryTable.h"
@@ -42,17 +43,6 @@ struct Request {
   FileEncoding encoding = FileEncoding::kAuto;
 };
 
-template <class Value>
-void AddChoice(CLI::App& options, const char* name, const std::map<std::string, Value>& choices,
-               Value& chosen, const char* type, const char* text) {
-  options
-      .add_option_function<std::string>(
-          name, [&](const std::string& word) { chosen = choices.at(word); }, text)
-      ->check(CLI::IsMember(&choices))
-      ->type_name(type)
-      ->group("Image");
-}
-
 void AddOptions(CLI::App& options, Request& request) {
   static const std::map<std::string, BinaryVersion> kVersions = {{"1.0", BinaryVersion::k1_0},
                                                                  {"1.5", BinaryVersion::k1_5}};
@@ -64,10 +54,14 @@ void AddOptions(CLI::App& options, Request& request) {
       ->required()
       ->type_name("FILE")
       ->group("Image");
-  AddChoice(options, "--format", kVersions, request.version, "VERSION",
-            "Its version of the binary format, else 1.5");
-  AddChoice(options, "--values", kValues, request.values, "ENCODING",
-            "The encoding of its translations, else utf-16");
+  AddChoice(options, "--format", kVersions, request.version,
+            "Its version of the binary format, else 1.5")
+      ->type_name("VERSION")
+      ->group("Image");
+  AddChoice(options, "--values", kValues, request.values,
+            "The encoding of its translations, else utf-16")
+      ->type_name("ENCODING")
+      ->group("Image");
   AddEncodingOption(options, request.encoding);
 }
 

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "BinaryLoader.h"
+#include "ChoiceOption.h"
 #include "CommandLine.h"
 #include "Converters.h"
 #include "EncodingOption.h"
@@ -48,12 +49,8 @@ void AddOptions(CLI::App& options, Request& request) {
       ->required()
       ->type_name("FILE")
       ->group("Output");
-  options
-      .add_option_function<std::string>(
-          "--to", [&](const std::string& name) { request.target = kTargets.at(name); },
-          "The encoding to write")
+  AddChoice(options, "--to", kTargets, request.target, "The encoding to write")
       ->required()
-      ->check(CLI::IsMember(&kTargets))
       ->type_name("ENCODING")
       ->group("Output");
   AddEncodingOption(options, request.encoding);

@@ -3,15 +3,13 @@
 #include <map>
 #include <string>
 
+#include "ChoiceOption.h"
+
 void AddEncodingOption(CLI::App& options, FileEncoding& encoding) {
   static const std::map<std::string, FileEncoding> kEncodings = {{"auto", FileEncoding::kAuto},
                                                                  {"image", FileEncoding::kImage},
                                                                  {"utf-8", FileEncoding::kUTF8}};
-  options
-      .add_option_function<std::string>(
-          "--encoding", [&encoding](const std::string& name) { encoding = kEncodings.at(name); },
-          "How FILE is handed over")
-      ->check(CLI::IsMember(&kEncodings))
+  AddChoice(options, "--encoding", kEncodings, encoding, "How FILE is handed over")
       ->type_name("HOW")
       ->group("Dictionaries");
 }
