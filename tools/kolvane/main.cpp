@@ -9,6 +9,7 @@
 #include <string_view>
 #include <vector>
 
+#include "CheckCommand.h"
 #include "CommandLine.h"
 #include "CompileCommand.h"
 #include "Console.h"
@@ -28,6 +29,7 @@ struct Command {
 };
 
 constexpr Command kCommands[] = {
+    {"check", "tell what is wrong with dictionaries", RunCheck},
     {"compile", "make a binary image of dictionaries", RunCompile},
     {"convert", "change the encoding of a text dictionary", RunConvert},
     {"dump", "print a dictionary as text", RunDump},
@@ -39,6 +41,7 @@ constexpr const char* kHelp =
 
 Examples:
   kolvane translate --dictionary de.txt '$$$/Dialog/Cancel=Cancel'
+  kolvane check --reference en.txt de.txt
   kolvane help translate
 
 Usage: kolvane COMMAND [ARGUMENT]...

@@ -1,0 +1,232 @@
+"""Runs `kolvane check` as its users do: test_check.py COMMAND SAMPLES."""
+
+import json
+import os
+import pathlib
+import re
+import subprocess
+import sys
+import tempfile
+import unicodedata
+import unittest
+
+KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
+SAMPLES = pathlib.Path(sys.argv.pop(1)).absolute()
+DROPPED = '"$/dropped=x"\n'
+ESCAPE = '"$$$/escape=^q"\n'
+TWICE = '"$$$/twice=100%"\n"$$$/twice=100%, {0}"\n'
+
+
+def room(text):
+    """The columns that a text takes between its tabs."""
+    def columns(character):
+        return 0 if unicodedata.combining(character) else 1 + (unicodedata.east_asian_width(character) in "WF")
+    return [sum(map(columns, part)) for part in text.split("\t")]
+
+
+def fingerprint(*parts):
+    """FNV-1a; people keep fingerprints, so that it may not change."""
+    value = 0xCBF29CE484222325
+    for byte in "\0".join(parts).encode():
+        value = (value ^ byte) * 0x100000001B3 % 2**64
+    return f"{value:016x}"
+
+
+class Check(unittest.TestCase):
+    maxDiff = None
+
+    def setUp(self):
+        folder = tempfile.TemporaryDirectory()
+        self.addCleanup(folder.cleanup)
+        self.folder = pathlib.Path(folder.name)
+
+    def file(self, content, name="d.txt"):
+        content = content if isinstance(content, bytes) else f"\ufeff{content}{30 * chr(10)}".encode("utf-16-le")
+        (self.folder / name).write_bytes(content)
+        return name
+
+    def check(self, *arguments, stdout=subprocess.PIPE, stdin=b"", **environment):
+        """Returns the status, standard output and standard error."""
+        clean = {name: value for name, value in os.environ.items() if name not in ("NO_COLOR", "CLICOLOR_FORCE")}
+        done = subprocess.run([*KOLVANE, "check", *arguments], cwd=self.folder, input=stdin, stdout=stdout,
+                              stderr=subprocess.PIPE, timeout=60, env={**clean, **environment})
+        return done.returncode, (done.stdout or b"").decode(), done.stderr.decode()
+
+    def findings(self, *arguments):
+        return json.loads(self.check("--format=json", *arguments)[1])["findings"]
+
+    def rules(self, *arguments):
+        return [finding["rule"] for finding in self.findings(*arguments)]
+
+    def test_text(self):
+        name = self.file(DROPPED + TWICE)
+        status, output, errors = self.check("--no-snippet", name)
+        self.assertEqual((status, errors), (1, "kolvane: 2 errors, 0 warnings in 1 file\n"))
+        place = r"(?m)^d\.txt:{}:\d+: {}$"
+        for line, text in [(1, r"error: .* \[dropped-line\]"), (3, r"error: .* \[duplicate-key\]"), (2, "note: .*")]:
+            self.assertRegex(output, place.format(line, text))
+        self.assertEqual(output.count("\n"), 3)
+        self.assertEqual(self.check("-q", self.file('"$$$/a=b"\n')), (0, "", ""))
+
+    def test_mark_stands_under_its_column(self):
+        for before in ["abc", "\t", "日本語\t한", "e\u0301ﾊﾝ", "𝄞🙂", "x" * 80]:
+            with self.subTest(before):
+                name = self.file(f'"$$$/escape={before}^q日"\n')
+                [finding] = self.findings(name)
+                _, line, mark = self.check(name)[1].split("\n")[:3]
+                self.assertEqual(line, f'  "$$$/escape={before}^q日"')
+                self.assertTrue(mark.endswith("^") and mark.isascii())
+                self.assertEqual(room(mark[:-1]), room(line[:2 + finding["column"] - 1]))
+
+    def test_long_line_is_cut_around_the_place(self):
+        name = self.file('"$$$/escape=' + "日" * 50000 + "^q" + "x" * 50000 + '"\n')
+        _, line, mark = self.check(name)[1].split("\n")[:3]
+        self.assertRegex(line, r"^  \.\.\.日+\^qx+\.\.\.$")
+        self.assertLess(sum(room(line)), 220)
+        self.assertIn(len(mark) - 1 - sum(room(line[:line.index("^")])), (0, 1))
+
+    def test_controls_are_escaped(self):
+        name = self.file('"$$$/twi\x1b[31mce=\x07"\n"$$$/twi\x1b[31mce=\u009b^q"\n')
+        for form in ["text", "github", "json", "sarif"]:
+            status, output, _ = self.check(f"--format={form}", name)
+            self.assertEqual(status, 1)
+            if form in ("text", "github"):
+                self.assertNotRegex(output, "[\0-\x08\x0b-\x1f\x7f-\x9f]")
+        self.assertIn(r"  " + r'"$$$/twi\x1B[31mce=\xC2\x9B^q"', self.check(name)[1])
+        self.assertIn("twi\x1b[31mce", self.findings(name)[0]["key"])
+
+    def test_colours(self):
+        name = self.file(DROPPED)
+        plain = self.check(name)[1]
+        for options, environment, coloured in [([], {}, False), ([], {"CLICOLOR_FORCE": "1"}, True), ([], {"CLICOLOR_FORCE": "0"}, False),
+                                               ([], {"CLICOLOR_FORCE": "1", "NO_COLOR": "1"}, False),
+                                               ([], {"CLICOLOR_FORCE": "1", "NO_COLOR": ""}, True),
+                                               (["--color=always"], {"NO_COLOR": "1"}, True), (["--color=never"], {"CLICOLOR_FORCE": "1"}, False)]:
+            with self.subTest(options=options, **environment):
+                output = self.check(*options, name, **environment)[1]
+                self.assertEqual("\x1b[" in output, coloured)
+                self.assertEqual(re.sub("\x1b\\[[0-9;]*m", "", output), plain)
+
+    @unittest.skipUnless(hasattr(os, "openpty"), "no terminals")
+    def test_colours_on_a_terminal(self):
+        name = self.file(DROPPED)
+        for kind, coloured in [("xterm", True), ("dumb", False)]:
+            ours, terminal = os.openpty()
+            self.check(name, stdout=terminal, TERM=kind)
+            os.close(terminal)
+            self.assertEqual(b"\x1b[" in os.read(ours, 4096), coloured)
+            os.close(ours)
+
+    def test_json(self):
+        text = self.file(TWICE)
+        binary = self.file((SAMPLES / "it.bin").read_bytes()[:1500], "d.bin")
+        status, output, errors = self.check("--format=json", text, "none", binary)
+        report = json.loads(output)
+        self.assertEqual((status, report["version"], report["files"]), (2, 1, [text, binary]))
+        self.assertEqual([unread["file"] for unread in report["unreadFiles"]], ["none"])
+        self.assertIn("kolvane: " + report["unreadFiles"][0]["message"] + "\n", errors)
+        twice, cut = report["findings"][0], report["findings"][-1]
+        self.assertEqual([twice[name] for name in ("file", "line", "severity", "rule")], [text, 2, "error", "duplicate-key"])
+        self.assertEqual((twice["key"].lstrip("/"), twice["notes"][0]["line"]), ("twice", 1))
+        self.assertEqual((cut["rule"], cut["file"], "line" in cut), ("truncated-image", binary, False))
+        self.assertGreater(cut["offset"], 20)
+        self.assertEqual(twice["fingerprint"], fingerprint("duplicate-key", twice["key"], text, "0"))
+        self.assertRegex(self.check(binary)[1], r"d\.bin: (entry \d+, )?byte \d+: error: .* \[truncated-image\]\n$")
+
+    def test_sarif(self):
+        text = self.file(TWICE, "ä b#{0}.txt")
+        binary = self.file((SAMPLES / "it.bin").read_bytes()[:1500], "d.bin")
+        for more in [], ["none"]:
+            log = json.loads(self.check("--format=sarif", "./" + text, binary, *more)[1])
+            [run] = log["runs"]
+            self.assertEqual((log["version"], run["columnKind"]), ("2.1.0", "unicodeCodePoints"))
+            [invocation] = run["invocations"]
+            self.assertEqual(invocation["executionSuccessful"], not more)
+            self.assertEqual(len(invocation["toolExecutionNotifications"]), len(more))
+        rules = run["tool"]["driver"]["rules"]
+        for result in run["results"]:
+            self.assertEqual(rules[result["ruleIndex"]]["id"], result["ruleId"])
+            self.assertEqual(rules[result["ruleIndex"]]["defaultConfiguration"]["level"], result["level"])
+            self.assertRegex(list(result["partialFingerprints"].values())[0], "^[0-9a-f]{16}$")
+            self.assertRegex(result["message"]["text"], r"^([^{}]|{{|}})+$")
+        places = [result["locations"][0]["physicalLocation"] for result in run["results"]]
+        self.assertEqual(places[0]["artifactLocation"]["uri"], "%C3%A4%20b%23%7B0%7D.txt")
+        self.assertEqual(places[0]["region"]["startLine"], 2)
+        self.assertGreater(places[-1]["region"]["byteOffset"], 20)
+        self.assertEqual(run["results"][0]["relatedLocations"][0]["physicalLocation"]["region"]["startLine"], 1)
+
+    def test_github(self):
+        name = self.file(TWICE + ESCAPE, "a,b%.txt")
+        lines = self.check("--format=github", name, "none")[1].splitlines()
+        for line, start in zip(lines, ["error file={},line=2,col=#,title=duplicate-key::",
+                                       "warning file={},line=3,col=#,title=unknown-escape::", "error file=none::"], strict=True):
+            start = re.escape("::" + start.format("a%2Cb%25.txt")).replace(r"\#", r"\d+")
+            self.assertRegex(line, f"^{start}([^%]|%25|%0A)+$")
+        self.assertRegex(lines[0], r"%0Aa,b%25\.txt:1:\d+: note: ")
+
+    def test_baseline_silences_exactly(self):
+        name = self.file(DROPPED + TWICE + ESCAPE)
+        self.file(self.check("--format=json", name)[1].encode(), "old.json")
+        self.assertEqual(self.check("--baseline", "old.json", name), (0, "", "kolvane: 0 errors, 0 warnings in 1 file\n"))
+        self.file("\n\n" + DROPPED + TWICE + '"$$$/twice=3"\n' + ESCAPE + '"$$$/new=^q"\n')
+        self.assertEqual(self.rules("--baseline", "old.json", "./" + name), ["duplicate-key", "unknown-escape"])
+        self.file(DROPPED, "other.txt")
+        self.assertEqual(self.rules("--baseline", "old.json", "other.txt"), ["dropped-line"])
+        for content in [b"", b"[", b"[" * 100000, b"[]", b"{}", b'{"version": 2, "findings": []}', b'{"version": 1, "findings": 7}',
+                        b'{"version": 1, "findings": [{"fingerprint": 1}]}', b'{"version": 1, "findings": ["\xff"]}']:
+            with self.subTest(content[:60]):
+                status, output, errors = self.check("--baseline", self.file(content, "bad.json"), name)
+                self.assertEqual((status, output), (2, ""))
+                self.assertRegex(errors, r"\Akolvane: bad\.json: is [^\n]*\n\Z")
+        self.assertEqual(self.check("--baseline", "none", name)[:2], (2, ""))
+
+    def test_what_is_shown_and_what_fails(self):
+        warning = self.file(ESCAPE, "warning")
+        error = self.file(DROPPED, "error")
+        info = self.file('"$$$/a=same words"\n', "info")
+        reference = ["--reference", info]
+        for arguments, status, rules in [([warning], 0, ["unknown-escape"]), (["-W", warning], 1, ["unknown-escape"]),
+                                         (["--fail-on=warning", warning], 1, ["unknown-escape"]), ([error, warning], 1, ["dropped-line", "unknown-escape"]),
+                                         (["--disable", "dropped-line", error, "--disable=unknown-escape", warning], 0, []),
+                                         ([*reference, info], 0, []), ([*reference, "--info", "-W", info], 0, ["untranslated"]),
+                                         ([*reference, "--fail-on", "info", info], 1, ["untranslated"]), (["none", error], 2, ["dropped-line"]),
+                                         (["--reference=none", error], 2, ["dropped-line"])]:
+            with self.subTest(arguments):
+                self.assertEqual(self.check(*arguments)[0], status)
+                self.assertEqual(self.rules(*arguments), rules)
+        self.assertEqual(self.check("-", "--no-snippet", "-q", stdin=DROPPED.encode() + 30 * b"\n")[1][:4], "-:1:")
+
+    def test_rules_are_listed(self):
+        status, output, errors = self.check("--list-rules")
+        self.assertEqual((status, errors), (0, ""))
+        for line in output.splitlines():
+            self.assertRegex(line, r"^[a-z0-9-]+ +(error|warning|info) +\S.*$")
+            self.assertEqual(self.check("--disable", line.split()[0], "--list-rules")[0], 0)
+
+    def test_wrong_use(self):
+        for arguments, reason in [([], "no file is named"), (["--disable=dropped-lime", "x"], "unknown rule 'dropped-lime'"), (["-", "-"], "standard input"),
+                                  (["--baseline=-", "--reference=-", "x"], "standard input"), (["--format=xml", "x"], "--format"),
+                                  (["--color=sometimes", "x"], "--color"), (["--fail-on=fatal", "x"], "--fail-on")]:
+            status, output, errors = self.check(*arguments)
+            self.assertEqual((status, output), (2, ""))
+            self.assertRegex(errors, rf"\Akolvane: check: {reason}.*\ntry 'kolvane check --help'\n\Z")
+        self.assertIn("Examples:\n  kolvane check ", self.check("--help")[1])
+
+    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
+    def test_output_that_cannot_be_written(self):
+        name = self.file(DROPPED)
+        for form in ["text", "json", "sarif", "github"]:
+            with open("/dev/full", "wb") as full:
+                status, _, errors = self.check(f"--format={form}", name, stdout=full)
+            self.assertEqual((status, errors), (2, "kolvane: cannot write to standard output: No space left on device\n"))
+
+    def test_closed_pipe_is_quiet(self):
+        name = self.file(DROPPED * 20000)
+        with subprocess.Popen([*KOLVANE, "check", name], cwd=self.folder, stdout=subprocess.PIPE, stderr=subprocess.PIPE) as process:
+            process.stdout.close()
+            self.assertEqual(process.stderr.read(), b"")
+            self.assertNotIn(process.wait(), (0, 1))
+
+
+if __name__ == "__main__":
+    unittest.main()
