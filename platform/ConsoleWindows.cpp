@@ -5,9 +5,9 @@
 #include <shellapi.h>
 #include <stdio.h>
 #include <stdlib.h>
-#include <string.h>
 
 #include <memory>
+#include <string_view>
 
 #include "Console.h"
 #include "WideText.h"
@@ -43,10 +43,8 @@ bool StandardOutputShowsColour() noexcept {
   constexpr DWORD kEscapes = 0x0004;  // ENABLE_VIRTUAL_TERMINAL_PROCESSING, since Windows 10
   const HANDLE output = ::GetStdHandle(STD_OUTPUT_HANDLE);
   if (::GetConsoleMode(output, &gConsoleModeBefore) == 0) return false;
-  if (const char* const kind = std::getenv("TERM");
-      kind != nullptr && std::strcmp(kind, "dumb") == 0) {
-    return false;
-  }
+  const char* const kind = std::getenv("TERM");
+  if (kind != nullptr && std::string_view(kind) == "dumb") return false;
   if ((gConsoleModeBefore & kEscapes) != 0) return true;
   if (::SetConsoleMode(output, gConsoleModeBefore | kEscapes) == 0) return false;
   std::atexit([] { ::SetConsoleMode(::GetStdHandle(STD_OUTPUT_HANDLE), gConsoleModeBefore); });
