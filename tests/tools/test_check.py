@@ -84,6 +84,7 @@ class Check(unittest.TestCase):
         self.assertRegex(line, r"^  \.\.\.日+\^qx+\.\.\.$")
         self.assertLess(sum(room(line)), 220)
         self.assertIn(len(mark) - 1 - sum(room(line[:line.index("^")])), (0, 1))
+        self.assertEqual(len(self.findings(self.file('"$$$/escape=' + "^q" * 100000 + '"\n'))), 20)
 
     def test_controls_are_escaped(self):
         name = self.file('"$$$/twi\x1b[31mce=\x07"\n"$$$/twi\x1b[31mce=\u009b^q"\n')

@@ -81,7 +81,7 @@ void CheckAcross(const Definitions& definitions, Definitions& earlier,
                       .message = fmt::format("key '{}' is defined in another file too",
                                              Excerpt(KeyText(definition.key))),
                       .key = KeyText(definition.key)};
-      finding.notes.push_back({other->place, "defined here"});
+      finding.notes.push_back(NoteOf(other->place, "defined here"));
       findings.push_back(std::move(finding));
     } else {
       earlier.Put(definition);

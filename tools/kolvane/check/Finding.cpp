@@ -1,5 +1,7 @@
 #include "Finding.h"
 
+#include <utility>
+
 std::string_view SeverityName(Severity severity) noexcept {
   switch (severity) {
     case Severity::kInfo:
@@ -10,4 +12,14 @@ std::string_view SeverityName(Severity severity) noexcept {
       return "error";
   }
   return {};
+}
+
+Note NoteOf(const Place& place, std::string text) {
+  return {{.file = place.file,
+           .line = place.line,
+           .column = place.column,
+           .entry = place.entry,
+           .hasOffset = place.hasOffset,
+           .offset = place.offset},
+          std::move(text)};
 }

@@ -34,11 +34,14 @@ struct Place {
   std::string lineText{};  // the line in UTF-8 as it is, its end left out; empty with line 0
 };
 
-// Another place that has to do with a finding, and what is there.
+// Another place that has to do with a finding, and what is there. One place may be noted by very
+// many findings, and so comes without the text of its line.
 struct Note {
   Place place;
   std::string text;
 };
+
+Note NoteOf(const Place& place, std::string text);
 
 // Texts are in UTF-8, lower case at their start, without a full stop, and may quote what the
 // dictionary holds: control characters are still to be escaped.

@@ -133,7 +133,7 @@ class ImageCheck {
     if (other != nullptr) {
       Report(rules::kShadowedEntry, isShadowed ? place : other->place, key,
              fmt::format("'{}' hides behind another entry of its key", Shown(key)))
-          .notes.push_back({isShadowed ? other->place : place, "this one is found"});
+          .notes.push_back(NoteOf(isShadowed ? other->place : place, "this one is found"));
     }
     if (isShadowed) return;
     definitions.Put({key, ValueOf(entry), place});

@@ -20,6 +20,10 @@ using Split = std::optional<tovali_private::SplitText<uint16_t>>;
 
 constexpr uint16_t kByteOrderMark = 0xFEFF;
 
+// What is reported of one line at most; more of its kind would tell no more, and each finding keeps
+// the line.
+constexpr size_t kMostFaults = 20;
+
 bool IsSpace(uint16_t unit) noexcept {
   return unit == ' ' || unit == '\t' || unit == kByteOrderMark;
 }
@@ -52,9 +56,7 @@ class LineCheck {
     }
     CheckKey();
     CheckDuplicate(definitions);
-    for (const EscapeFault& fault : FaultsOfEscapes(split->value)) {
-      Report(*fault.rule, IndexOf(split->value) + fault.at, fault.message);
-    }
+    CheckEscapes();
     const KolvaneString value = tovali_private::Unescape(split->value);
     definitions.Put({key, {value.Units().begin(), value.Units().end()}, PlaceAt(IndexOf(entry))});
   }
@@ -78,10 +80,19 @@ class LineCheck {
     return findings.emplace_back(std::move(finding));
   }
 
+  void CheckEscapes() {
+    std::vector<EscapeFault> faults = FaultsOfEscapes(split->value);
+    if (faults.size() > kMostFaults) faults.resize(kMostFaults);
+    for (const EscapeFault& fault : faults) {
+      Report(*fault.rule, IndexOf(split->value) + fault.at, fault.message);
+    }
+  }
+
   void CheckCharacters() {
+    size_t halves = 0;
     for (size_t at = 0; at < line.text.size();) {
       const char32_t codePoint = CodePointAt(line.text, at);
-      if (IsSurrogate(codePoint)) {
+      if (IsSurrogate(codePoint) && ++halves <= kMostFaults) {
         Report(rules::kMalformedInput, at,
                fmt::format("{} is half of a character", CodePointText(codePoint)));
       }
@@ -145,7 +156,7 @@ class LineCheck {
     Report(
         rules::kDuplicateKey, IndexOf(entry),
         fmt::format("key '{}' is defined again; the last definition wins", Excerpt(KeyText(key))))
-        .notes.push_back({earlier->place, "first defined here"});
+        .notes.push_back(NoteOf(earlier->place, "first defined here"));
   }
 
   const std::string& file;

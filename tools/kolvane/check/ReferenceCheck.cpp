@@ -4,6 +4,7 @@
 
 #include <map>
 #include <optional>
+#include <string>
 #include <utility>
 
 #include "Accelerators.h"
@@ -19,6 +20,13 @@ std::string FolderOf(const std::string& key) {
   const size_t slash = key.rfind('/');
   return slash == key.npos ? "" : key.substr(0, slash);
 }
+
+// The first of the siblings that have a letter. It may be long, and is looked at once.
+struct Accelerator {
+  const Definition* holder = nullptr;
+  std::string shown{};
+  std::optional<char32_t> sourceLetter{};  // in the reference
+};
 
 class ReferenceCheck {
  public:
@@ -44,29 +52,30 @@ class ReferenceCheck {
     }
     for (Difference& difference : Compare(source->value, translation.value)) {
       Report(*difference.rule, translation, std::move(difference.message))
-          .notes.push_back({source->place, "the reference is here"});
+          .notes.push_back(NoteOf(source->place, "the reference is here"));
     }
   }
 
   void CheckAccelerator(const Definition& translation) {
     const std::optional<char32_t> letter = AcceleratorOf(translation.value);
     if (!letter) return;
-    const auto [first, isFirst] =
-        accelerators.try_emplace({FolderOf(translation.key), *letter}, &translation);
-    if (isFirst || ClashesInReference(*first->second, translation)) return;
-    Report(rules::kAcceleratorClash, translation,
-           fmt::format("'{}' has the same accelerator as '{}'", Shown(translation),
-                       Shown(*first->second)))
-        .notes.push_back({first->second->place, "the other one is here"});
+    const std::optional<char32_t> sourceLetter = LetterInReference(translation);
+    const auto [place, isFirst] =
+        accelerators.try_emplace({FolderOf(translation.key), *letter}, Accelerator{});
+    Accelerator& first = place->second;
+    if (isFirst) {
+      first = {&translation, Shown(translation), sourceLetter};
+    } else if (!sourceLetter || sourceLetter != first.sourceLetter) {
+      Report(rules::kAcceleratorClash, translation,
+             fmt::format("'{}' has the same accelerator as '{}'", Shown(translation), first.shown))
+          .notes.push_back(NoteOf(first.holder->place, "the other one is here"));
+    }
   }
 
-  bool ClashesInReference(const Definition& one, const Definition& other) const {
-    if (reference == nullptr) return false;
-    const Definition* const first = reference->Find(one.key);
-    const Definition* const second = reference->Find(other.key);
-    if (first == nullptr || second == nullptr) return false;
-    const auto letter = AcceleratorOf(first->value);
-    return letter && letter == AcceleratorOf(second->value);
+  std::optional<char32_t> LetterInReference(const Definition& translation) const {
+    const Definition* const source =
+        reference == nullptr ? nullptr : reference->Find(translation.key);
+    return source == nullptr ? std::nullopt : AcceleratorOf(source->value);
   }
 
   void CheckMissing() {
@@ -76,7 +85,7 @@ class ReferenceCheck {
                       .place = {.file = file},
                       .message = fmt::format("key '{}' is missing", Shown(source)),
                       .key = KeyText(source.key)};
-      finding.notes.push_back({source.place, "the reference is here"});
+      finding.notes.push_back(NoteOf(source.place, "the reference is here"));
       findings.push_back(std::move(finding));
     }
   }
@@ -96,7 +105,7 @@ class ReferenceCheck {
   const Definitions& translations;
   const Definitions* reference;
   std::vector<Finding>& findings;
-  std::map<std::pair<std::string, char32_t>, const Definition*> accelerators;
+  std::map<std::pair<std::string, char32_t>, Accelerator> accelerators;
 };
 
 }  // namespace

@@ -35,7 +35,7 @@ class TextWriter {
                             Painted(fmt::format("{}:", SeverityName(severity)), ColourOf(severity)),
                             Printable(finding.message), finding.rule->name));
     for (const Note& note : finding.notes) Write(note);
-    if (style.snippets && finding.place.line != 0) WriteSnippet(finding.place);
+    if (style.snippets && !finding.place.lineText.empty()) WriteSnippet(finding.place);
   }
 
  private:
