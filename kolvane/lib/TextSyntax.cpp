@@ -122,7 +122,27 @@ LineObstacle ObstacleIn(Units value) noexcept {
   return LineObstacle::kNone;
 }
 
+constexpr bool IsInvisible(uint16_t unit) noexcept {
+  return unit == 0x00A0 || unit == 0x00AD || (unit >= 0x2000 && unit <= 0x200F);
+}
+
+// The name of what would not be seen in a line, or null.
+const NamedCharacter* NameOfInvisible(uint16_t unit) noexcept {
+  if (!IsInvisible(unit)) return nullptr;
+  const auto names = NamedCharacters();
+  const auto found = std::find_if(names.begin(), names.end(), [unit](const NamedCharacter& named) {
+    return named.character[0] == unit;
+  });
+  return found == names.end() ? nullptr : &*found;
+}
+
 void AppendEscaped(uint16_t unit, std::vector<uint16_t>& line) {
+  if (const NamedCharacter* const named = NameOfInvisible(unit)) {
+    line.insert(line.end(), {'#', '{'});
+    line.insert(line.end(), named->name.begin(), named->name.end());
+    line.push_back('}');
+    return;
+  }
   const Escape* const escape =
       std::find_if(std::begin(kBackslashEscapes), std::end(kBackslashEscapes),
                    [unit](const Escape& each) { return each.character == unit; });

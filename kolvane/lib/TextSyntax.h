@@ -78,7 +78,8 @@ enum class LineObstacle : uint8_t {
 };
 
 // Appends the line that defines the key, which is bytes, with the value: StoreLine stores exactly
-// them. No terminator is appended, and nothing at all where there is an obstacle. Where the value
+// them. Spaces and the like that cannot be seen are written by name, where they have one. No
+// terminator is appended, and nothing at all where there is an obstacle. Where the value
 // ends in a backslash, the line has no closing quote: it would be taken for an escaped one.
 LineObstacle AppendLine(std::span<const uint8_t> key, std::span<const uint16_t> value,
                         std::vector<uint16_t>& line);

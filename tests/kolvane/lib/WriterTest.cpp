@@ -52,9 +52,9 @@ std::string AsText(DictionaryTable& table, Answers& written) {
 
 // Keys and values of what is awkward, put together at random: a few of one bucket, some twice.
 std::vector<std::pair<std::string, std::string>> RandomEntries(std::mt19937& random) {
-  static const std::u16string kParts[] = {u"a",      u"\\",     u"\"",     u"^",      u"#",  u"#{", u"}",   u"amp", u"#{amp}",
-                                          u"=",      u"$",      u"\n",     u"\r",     u"\t", u"\b", u" ",   u"Q",   u"n",
-                                          u"\u2028", u"\uFEFF", u"\xD83D", u"\xDE00", u"😀",  u"é",  {u'\0'}};
+  static const std::u16string kParts[] = {u"a",      u"\\",     u"\"",     u"^",      u"#",      u"#{",     u"}", u"amp", u"#{amp}",
+                                          u"=",      u"$",      u"\n",     u"\r",     u"\t",     u"\b",     u" ", u"Q",   u"n",
+                                          u"\u2028", u"\uFEFF", u"\u00A0", u"\u200B", u"\xD83D", u"\xDE00", u"😀", u"é",   {u'\0'}};
   const auto text = [&](size_t most) {
     std::u16string made;
     for (size_t count = random() % (most + 1); count > 0; --count) made += kParts[random() % std::size(kParts)];

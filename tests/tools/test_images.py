@@ -1,0 +1,162 @@
+"""Runs compile, dump and convert, and every command on files that fail: test_images.py COMMAND SAMPLES ISO-CODES."""
+
+import json
+import os
+import pathlib
+import subprocess
+import sys
+import tempfile
+import unittest
+
+KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
+SAMPLES = pathlib.Path(sys.argv.pop(1)).resolve()
+ISO_CODES = pathlib.Path(sys.argv.pop(1)).resolve()
+PAD = b"\n" * 30
+
+
+class Images(unittest.TestCase):
+    def setUp(self):
+        folder = tempfile.TemporaryDirectory()
+        self.addCleanup(folder.cleanup)
+        self.folder = pathlib.Path(folder.name)
+
+    def run_kolvane(self, *arguments, stdin=b"", **options):
+        """Returns the status, standard output and standard error."""
+        done = subprocess.run([*KOLVANE, *map(str, arguments)], input=stdin, cwd=self.folder, timeout=60, stderr=subprocess.PIPE,
+                              stdout=options.pop("stdout", subprocess.PIPE), **options)
+        return done.returncode, done.stdout or b"", done.stderr.decode()
+
+    def good(self, *arguments, **options):
+        status, output, errors = self.run_kolvane(*arguments, **options)
+        self.assertEqual((status, errors), (0, ""), arguments)
+        return output
+
+    def file(self, name, content):
+        self.folder.joinpath(name).write_bytes(content)
+        return name
+
+    def bytes_of(self, name):
+        return self.folder.joinpath(name).read_bytes()
+
+    def test_compile_dump_compile(self):
+        for path in [*SAMPLES.glob("*.txt"), *SAMPLES.glob("*.bin"), *ISO_CODES.glob("*iso_3166-1.txt")]:
+            for options in [["--format", "1.0", "--values", "utf-8"], ["--format", "1.5"]]:
+                with self.subTest(path.name, options=options):
+                    self.good("compile", path, "-o", "one", *options)
+                    for source, how in [("one", []), ("one", ["--utf-16"]), (path, ["--sort"])]:
+                        self.file("text", self.good("dump", source, *how))
+                        self.good("compile", "text", "-o", "two", *options)
+                        self.assertEqual(self.bytes_of("one"), self.bytes_of("two"))
+                    keys = b"".join(b"$$$" + entry["key"].encode() + b"=?\0"
+                                    for entry in json.loads(self.good("dump", "--json", path))["entries"])
+                    self.assertEqual(self.good("translate", "--nul", "--dictionary", "one", stdin=keys),
+                                     self.good("translate", "--nul", "--dictionary", path, stdin=keys))
+
+    def test_inputs_merge_as_loads_do(self):
+        self.file("a", b'"/k=one"\n"/a=first"' + PAD)
+        self.file("b", b'"/k=two"\n"/k=last"\n"/b=second"' + PAD)
+        self.good("compile", "a", "b", "-o", "ab")
+        self.assertEqual(self.good("dump", "--sort", "ab"), b'"$$$/a=first"\n"$$$/b=second"\n"$$$/k=last"\n')
+        self.assertEqual(self.good("compile", "ab", "-", "-o", "-", stdin=self.bytes_of("a")),
+                         self.good("compile", "b", "a", "-o", "-"))
+
+    def test_an_equal_image_is_left_alone(self):
+        self.file("a", b'"/k=one"' + PAD)
+        self.good("compile", "a", "-o", "out")
+        os.utime(self.folder / "out", (1, 1))
+        self.good("compile", "a", "-o", "out")
+        self.assertEqual(self.folder.joinpath("out").stat().st_mtime, 1)
+        self.good("compile", "a", "-o", "out", "--format", "1.0")
+        self.assertNotEqual(self.folder.joinpath("out").stat().st_mtime, 1)
+        self.assertEqual(sorted(path.name for path in self.folder.iterdir()), ["a", "out"])
+
+    def test_nothing_is_written_where_something_would_be_lost(self):
+        self.file("polish", '"/k=Żółć"\n"/a=ok"'.encode() + PAD)
+        self.file("half", '\ufeff"/k=a\ud800b"'.encode("utf-16-le", "surrogatepass") + PAD)
+        image = self.good("compile", "polish", "-o", "-")
+        self.file("cut", image[:-1])
+        for arguments, message in [(["polish", "--values", "code-page"], "'/k': its translation holds U+017B, which the code page cannot carry"),
+                                   (["half", "--values", "utf-8"], "'/k': its translation holds U+D800, which UTF-8 cannot carry"),
+                                   (["cut"], "cut: warning: the image is cut short"), (["polish", "missing"], "missing: No such file")]:
+            status, output, errors = self.run_kolvane("compile", *arguments, "-o", "out")
+            self.assertEqual((status, output), (2, b""))
+            self.assertIn(message, errors)
+            self.assertIn("nothing was written", errors)
+            self.assertFalse(self.folder.joinpath("out").exists())
+        self.good("compile", "half", "-o", "out")
+        self.assertEqual(json.loads(self.good("dump", "--json", "out")), {"version": 1, "entries": [{"key": "/k", "valueUnits": [97, 0xD800, 98]}]})
+
+    def test_dump_says_what_text_cannot_hold(self):
+        values = ['"', "^#{", "\\", "a\0", "#{amp}", "\u2028", "\ud800", "\t\r\n\b", "plain"]
+        keys = [f"/{i}".encode() for i in range(len(values))]
+        data = [value.encode("utf-16-le", "surrogatepass") for value in values]
+        lengths = b"".join(len(part).to_bytes(4, "little") for pair in zip(keys, data) for part in pair)
+        buckets = b"".join((47 * 32 + key[1]).__mod__(1021).to_bytes(2, "little") for key in keys)
+        counts = b"".join((2 * i + 2).to_bytes(4, "little") for i in range(len(keys)))
+        self.file("image", b"Kolvane Binary Format\1\5\0" + len(keys).to_bytes(4, "little") + counts + lengths + buckets
+                  + b"".join(key + value for key, value in zip(keys, data)))
+        status, output, errors = self.run_kolvane("dump", "image")
+        self.assertEqual(status, 1)
+        self.assertEqual(output.decode(), '"$$$/0=\\""\n"$$$/1=^^#{"\n"$$$/2=\\\\\n"$$$/7=\\t\\r\\n\\b"\n"$$$/8=plain"\n')
+        self.assertEqual([line[len("kolvane: image: '/"):][0] for line in errors.splitlines()], ["3", "4", "5", "6"])
+        self.assertEqual(self.run_kolvane("dump", "--utf-16", "image")[2].count("\n"), 3)
+        self.assertEqual(len(json.loads(self.good("dump", "--json", "image"))["entries"]), len(keys))
+        self.file("cut", self.bytes_of("image")[:-4])
+        self.assertEqual(self.run_kolvane("dump", "--json", "cut")[0], 1)
+
+    def test_convert_changes_the_encoding_alone(self):
+        text = 'odd  "$$$/a=é" \r\r\n\n"$$$/b=^x€\rno end'
+        forms = {"utf-8": text.encode(), "utf-16le": b"\xff\xfe" + text.encode("utf-16-le"),
+                 "utf-16be": b"\xfe\xff" + text.encode("utf-16-be"), "code-page": text.encode("cp1252")}
+        for source, content in forms.items():
+            for target, expected in forms.items():
+                self.file("in", content)
+                self.good("convert", "in", "-o", "out", "--to", target)
+                self.assertEqual(self.bytes_of("out"), expected, (source, target))
+
+    def test_convert_names_what_the_target_lacks(self):
+        image = self.good("compile", SAMPLES / "it.txt", "-o", "-")
+        for content, options, message in [
+                ('"/a=x"\r\n"/b=€ł"\n"/c=ń"\n'.encode(), ["--to", "code-page"], "in:2:6: U+0142 has no place in the code page\nkolvane: in:3:5: "),
+                ('\ufeff"/a=😀\ud83d"'.encode("utf-16-be", "surrogatepass"), ["--to", "utf-8"], "in:1:6: U+D83D has no place in UTF-8\n"),
+                (b'"/a=x"\n"/b=\xff"', ["--to", "utf-16le", "--encoding", "utf-8"], "in:2: byte 11 is malformed UTF-8\n"),
+                (b'\xff\xfe"', ["--to", "utf-8"], "in: byte 2 is half a character\n"),
+                (image, ["--to", "utf-8"], "in: a binary dictionary has no encoding to change")]:
+            status, output, errors = self.run_kolvane("convert", self.file("in", content), "-o", "out", *options)
+            self.assertEqual((status, output), (2, b""))
+            self.assertIn(message, errors)
+            self.assertFalse(self.folder.joinpath("out").exists())
+
+    # How each command is called on a file, in a way that prints something.
+    COMMANDS = [["compile", "-o", "-"], ["dump"], ["convert", "-o", "-", "--to", "utf-8"], ["check", "-W", "--fail-on=info"],
+                ["stats"], ["translate", "a=b", "--dictionary"]]
+
+    def test_files_that_cannot_be_read(self):
+        self.folder.joinpath("folder").mkdir()
+        for command in self.COMMANDS:
+            for name, reason in [("missing", "No such file or directory"), ("folder", "Is a directory|Permission denied")]:
+                status, output, errors = self.run_kolvane(*command, name)
+                self.assertEqual(status, 2, command)
+                self.assertRegex(errors, f"^kolvane: {name}: ({reason})\n")
+
+    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
+    def test_output_that_cannot_be_written(self):
+        self.file("in", b'"/a=b"\n"/a=\xe9^x"' + PAD)
+        for command in self.COMMANDS:
+            with open("/dev/full", "wb") as full:
+                status, _, errors = self.run_kolvane(*command, "in", stdout=full)
+            self.assertEqual(status, 2, command)
+            self.assertIn("kolvane: cannot write to standard output: No space left on device\n", errors)
+            reading, writing = os.pipe()
+            os.close(reading)
+            with os.fdopen(writing, "wb") as closed:
+                status, _, errors = self.run_kolvane(*command, "in", stdout=closed, restore_signals=False)
+            self.assertEqual((status, "write" in errors), (2, False), command)
+        for name in ["/dev/full", "no-folder/out"]:
+            status, output, errors = self.run_kolvane("compile", "in", "-o", name)
+            self.assertEqual((status, output), (2, b""))
+            self.assertRegex(errors, f"^kolvane: {name}: .+\n$")
+
+
+if __name__ == "__main__":
+    unittest.main()
