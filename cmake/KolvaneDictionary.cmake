@@ -1,0 +1,93 @@
+#[[
+Compiles dictionaries as part of a build.
+
+  kolvane_add_dictionary(<target> SOURCES <file>...
+    [OUTPUT <file>]
+    [FORMAT 1.5|1.0]
+    [VALUES utf-16|utf-8|code-page]
+    [ENCODING auto|image|utf-8])
+
+Adds a target, built by default, that makes one binary dictionary of the sources, with `kolvane
+compile` and its options of these names. Sources are looked for from the current source folder. OUTPUT
+is meant from the current binary folder and must lie in the build folder; `<target>.kdict` if not
+given. Its full path is the target's property KOLVANE_DICTIONARY, for whoever installs or copies it:
+
+  install(FILES $<TARGET_PROPERTY:<target>,KOLVANE_DICTIONARY> DESTINATION share/example)
+
+The command is the one that comes with this file, or the one that the variable KOLVANE_COMMAND names.
+In a cross build, CMAKE_CROSSCOMPILING_EMULATOR runs the former; without an emulator, one of the
+machine that builds is looked for on the PATH.
+]]
+
+# A command line, and the file or target that it depends on.
+function(_kolvane_find_command outCommand outDepends)
+  if(CMAKE_CROSSCOMPILING AND NOT CMAKE_CROSSCOMPILING_EMULATOR)
+    find_program(KOLVANE_COMMAND kolvane PATHS ENV PATH NO_DEFAULT_PATH NO_CMAKE_FIND_ROOT_PATH
+      DOC "The kolvane command of the machine that builds")
+    if(NOT KOLVANE_COMMAND)
+      message(FATAL_ERROR "There is no kolvane command that the machine that builds can run. "
+        "Set KOLVANE_COMMAND to one.")
+    endif()
+  endif()
+  if(KOLVANE_COMMAND)
+    set(${outCommand} ${KOLVANE_COMMAND} PARENT_SCOPE)
+    set(${outDepends} ${KOLVANE_COMMAND} PARENT_SCOPE)
+  elseif(CMAKE_CROSSCOMPILING)
+    set(${outCommand} ${CMAKE_CROSSCOMPILING_EMULATOR} $<TARGET_FILE:Kolvane::kolvane> PARENT_SCOPE)
+    set(${outDepends} Kolvane::kolvane PARENT_SCOPE)
+  else()
+    set(${outCommand} Kolvane::kolvane PARENT_SCOPE)
+    set(${outDepends} Kolvane::kolvane PARENT_SCOPE)
+  endif()
+endfunction()
+
+# Sources stay as they are, and nothing is written among them.
+function(_kolvane_check_output output sources)
+  cmake_path(IS_PREFIX CMAKE_BINARY_DIR ${output} isInBuild)
+  if(NOT isInBuild OR output IN_LIST sources)
+    message(FATAL_ERROR "kolvane_add_dictionary: the OUTPUT ${output} is not in the build folder, "
+      "or is one of the SOURCES.")
+  endif()
+endfunction()
+
+function(kolvane_add_dictionary target)
+  cmake_parse_arguments(PARSE_ARGV 1 arg "" "OUTPUT;FORMAT;VALUES;ENCODING" "SOURCES")
+  if(NOT arg_SOURCES OR arg_UNPARSED_ARGUMENTS OR arg_KEYWORDS_MISSING_VALUES)
+    message(FATAL_ERROR "kolvane_add_dictionary(<target> SOURCES <file>... [OUTPUT <file>] "
+      "[FORMAT <version>] [VALUES <encoding>] [ENCODING <encoding>])")
+  endif()
+
+  set(sources)
+  foreach(source IN LISTS arg_SOURCES)
+    cmake_path(ABSOLUTE_PATH source BASE_DIRECTORY ${CMAKE_CURRENT_SOURCE_DIR} NORMALIZE)
+    list(APPEND sources ${source})
+  endforeach()
+  set(output ${target}.kdict)
+  if(arg_OUTPUT)
+    set(output ${arg_OUTPUT})
+  endif()
+  cmake_path(ABSOLUTE_PATH output BASE_DIRECTORY ${CMAKE_CURRENT_BINARY_DIR} NORMALIZE)
+  _kolvane_check_output(${output} "${sources}")
+
+  set(options)
+  foreach(option FORMAT VALUES ENCODING)
+    if(arg_${option})
+      string(TOLOWER ${option} name)
+      list(APPEND options --${name} ${arg_${option}})
+    endif()
+  endforeach()
+
+  # The command leaves an output that is right untouched: the stamp tells that it was asked.
+  set(stamp ${CMAKE_CURRENT_BINARY_DIR}/CMakeFiles/${target}.stamp)
+  cmake_path(GET output PARENT_PATH folder)
+  _kolvane_find_command(command commandDepends)
+  add_custom_command(OUTPUT ${stamp} ${output}
+    COMMAND ${CMAKE_COMMAND} -E make_directory ${folder}
+    COMMAND ${command} compile ${sources} -o ${output} ${options}
+    COMMAND ${CMAKE_COMMAND} -E touch ${stamp}
+    DEPENDS ${sources} ${commandDepends}
+    COMMENT "Compiling dictionary ${target}"
+    VERBATIM)
+  add_custom_target(${target} ALL DEPENDS ${stamp} ${output})
+  set_target_properties(${target} PROPERTIES KOLVANE_DICTIONARY ${output})
+endfunction()
