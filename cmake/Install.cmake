@@ -1,0 +1,99 @@
+# What is installed, where, and under which names others link it: the same in this tree as with
+# find_package(Kolvane). Files find each other by relative paths, so that a prefix can be moved.
+
+# Debian's folder for libraries, whatever the prefix: the package is like any other installation.
+if(EXISTS /etc/debian_version AND CMAKE_LIBRARY_ARCHITECTURE)
+  set(CMAKE_INSTALL_LIBDIR lib/${CMAKE_LIBRARY_ARCHITECTURE} CACHE PATH "Libraries")
+endif()
+set(CMAKE_INSTALL_DOCDIR share/doc/kolvane CACHE PATH "Documentation")
+include(GNUInstallDirs)
+include(CMakePackageConfigHelpers)
+
+set(headers ${CMAKE_INSTALL_INCLUDEDIR}/kolvane)
+set(package lib/cmake/Kolvane)  # where projects without a language look, too
+if(WIN32)
+  set(loaded ${CMAKE_INSTALL_BINDIR})
+else()
+  set(loaded ${CMAKE_INSTALL_LIBDIR})
+endif()
+
+# Others know `target` as Kolvane::`name`. More arguments say what install() does with it.
+function(install_target target name)
+  if(name STREQUAL kolvane)
+    add_executable(Kolvane::${name} ALIAS ${target})
+  else()
+    add_library(Kolvane::${name} ALIAS ${target})
+  endif()
+  set_target_properties(${target} PROPERTIES EXPORT_NAME ${name})
+  install(TARGETS ${target} EXPORT KolvaneTargets
+    RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR}
+    LIBRARY DESTINATION ${loaded}
+    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} ${ARGN})
+endfunction()
+
+# Headers go into a folder of each library's own: names like Data.h are for those who link it.
+function(install_library target name folder)
+  install_target(${target} ${name} FILE_SET HEADERS DESTINATION ${headers}/${folder})
+endfunction()
+
+# For a target whose header add_public_header shows.
+function(install_with_header target name header folder)
+  install_target(${target} ${name})
+  install(FILES ${header} DESTINATION ${headers}/${folder})
+  target_include_directories(${target} INTERFACE $<INSTALL_INTERFACE:${headers}/${folder}>)
+endfunction()
+
+install_target(kolvane kolvane)
+install_target(VRKKolvanes VRKKolvanes)
+install_with_header(VarnelKernel VarnelKernel varnel-kernel/VarnelKernelHost.h kernel)
+install_with_header(varnel_kernel_interface VarnelKernelInterface
+  wrapper-framework/source/VarnelKernel.h kernel)
+install_with_header(kolvane_translator_interface TranslatorInterface
+  kolvane/api/VRKStringTranslatorInterface.h messaging)
+install_library(kolvane_translator_messaging TranslatorMessaging messaging)
+install_library(varnel_framework VarnelFramework framework)
+install_library(kolvane_lib Dictionary dictionary)
+install_library(kolvane_platform Platform platform)
+
+file(RELATIVE_PATH binToLib ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FULL_LIBDIR})
+set_target_properties(kolvane PROPERTIES INSTALL_RPATH $ORIGIN/${binToLib})
+set_target_properties(VRKKolvanes PROPERTIES INSTALL_RPATH $ORIGIN)
+
+# The CMake package.
+configure_package_config_file(cmake/KolvaneConfig.cmake.in KolvaneConfig.cmake
+  INSTALL_DESTINATION ${package} NO_SET_AND_CHECK_MACRO)
+write_basic_package_version_file(KolvaneConfigVersion.cmake COMPATIBILITY SameMinorVersion)
+install(EXPORT KolvaneTargets NAMESPACE Kolvane:: DESTINATION ${package})
+install(FILES
+  ${PROJECT_BINARY_DIR}/KolvaneConfig.cmake
+  ${PROJECT_BINARY_DIR}/KolvaneConfigVersion.cmake
+  cmake/KolvaneDictionary.cmake
+  DESTINATION ${package})
+
+# pkg-config.
+file(RELATIVE_PATH pkgConfigToPrefix ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
+foreach(name kolvane kolvane-dictionary varnel-kernel)
+  configure_file(cmake/${name}.pc.in ${name}.pc @ONLY)
+  install(FILES ${PROJECT_BINARY_DIR}/${name}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+endforeach()
+
+# What people read.
+install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(FILES docs/dictionaries.md docs/host-guide.md DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs)
+if(NOT WIN32)
+  find_program(GZIP gzip REQUIRED)
+  set(manual ${PROJECT_BINARY_DIR}/kolvane.1.gz)
+  add_custom_command(OUTPUT ${manual}
+    COMMAND ${GZIP} -9nc ${PROJECT_SOURCE_DIR}/docs/kolvane.1 > ${manual}
+    DEPENDS docs/kolvane.1 VERBATIM)
+  add_custom_target(kolvane_manual ALL DEPENDS ${manual})
+  install(FILES ${manual} DESTINATION ${CMAKE_INSTALL_MANDIR}/man1)
+  install(FILES tools/kolvane/completions/kolvane.bash RENAME kolvane
+    DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions)
+  if(EXISTS /etc/debian_version)
+    set(zsh ${CMAKE_INSTALL_DATADIR}/zsh/vendor-completions)
+  else()
+    set(zsh ${CMAKE_INSTALL_DATADIR}/zsh/site-functions)
+  endif()
+  install(FILES tools/kolvane/completions/_kolvane DESTINATION ${zsh})
+endif()
