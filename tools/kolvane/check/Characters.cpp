@@ -31,6 +31,10 @@ bool IsLetter(char32_t code) {
   return ucd::is_alphabetic(code);
 }
 
+bool IsDigit(char32_t code) {
+  return ucd::is_decimal_number(code);
+}
+
 bool IsControl(char32_t code) {
   return ucd::is_control(code);
 }

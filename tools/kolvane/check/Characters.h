@@ -14,6 +14,7 @@ struct Character {
 Character CharacterAt(std::span<const uint16_t> text, size_t at);
 
 bool IsLetter(char32_t code);
+bool IsDigit(char32_t code);
 bool IsControl(char32_t code);
 
 // A quotation mark or bracket of any script, opening or closing.

@@ -82,21 +82,6 @@ void CompareEdges(char32_t reference, char32_t translation, std::string_view edg
                                                                    : "not in the reference")});
 }
 
-// Whether a translator has anything to do with the text.
-bool HasLetter(Units text, const Placeholders& placeholders) {
-  auto next = placeholders.all.begin();
-  for (size_t at = 0; at < text.size();) {
-    if (next != placeholders.all.end() && at == next->start) {
-      at += next++->length;
-      continue;
-    }
-    const Character character = CharacterAt(text, at);
-    if (IsLetter(character.code)) return true;
-    at += character.length;
-  }
-  return false;
-}
-
 }  // namespace
 
 std::vector<Difference> Compare(Units reference, Units translation) {
@@ -115,4 +100,18 @@ std::vector<Difference> Compare(Units reference, Units translation) {
     differences.push_back({&rules::kUntranslated, "the translation is the same as the reference"});
   }
   return differences;
+}
+
+bool HasLetter(Units text, const Placeholders& placeholders) {
+  auto next = placeholders.all.begin();
+  for (size_t at = 0; at < text.size();) {
+    if (next != placeholders.all.end() && at == next->start) {
+      at += next++->length;
+      continue;
+    }
+    const Character character = CharacterAt(text, at);
+    if (IsLetter(character.code)) return true;
+    at += character.length;
+  }
+  return false;
 }

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "Finding.h"
+#include "Placeholders.h"
 
 struct Difference {
   const Rule* rule;
@@ -24,3 +25,6 @@ struct Difference {
 // Takes time linear in the texts, but for the sorting of their placeholders.
 std::vector<Difference> Compare(std::span<const uint16_t> reference,
                                 std::span<const uint16_t> translation);
+
+// Whether the text has a letter outside of its placeholders, and so anything to translate.
+bool HasLetter(std::span<const uint16_t> text, const Placeholders& placeholders);
