@@ -18,6 +18,7 @@
 #include "Messages.h"
 #include "OVErrException.h"
 #include "StandardOutput.h"
+#include "StatsCommand.h"
 #include "TranslateCommand.h"
 
 namespace {
@@ -33,6 +34,7 @@ constexpr Command kCommands[] = {
     {"compile", "make a binary image of dictionaries", RunCompile},
     {"convert", "change the encoding of a text dictionary", RunConvert},
     {"dump", "print a dictionary as text", RunDump},
+    {"stats", "count what dictionaries hold, and what is translated", RunStats},
     {"translate", "translate keys with dictionaries", RunTranslate},
 };
 

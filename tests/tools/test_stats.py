@@ -1,0 +1,169 @@
+"""Runs `kolvane stats` as its users do: test_stats.py COMMAND SAMPLES."""
+
+import csv
+import html.parser
+import io
+import json
+import os
+import pathlib
+import struct
+import subprocess
+import sys
+import tempfile
+import unittest
+
+KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1), "stats"]
+SAMPLES = pathlib.Path(sys.argv.pop(1))
+PADDING = "\n" * 25  # too short a file is no dictionary
+
+
+def stats(*arguments, stdin=b"", stdout=subprocess.PIPE):
+    """Returns the status, standard output and standard error."""
+    done = subprocess.run([*KOLVANE, *map(str, arguments)], input=stdin, stdout=stdout, stderr=subprocess.PIPE, timeout=60)
+    return done.returncode, (done.stdout or b"").decode(), done.stderr.decode()
+
+
+def text(**values):
+    return ("\ufeff" + "".join(f'"$$$/{key}={value}"\n' for key, value in values.items()) + PADDING).encode()
+
+
+class Page(html.parser.HTMLParser):
+    """Fails for what is not closed, runs, or is fetched; keeps the texts and the cells of the table's rows."""
+
+    def __init__(self, page):
+        super().__init__()
+        self.open, self.rows, self.texts = [], [], []
+        self.feed(page)
+        assert not self.open, self.open
+
+    def handle_starttag(self, tag, attributes):
+        assert tag not in ("script", "link", "img", "iframe", "object"), tag
+        assert not [name for name, _ in attributes if name in ("href", "src") or name.startswith("on")], attributes
+        if tag == "tr":
+            self.rows.append([])
+        if tag != "meta":
+            self.open.append(tag)
+
+    def handle_startendtag(self, tag, attributes):
+        self.handle_starttag(tag, attributes)
+        self.open.pop()
+
+    def handle_endtag(self, tag):
+        assert self.open.pop() == tag, tag
+
+    def handle_data(self, data):
+        self.texts.append(data)
+        if self.open and self.open[-1] in ("th", "td"):
+            self.rows[-1].append(data)
+
+
+class Stats(unittest.TestCase):
+    def setUp(self):
+        folder = tempfile.TemporaryDirectory()
+        self.addCleanup(folder.cleanup)
+        self.folder = pathlib.Path(folder.name)
+
+    def file(self, content, name="d.txt"):
+        path = self.folder / name
+        path.write_bytes(content)
+        return path
+
+    def figures(self, *arguments, status=0):
+        done = stats("--format", "json", *arguments)
+        self.assertEqual(done[0], status, done[2])
+        return json.loads(done[1])["files"]
+
+    def test_coverage(self):
+        for name, original, translation, expected in [  # translated, identical, missing, extra, percent
+                ("own text", "File", "Datei", [1, 0, 0, 0, 100.0]), ("copy", "OK", "OK", [0, 1, 0, 0, 0.0]),
+                ("empty", "File", "", [0, 0, 1, 0, 0.0]), ("absent", "File", None, [0, 0, 1, 1, 0.0]),
+                ("both empty", "", "", [1, 0, 0, 0, 100.0]), ("filled", "", "x", [1, 0, 0, 0, 100.0]),
+                ("numbers", "100 %", "100 %", [1, 0, 0, 0, 100.0]), ("han", "字", "字", [0, 1, 0, 0, 0.0]),
+                ("braces", "{name}, {0:N2}: {}", "{name}, {0:N2}: {}", [1, 0, 0, 0, 100.0]),
+                ("printf", "%1$s/%-5.2ld/%%", "%1$s/%-5.2ld/%%", [1, 0, 0, 0, 100.0]),
+                ("prose in braces", "{a b", "{a b", [0, 1, 0, 0, 0.0]), ("no directive", "%y", "%y", [0, 1, 0, 0, 0.0])]:
+            with self.subTest(name):
+                reference = self.file(text(a=original), "r.txt")
+                found = self.figures("--reference", reference, self.file(text(**{"b" if translation is None else "a": translation})))
+                self.assertEqual(list(found[0].values())[3:8], expected)
+
+    def test_words(self):
+        for value, words in [("", 0), ("&Datei öffnen...\\tStrg+O", 3), ("– … &", 0),
+                             ("Da{0}tei don't 5#{nbsp}s", 4), ("ファイルを開く", 7), ("Heron編集ー。", 4), ("파일 열기", 2),
+                             ("เปิดไฟล์", 1), ("a\u3000b 𝄞 𠀀𠀁", 4)]:
+            with self.subTest(value):
+                self.assertEqual(self.figures(self.file(text(a=value)))[0]["words"], words)
+
+    def test_chains(self):
+        keys = {f"thirteen-here{end}"[:14]: "x" for end in "abc"} | {"other": "y"}
+        spread = list(self.figures(self.file(text(**keys)))[0].values())[3:]
+        self.assertEqual((len(keys), spread), (4, [2, 3, 1.75]))
+        # Of a key's two entries the second is never found, and the first entry has no business in this bucket.
+        image = (b"Kolvane Binary Format\1\5\1" + struct.pack("<8I", 1, 6, 2, 1, 2, 1, 2, 1) + struct.pack("<H", 580)
+                 + b"/bx" + b"/ay" + b"/az")
+        path = self.file(image)
+        self.assertEqual(list(self.figures(path, status=1)[0].values())[1:], [1, 1, 1, 3, 2.0])
+        self.assertIn("warning: byte 58: the image is damaged, a key is filed where it is never found", stats(path)[2])
+
+    def test_every_format_has_the_same_numbers(self):
+        name = 'a,"b" <&>.txt' if os.name != "nt" and len(KOLVANE) == 2 else "a,'b' &.txt"
+        reference = self.file(text(a="A", b="B", c="C"), "r.txt")
+        arguments = ["--reference", reference, self.file(text(a="Ä", b="B", d="D"), name), SAMPLES / "it.bin"]
+        files = self.figures(*arguments)
+        self.assertEqual(list(files[0].values())[1:], [3, 3, 1, 1, 1, 1, 33.3, 3, 1, 1.0])
+        rows = list(csv.DictReader(io.StringIO(stats("--format", "csv", *arguments)[1])))
+        self.assertEqual(rows, [{key: f"{value:.2f}" if key == "meanSteps" else str(value) for key, value in file.items()}
+                                for file in files])
+        page = Page(stats("--format", "html", *arguments)[1])
+        table = stats(*arguments)[1].splitlines()
+        self.assertEqual(table[0], f"compared with {reference}, 3 keys")
+        self.assertEqual(len(set(map(len, table[2:]))), 1)
+        for row, line, shown in zip(rows, table[3:], page.rows[1:], strict=True):
+            order = ["keys", "words", "translated", "translatedPercent", "identical", "missing", "extra",
+                     "usedBuckets", "longestChain", "meanSteps"]
+            self.assertEqual([line[:len(row["file"])], *line[len(row["file"]):].split()],
+                             [row["file"], *map(row.get, order)])
+            self.assertEqual([cell for cell in shown if cell.strip()], [
+                row["file"], row["translatedPercent"] + " %", *map(row.get, ["translated", "identical", "missing", "extra", "keys", "words"])])
+            self.assertIn("{usedBuckets} in use, the fullest with {longestChain}; {meanSteps} steps to a key".format(**row), page.texts)
+        self.assertEqual(stats(reference)[1].split(), ["file", "keys", "words", "buckets", "longest", "steps",
+                                                       str(reference), "3", "3", "3", "1", "1.00"])
+        self.assertEqual(Page(stats("--format", "html", reference)[1]).rows[1], [str(reference), "3", "3"])
+
+    def test_fail_under(self):
+        reference = self.file(text(a="A", b="B", c="C"), "r.txt")
+        path = self.file(text(a="Ä", b="Ö", c="C"))
+        for percent, status in [("66.6", 0), ("66.666666", 0), ("66.666667", 1), ("67", 1), ("100", 1), ("0", 0)]:
+            self.assertEqual(stats("--reference", reference, "--fail-under", percent, path)[0], status, percent)
+        self.assertIn(f"{path}: 66.6 % is translated, less than 67 %",
+                      stats("--reference", reference, path, reference, "--fail-under=67")[2])
+        for wrong in [["--fail-under", "5", path], ["--reference", path, "--fail-under", "100.1", path, path], [],
+                      ["--reference", reference, reference], ["--reference", "-", "-"], ["--format", "xml", path],
+                      ["--reference", reference, "--fail-under", "nan", path], ["--reference", "", path, "-", "-"]]:
+            status, output, errors = stats(*wrong)
+            self.assertEqual((status, output), (2, ""), wrong)
+            self.assertIn("try 'kolvane stats --help'", errors)
+
+    def test_files_that_are_not_as_they_should_be(self):
+        path, reference = self.file(text(a="x")), self.file(text(b="y"), "r.txt")
+        cut = self.file((SAMPLES / "it.bin").read_bytes()[:1500], "cut.bin")
+        status, output, errors = stats(path, "missing", cut, "-", stdin=path.read_bytes())
+        self.assertEqual((status, [line.split()[0] for line in output.splitlines()]), (2, ["file", str(path), str(cut), "-"]))
+        self.assertRegex(errors, r"^kolvane: missing: No such file.*\nkolvane: .*cut.bin: warning: the image is cut short: .*\n$")
+        for other, status in [(cut, 1), ("missing", 2), (self.file(PADDING.encode(), "no-keys"), 2), (reference, 0)]:
+            self.assertEqual(stats("--reference", other, path)[0], status, other)
+
+    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
+    def test_output_that_cannot_be_written(self):
+        path = self.file(text(a="x"))
+        with open("/dev/full", "wb") as full:
+            self.assertEqual(stats(path, "--format", "html", stdout=full)[0], 2)
+        ours, theirs = os.pipe()
+        os.close(ours)
+        with open(theirs, "wb") as closed:
+            done = subprocess.run([*KOLVANE, path], stdout=closed, stderr=subprocess.PIPE, timeout=60, restore_signals=False)
+        self.assertEqual((done.returncode, done.stderr), (2, b""))
+
+
+if __name__ == "__main__":
+    unittest.main()
