@@ -64,7 +64,7 @@ class Guide(unittest.TestCase):
                 self.write("d", [f'"/a={"".join(examples[1])}"'])
             else:
                 self.write("r", [])
-                self.write("d", examples[0])
+                self.write("d", examples[0] if rule == "mark-in-key" else ["", *examples[0]])
             reference = ["--reference", "r"] if len(examples) == 2 else []
             found = self.run_kolvane("check", "--no-snippet", "--info", "d", *reference)
             self.assertIn(f"[{rule}]", found)

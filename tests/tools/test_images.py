@@ -147,6 +147,8 @@ class Images(unittest.TestCase):
                 status, _, errors = self.run_kolvane(*command, "in", stdout=full)
             self.assertEqual(status, 2, command)
             self.assertIn("kolvane: cannot write to standard output: No space left on device\n", errors)
+            if len(KOLVANE) > 1:  # the emulator does not tell of a closed pipe while it is not full
+                continue
             reading, writing = os.pipe()
             os.close(reading)
             with os.fdopen(writing, "wb") as closed:
