@@ -135,7 +135,7 @@ class Check(unittest.TestCase):
         self.assertRegex(self.check(binary)[1], r"d\.bin: (entry \d+, )?byte \d+: error: .* \[truncated-image\]\n$")
 
     def test_sarif(self):
-        text = self.file(TWICE, "ä b#{0}.txt")
+        text = self.file(TWICE.replace("twice", "{0}"), "ä b#{0}.txt")
         binary = self.file((SAMPLES / "it.bin").read_bytes()[:1500], "d.bin")
         for more in [], ["none"]:
             log = json.loads(self.check("--format=sarif", "./" + text, binary, *more)[1])
