@@ -9,4 +9,6 @@ struct ClosedPipe {};
 
 void WriteOutput(std::string_view text);
 void FlushOutput();
-void CloseOutput();  // no more can be written
+
+// No more can be written. Does not tell again of a failure that was thrown before.
+void CloseOutput();
