@@ -161,7 +161,8 @@ class Stats(unittest.TestCase):
         ours, theirs = os.pipe()
         os.close(ours)
         with open(theirs, "wb") as closed:
-            done = subprocess.run([*KOLVANE, path], stdout=closed, stderr=subprocess.PIPE, timeout=60, restore_signals=False)
+            done = subprocess.run([*KOLVANE, path, "--format=html"], stdout=closed, stderr=subprocess.PIPE, timeout=60,
+                                  restore_signals=False)
         self.assertEqual((done.returncode, done.stderr), (2, b""))
 
 
