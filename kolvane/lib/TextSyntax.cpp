@@ -60,12 +60,15 @@ const Escape* FindEscape(uint16_t escapeCharacter, uint16_t letter) noexcept {
 
 // Returns where the decoded text ends.
 uint16_t* DecodeEscapes(Units text, uint16_t* out) noexcept {
-  while (!text.empty()) {
+  for (;;) {
+    const size_t plain = UnitSet<kCaret, kBackslash>::RunBefore(text);
+    out = std::copy_n(text.begin(), plain, out);
+    text = text.subspan(plain);
+    if (text.empty()) return out;
     const DecodedStart start = DecodeStart(text);
     out = std::copy_n(start.units, start.count, out);
     text = text.subspan(start.taken);
   }
-  return out;
 }
 
 // In place: a name is longer than its character. Returns where the expanded text ends.
