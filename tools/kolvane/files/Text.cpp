@@ -32,12 +32,14 @@ std::vector<uint16_t> ToUTF16(std::string_view text) {
   return FromMultiByte(text, &kUTF8Selector);
 }
 
-// What is malformed does not come back as it was.
+// What is malformed comes back as U+FFFD, and may share its first bytes with that.
 std::optional<size_t> MalformedUTF8At(std::string_view text) {
   const std::string back = ToUTF8(ToUTF16(text));
   const auto differs = std::ranges::mismatch(text, back);
   if (differs.in1 == text.end() && differs.in2 == back.end()) return std::nullopt;
-  return static_cast<size_t>(differs.in1 - text.begin());
+  auto at = static_cast<size_t>(differs.in1 - text.begin());
+  while (at < back.size() && (static_cast<unsigned char>(back[at]) & 0xC0) == 0x80) --at;
+  return at;
 }
 
 bool IsValidUTF8(std::string_view text) {
