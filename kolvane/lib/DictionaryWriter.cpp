@@ -42,16 +42,14 @@ uint8_t EncodingByte(TextEncoding values) noexcept {
   }
 }
 
-// Where what comes back from the encoding begins to differ, or else the value's length.
+// How many of the value's units come back from the encoding as they are.
 size_t CarriedUnits(TextEncoding encoding, Bytes stored, Units value) {
   if (encoding == TextEncoding::kUTF16LE) return value.size();
   UnicodeBuffer buffer;
   ConvertToUnicode(reinterpret_cast<const char*>(stored.data()), stored.size(), buffer,
                    SelectorFor(encoding));
   const Units back(buffer.Data(), buffer.Length());
-  const auto differs = std::ranges::mismatch(value, back);
-  const bool isSame = differs.in1 == value.end() && differs.in2 == back.end();
-  return isSame ? value.size() : static_cast<size_t>(differs.in1 - value.begin());
+  return static_cast<size_t>(std::ranges::mismatch(value, back).in1 - value.begin());
 }
 
 // Lays entries out as an image stores them, group by group.
@@ -68,11 +66,12 @@ class ImageComposer {
     const int selector = encodingByte;
     written.seekp(0);
     const size_t keySize = entry.WriteKey(written, true, nullptr);
-    const size_t valueSize = entry.WriteValue(written, true, selector == 0 ? nullptr : &selector);
+    size_t valueSize = entry.WriteValue(written, true, selector == 0 ? nullptr : &selector);
+    const Units value = entry.Value().Units();
+    if (selector == 0) valueSize = value.size_bytes();  // an odd last byte answers nothing
     const std::string_view both = written.view();
     const Bytes bytes(reinterpret_cast<const uint8_t*>(both.data()), keySize + valueSize);
     image.Append(bytes.first(keySize), bytes.subspan(keySize));
-    const Units value = entry.Value().Units();
     const size_t carried = CarriedUnits(encoding, bytes.subspan(keySize), value);
     if (carried < value.size()) lost.push_back({&entry, carried});
   }

@@ -84,7 +84,7 @@ TEST(WriterTest, LaysImagesOut) {
 
 TEST(WriterTest, LeavesOutWhatNoLookupFinds) {
   DictionaryTable table;
-  Load(table, Image1_5(0, {{7, {{"/a", Bytes(u"misfiled")}}}, {580, {{"/a", Bytes(u"found")}, {"/a", Bytes(u"hidden")}}}}));
+  Load(table, Image1_5(0, {{7, {{"/a", Bytes(u"misfiled")}}}, {580, {{"/a", Bytes(u"found") + "?"}, {"/a", Bytes(u"hidden")}}}}));
   EXPECT_EQ(Written(table, BinaryVersion::k1_5, TextEncoding::kUTF16LE), Image1_5(0, {{580, {{"/a", Bytes(u"found")}}}}));
 }
 
