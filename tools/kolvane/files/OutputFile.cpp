@@ -30,6 +30,16 @@ std::string NameOf(const fs::path& path) {
   return {name.begin(), name.end()};
 }
 
+// Through symbolic links, also one to what is not there yet.
+fs::path TargetOf(fs::path path) {
+  constexpr int kMostLinks = 40;
+  std::error_code error;
+  for (int links = 0; links < kMostLinks && fs::is_symlink(path, error); ++links) {
+    path = path.parent_path() / fs::read_symlink(path, error);
+  }
+  return path;
+}
+
 bool HasBytes(const fs::path& path, std::string_view bytes) {
   std::error_code error;
   if (fs::file_size(path, error) != bytes.size() || error) return false;
@@ -84,9 +94,9 @@ void Replace(const std::string& name, const fs::path& target, const fs::file_sta
 void WriteFile(const std::string& name, std::string_view bytes) {
   if (name == "-") return WriteOutput(bytes);
   std::error_code error;
-  fs::path target = PathOf(name);
-  if (fs::is_symlink(target, error)) target = fs::weakly_canonical(target, error);
+  const fs::path target = TargetOf(PathOf(name));
   const fs::file_status status = fs::status(target, error);
+  if (!fs::status_known(status)) Fail(name, error.message());
   if (fs::is_regular_file(status) && HasBytes(target, bytes)) return;
   if (!fs::exists(status) || fs::is_regular_file(status)) {
     return Replace(name, target, status, bytes);
