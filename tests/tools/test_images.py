@@ -119,8 +119,9 @@ class Images(unittest.TestCase):
         for content, options, message in [
                 ('"/a=x"\r\n"/b=€ł"\n"/c=ń"\n'.encode(), ["--to", "code-page"], "in:2:6: U+0142 has no place in the code page\nkolvane: in:3:5: "),
                 ('\ufeff"/a=😀\ud83d"'.encode("utf-16-be", "surrogatepass"), ["--to", "utf-8"], "in:1:6: U+D83D has no place in UTF-8\n"),
-                (b'"/a=x"\n"/b=\xff"', ["--to", "utf-16le", "--encoding", "utf-8"], "in:2: byte 11 is malformed UTF-8\n"),
-                (b'\xff\xfe"', ["--to", "utf-8"], "in: byte 2 is half a character\n"),
+                (b'"/a=x"\n"/b=\xff"', ["--to", "utf-16le", "--encoding", "utf-8"], "in:2:5: byte 11 is malformed UTF-8\n"),
+                ('\ufeff"é"\r\n\r\u2028é'.encode() + b"\xef\xbf", ["--to", "utf-16le", "--encoding", "utf-8"], "in:4:2: byte 15 is malformed UTF-8\n"),
+                (b'\xff\xfe"', ["--to", "utf-8"], "in:1:1: byte 2 is half a character\n"),
                 (image, ["--to", "utf-8"], "in: a binary dictionary has no encoding to change")]:
             status, output, errors = self.run_kolvane("convert", self.file("in", content), "-o", "out", *options)
             self.assertEqual((status, output), (2, b""))

@@ -21,6 +21,8 @@ namespace {
 
 using Units = std::span<const uint16_t>;
 
+constexpr std::string_view kMarkInUTF8 = "\xEF\xBB\xBF";
+
 constexpr const char* kAbout =
     R"(Change the encoding of a text dictionary, and nothing else.
 
@@ -56,14 +58,27 @@ void AddOptions(CLI::App& options, Request& request) {
   AddEncodingOption(options, request.encoding);
 }
 
+constexpr bool EndsLine(uint16_t unit) noexcept {
+  return unit == '\r' || unit == '\n' || unit == 0x2028 || unit == 0x2029;
+}
+
 // With its line end, which CR LF is one of.
 size_t LengthOfLine(Units text) noexcept {
-  for (size_t i = 0; i < text.size(); ++i) {
-    const uint16_t unit = text[i];
-    const bool isReturn = unit == '\r' && (i + 1 == text.size() || text[i + 1] != '\n');
-    if (isReturn || unit == '\n' || unit == 0x2028 || unit == 0x2029) return i + 1;
+  const auto end = static_cast<size_t>(std::ranges::find_if(text, EndsLine) - text.begin());
+  if (end == text.size()) return end;
+  const bool isPair = text[end] == '\r' && end + 1 < text.size() && text[end + 1] == '\n';
+  return end + (isPair ? 2 : 1);
+}
+
+// `name:line:column` of what follows the text.
+std::string PlaceBehind(Units text, const std::string& name) {
+  size_t line = 1;
+  for (size_t length = LengthOfLine(text); length != 0 && EndsLine(text[length - 1]);
+       length = LengthOfLine(text)) {
+    text = text.subspan(length);
+    ++line;
   }
-  return text.size();
+  return fmt::format("{}:{}:{}", name, line, 1 + CodePointCount(text));
 }
 
 std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian) {
@@ -83,17 +98,20 @@ std::vector<uint16_t> Decoded(const ImageFile& file) {
                   ": a binary dictionary has no encoding to change; 'kolvane dump' prints it");
   }
   if (const auto bad = MalformedUTF8At(file.utf8)) {
-    const std::string_view before = std::string_view(file.utf8).substr(0, *bad);
-    throw Failure(fmt::format("{}:{}: byte {} is malformed UTF-8", name,
-                              1 + std::ranges::count(before, '\n'), *bad));
+    std::string_view before = std::string_view(file.utf8).substr(0, *bad);
+    if (before.starts_with(kMarkInUTF8)) before.remove_prefix(kMarkInUTF8.size());
+    throw Failure(
+        fmt::format("{}: byte {} is malformed UTF-8", PlaceBehind(ToUTF16(before), name), *bad));
   }
   const bool isLittle = file.bytes.starts_with("\xFF\xFE");
   const bool isBig = file.bytes.starts_with("\xFE\xFF");
   if (!isLittle && !isBig) return FromMultiByte(file.bytes, tovali_private::kDefaultSelector);
+  std::vector<uint16_t> units = DecodedUTF16(std::string_view(file.bytes).substr(2), isBig);
   if (file.bytes.size() % 2 != 0) {
-    throw Failure(fmt::format("{}: byte {} is half a character", name, file.bytes.size() - 1));
+    throw Failure(fmt::format("{}: byte {} is half a character", PlaceBehind(units, name),
+                              file.bytes.size() - 1));
   }
-  return DecodedUTF16(std::string_view(file.bytes).substr(2), isBig);
+  return units;
 }
 
 std::string BytesOf(Units units, bool isBigEndian) {
