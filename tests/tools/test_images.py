@@ -122,6 +122,8 @@ class Images(unittest.TestCase):
                 (b'"/a=x"\n"/b=\xff"', ["--to", "utf-16le", "--encoding", "utf-8"], "in:2:5: byte 11 is malformed UTF-8\n"),
                 ('\ufeff"é"\r\n\r\u2028é'.encode() + b"\xef\xbf", ["--to", "utf-16le", "--encoding", "utf-8"], "in:4:2: byte 15 is malformed UTF-8\n"),
                 (b'\xff\xfe"', ["--to", "utf-8"], "in:1:1: byte 2 is half a character\n"),
+                ('\ufeffÿþ'.encode("utf-16-le"), ["--to", "code-page"], "in:1:1: nothing was written, for without a byte-order mark"),
+                ("\ufeffKolvane Binary Format".encode(), ["--to", "utf-8"], "would be taken for a binary dictionary\n"),
                 (image, ["--to", "utf-8"], "in: a binary dictionary has no encoding to change")]:
             status, output, errors = self.run_kolvane("convert", self.file("in", content), "-o", "out", *options)
             self.assertEqual((status, output), (2, b""))

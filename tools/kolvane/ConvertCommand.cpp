@@ -114,6 +114,17 @@ std::vector<uint16_t> Decoded(const ImageFile& file) {
   return units;
 }
 
+// Text without a byte-order mark must not begin with what marks something else.
+void RefuseMisreading(const std::string& name, std::string_view text, TextEncoding target) {
+  if (target == TextEncoding::kUTF16LE || target == TextEncoding::kUTF16BE) return;
+  const bool isMarked = text.starts_with("\xFF\xFE") || text.starts_with("\xFE\xFF");
+  if (!isMarked && !text.starts_with(tovali_private::kBinaryMagic)) return;
+  throw Failure(
+      fmt::format("{}:1:1: nothing was written, for without a byte-order mark the text "
+                  "would be taken for {}",
+                  Printable(name), isMarked ? "UTF-16" : "a binary dictionary"));
+}
+
 std::string BytesOf(Units units, bool isBigEndian) {
   std::string bytes;
   bytes.reserve(units.size_bytes());
@@ -186,6 +197,7 @@ ExitStatus Convert(const Request& request) {
         "nothing was written, for {} cannot be converted",
         encoder.LossCount() == 1 ? "a line" : fmt::format("{} lines", encoder.LossCount())));
   }
+  RefuseMisreading(file.name, encoder.Text(), request.target);
   WriteFile(request.output, encoder.Text());
   return ExitStatus::kDone;
 }
