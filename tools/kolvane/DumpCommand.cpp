@@ -27,7 +27,7 @@ constexpr const char* kAbout =
 Examples:
   kolvane dump de.kdict
   kolvane dump --json --sort de.kdict
-  git config diff.kolvane.textconv 'kolvane dump'   # shows images in git diff
+  git config diff.kolvane.textconv 'kolvane dump --json --sort'   # shows images in git diff
 
 The text loads back to the same dictionary: each key once, with the value that a translator answers.
 Where an IMAGE is damaged, or text cannot hold an entry, that is said, the rest is printed, and the
