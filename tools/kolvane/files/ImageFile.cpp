@@ -49,7 +49,7 @@ bool IsTextInUTF8(std::string_view bytes) {
   const bool beyondASCII = std::any_of(bytes.begin(), bytes.end(), [](char byte) {
     return static_cast<unsigned char>(byte) >= 0x80;
   });
-  return beyondASCII && !bytes.starts_with(tovali_private::kBinaryMagic) && IsValidUTF8(bytes);
+  return beyondASCII && IsValidUTF8(bytes);
 }
 
 // UTF-16 with its byte-order mark, in the machine's byte order, which is the one that the mark
@@ -65,9 +65,10 @@ std::string RecodedFromUTF8(const std::string& name, std::string_view text) {
 
 ImageFile ReadImageFile(const std::string& name, FileEncoding encoding) {
   std::string bytes = ReadBytes(name);
-  const bool isUTF8 =
-      encoding == FileEncoding::kUTF8 || (encoding == FileEncoding::kAuto && IsTextInUTF8(bytes));
-  if (!isUTF8 || bytes.empty()) return {name, std::move(bytes), {}};
+  const bool isText = !bytes.empty() && !bytes.starts_with(tovali_private::kBinaryMagic);
+  const bool isUTF8 = isText && (encoding == FileEncoding::kUTF8 ||
+                                 (encoding == FileEncoding::kAuto && IsTextInUTF8(bytes)));
+  if (!isUTF8) return {name, std::move(bytes), {}};
   std::string image = RecodedFromUTF8(name, bytes);
   return {name, std::move(image), std::move(bytes)};
 }

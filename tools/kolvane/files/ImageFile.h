@@ -4,9 +4,9 @@
 #include <cstdint>
 #include <string>
 
+// Of text; a binary dictionary tells its own, and is handed over as it is.
 enum class FileEncoding {
-  kAuto,   // kUTF8 for valid UTF-8 with a character beyond ASCII that is no binary dictionary,
-           // else kImage
+  kAuto,   // kUTF8 for valid UTF-8 with a character beyond ASCII, else kImage
   kImage,  // the file's bytes exactly as they are
   kUTF8    // text in UTF-8, handed over as UTF-16
 };
