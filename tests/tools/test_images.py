@@ -57,8 +57,23 @@ class Images(unittest.TestCase):
         self.file("b", b'"/k=two"\n"/k=last"\n"/b=second"' + PAD)
         self.good("compile", "a", "b", "-o", "ab")
         self.assertEqual(self.good("dump", "--sort", "ab"), b'"$$$/a=first"\n"$$$/b=second"\n"$$$/k=last"\n')
+        self.file("both", self.bytes_of("b").strip() + b"\n" + self.bytes_of("a"))
+        self.assertEqual(self.good("dump", "both"), b'"$$$/k=one"\n"$$$/b=second"\n"$$$/a=first"\n')
         self.assertEqual(self.good("compile", "ab", "-", "-o", "-", stdin=self.bytes_of("a")),
                          self.good("compile", "b", "a", "-o", "-"))
+
+    def test_images_are_not_taken_for_text(self):
+        image = self.good("compile", "-", "-o", "-", "--values", "utf-8", stdin='"/k=é"'.encode() + PAD)
+        image.decode()
+        for encoding in ["auto", "image", "utf-8"]:
+            self.assertEqual(self.good("dump", "--encoding", encoding, "-", stdin=image).strip().decode(), '"$$$/k=é"')
+
+    def test_nothing_comes_back_too(self):
+        _, image, _ = self.run_kolvane("compile", "-", "-o", "-", stdin=PAD)
+        for how in [[], ["--utf-16"]]:
+            status, text, _ = self.run_kolvane("dump", "-", *how, stdin=image)
+            self.assertEqual(status, 0)
+            self.assertEqual(self.run_kolvane("compile", "-", "-o", "-", stdin=text)[1], image)
 
     def test_an_equal_image_is_left_alone(self):
         self.file("a", b'"/k=one"' + PAD)
@@ -70,6 +85,20 @@ class Images(unittest.TestCase):
         self.assertNotEqual(self.folder.joinpath("out").stat().st_mtime, 1)
         self.assertEqual(sorted(path.name for path in self.folder.iterdir()), ["a", "out"])
 
+    @unittest.skipIf(len(KOLVANE) > 1, "links are the host's, and the emulator's files have no permissions")
+    def test_links_and_permissions_stay(self):
+        self.file("a", b'"/k=one"' + PAD)
+        self.folder.joinpath("old").touch(0o640)
+        for name in ["old", "new"]:
+            self.folder.joinpath("to-" + name).symlink_to(name)
+            self.good("compile", "a", "-o", "to-" + name)
+            self.assertTrue(self.folder.joinpath("to-" + name).is_symlink())
+            self.assertEqual(self.bytes_of(name), self.good("compile", "a", "-o", "-"))
+        self.assertEqual(self.folder.joinpath("old").stat().st_mode & 0o777, 0o640)
+        self.folder.joinpath("loop").symlink_to("loop")
+        self.assertEqual(self.run_kolvane("compile", "a", "-o", "loop")[0], 2)
+        self.assertEqual(sorted(path.name for path in self.folder.iterdir()), ["a", "loop", "new", "old", "to-new", "to-old"])
+
     def test_nothing_is_written_where_something_would_be_lost(self):
         self.file("polish", '"/k=Żółć"\n"/a=ok"'.encode() + PAD)
         self.file("half", '\ufeff"/k=a\ud800b"'.encode("utf-16-le", "surrogatepass") + PAD)
@@ -77,7 +106,7 @@ class Images(unittest.TestCase):
         self.file("cut", image[:-1])
         for arguments, message in [(["polish", "--values", "code-page"], "'/k': its translation holds U+017B, which the code page cannot carry"),
                                    (["half", "--values", "utf-8"], "'/k': its translation holds U+D800, which UTF-8 cannot carry"),
-                                   (["cut"], "cut: warning: the image is cut short"), (["polish", "missing"], "missing: No such file")]:
+                                   (["missing", "cut"], "cut: warning: the image is cut short"), (["polish", "missing"], "missing: No such file")]:
             status, output, errors = self.run_kolvane("compile", *arguments, "-o", "out")
             self.assertEqual((status, output), (2, b""))
             self.assertIn(message, errors)
@@ -157,8 +186,9 @@ class Images(unittest.TestCase):
             with os.fdopen(writing, "wb") as closed:
                 status, _, errors = self.run_kolvane(*command, "in", stdout=closed, restore_signals=False)
             self.assertEqual((status, "write" in errors), (2, False), command)
-        for name in ["/dev/full", "no-folder/out"]:
-            status, output, errors = self.run_kolvane("compile", "in", "-o", name)
+        self.file("large", b'"/a=' + b"x" * 100000)
+        for source, name in [("in", "/dev/full"), ("large", "/dev/full"), ("in", "no-folder/out")]:
+            status, output, errors = self.run_kolvane("compile", source, "-o", name)
             self.assertEqual((status, output), (2, b""))
             self.assertRegex(errors, f"^kolvane: {name}: .+\n$")
 

@@ -82,6 +82,13 @@ TEST(WriterTest, LaysImagesOut) {
   }
 }
 
+TEST(WriterTest, NamesTheValuesEncoding) {
+  DictionaryTable table;
+  Load(table, Image1_5(0, Grouped({{"/a", Bytes(u"Hié")}})));
+  EXPECT_EQ(Written(table, BinaryVersion::k1_5, TextEncoding::kUTF8), Image1_5(1, Grouped({{"/a", "Hi\xC3\xA9"}})));
+  EXPECT_EQ(Written(table, BinaryVersion::k1_0, TextEncoding::kCodePage), Image1_0(2, Grouped({{"/a", "Hi\xE9"}})));
+}
+
 TEST(WriterTest, LeavesOutWhatNoLookupFinds) {
   DictionaryTable table;
   Load(table, Image1_5(0, {{7, {{"/a", Bytes(u"misfiled")}}}, {580, {{"/a", Bytes(u"found") + "?"}, {"/a", Bytes(u"hidden")}}}}));
@@ -149,6 +156,13 @@ TEST(WriterTest, RealTranslationsComeBack) {
     ++images;
   }
   EXPECT_EQ(images, 10u);
+}
+
+TEST(WriterTest, NamesWhatCannotBeSeen) {
+  std::vector<uint16_t> line;
+  const std::u16string value = u"\u00A0\u00AD\u2002\u2003\u2009\u200C\u200D\u200E\u200F";
+  AppendLine({}, Units(value), line);
+  EXPECT_EQ(std::u16string(line.begin(), line.end()), u"\"$$$=#{nbsp}#{shy}#{ensp}#{emsp}#{thinsp}#{zwnj}#{zwj}#{lrm}#{rlm}\"");
 }
 
 TEST(WriterTest, SaysWhyThereIsNoLine) {
