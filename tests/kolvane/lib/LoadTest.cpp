@@ -423,8 +423,8 @@ TEST(Load, AllocatesNoMoreThanTheImageJustifies) {
   }
 }
 
-// Keys of which every one falls into the same bucket: loading eight times as many must not take
-// sixty-four times as long.
+// Keys of which every one falls into the same bucket: loading 32 times as many must not take 1024
+// times as long. Between the two there is room for caches and for a busy machine.
 TEST(Load, TakesTimeLinearInTheImage) {
   const auto secondsFor = [](int count) {
     std::string image;
@@ -444,7 +444,7 @@ TEST(Load, TakesTimeLinearInTheImage) {
     }
     return best;
   };
-  EXPECT_LT(secondsFor(80000), 25 * secondsFor(10000));
+  EXPECT_LT(secondsFor(160000), 300 * secondsFor(5000));
 }
 
 }  // namespace
