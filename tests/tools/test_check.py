@@ -78,6 +78,11 @@ class Check(unittest.TestCase):
                 self.assertTrue(mark.endswith("^") and mark.isascii())
                 self.assertEqual(room(mark[:-1]), room(line[:2 + finding["column"] - 1]))
 
+    def test_columns_of_malformed_bytes(self):
+        name = self.file(b'\xef\xbb\xbf"$$$/a=na\xefve"\n' + 30 * b"\n" + b'"$$$/b=na\xef\xbf"\r"$$$/c=\xc3\xa9\xff"')
+        found = [(finding["line"], finding["column"]) for finding in self.findings("--encoding=utf-8", name)]
+        self.assertEqual(found, [(1, 10), (32, 10), (33, 9)])
+
     def test_long_line_is_cut_around_the_place(self):
         name = self.file('"$$$/escape=' + "日" * 50000 + "^q" + "x" * 50000 + '"\n')
         _, line, mark = self.check(name)[1].split("\n")[:3]

@@ -43,6 +43,7 @@ Place PlaceIn(std::string_view line, size_t at) {
 }
 
 LinesOfUTF8 ReadAsUTF8(std::string_view text) {
+  if (text.starts_with(kUTF8Mark)) text.remove_prefix(kUTF8Mark.size());
   LinesOfUTF8 lines;
   LineCounter counter(text, TextEncoding::kCodePage);
   for (size_t at = 0; at < text.size();) {
