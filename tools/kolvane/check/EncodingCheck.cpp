@@ -72,18 +72,19 @@ class EncodingCheck {
              "this is UTF-16 without its byte-order mark, which is read in the code page");
       return false;
     }
-    CheckUTF8(encoding);
-    if (file.utf8.empty()) CheckCodePage();
+    const bool meantForUTF8 = CheckUTF8(encoding);
+    if (file.utf8.empty() && !meantForUTF8) CheckCodePage();
     return true;
   }
 
  private:
-  void CheckUTF8(FileEncoding encoding) {
+  // Returns whether the text is meant for UTF-8, whatever it is read in.
+  bool CheckUTF8(FileEncoding encoding) {
     const std::string_view text = file.utf8.empty() ? file.bytes : file.utf8;
     const LinesOfUTF8 lines = ReadAsUTF8(text);
     const bool meantForUTF8 = encoding == FileEncoding::kUTF8 || text.starts_with(kUTF8Mark) ||
                               lines.wellFormed > lines.malformed.size();
-    if (!meantForUTF8) return;
+    if (!meantForUTF8) return false;
     for (const Place& place : lines.malformed) {
       Report(rules::kMalformedInput, place,
              encoding == FileEncoding::kUTF8
@@ -94,6 +95,7 @@ class EncodingCheck {
       Report(rules::kUTF8AsCodePage, {},
              "this is UTF-8, which is read in the code page when it is loaded as it is");
     }
+    return true;
   }
 
   // What a code page leaves undefined becomes a control character.
