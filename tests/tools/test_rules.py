@@ -67,6 +67,7 @@ CASES = [
     ("empty-key", utf16('"$$$=b"'), ["1:5: warning: the key is empty"]),
     ("empty-key", image([(0, [(b"", HI)])]), ["entry 1, byte 42: warning: the key is empty"]),
     ("unmatchable-key", utf16('"$$$/größe=b"'), ["1:8: error: no lookup matches a key of a text dictionary with U+00F6"]),
+    ("unmatchable-key", utf16('"$$$/\u0141=b"'), ["1:6: error: no lookup matches a key of a text dictionary with U+0141, but those of '/A' match this one"]),
     ("unmatchable-key", image([(544, [(b"/=", HI)])]), ["entry 1, byte 42: error: no lookup matches '/=': it holds '='"]),
     ("mark-in-key", utf16("$$$/a=b"), ["1:1: error: the byte-order mark becomes a part of the key; quotes keep it out"]),
     ("duplicate-key", utf16('"$$$/a=b"\n/b=c\n  /a=d'.replace("  ", "")),

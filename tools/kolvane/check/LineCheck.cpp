@@ -145,9 +145,10 @@ class LineCheck {
     const auto beyond = std::ranges::find_if(split->key, [](uint16_t unit) { return unit > 0x7F; });
     if (beyond == split->key.end()) return;
     const auto index = static_cast<size_t>(beyond - split->key.begin());
-    Report(rules::kUnmatchableKey, at + index,
-           fmt::format("no lookup matches a key of a text dictionary with {}",
-                       CodePointText(CodePointAt(split->key, index))));
+    std::string message = fmt::format("no lookup matches a key of a text dictionary with {}",
+                                      CodePointText(CodePointAt(split->key, index)));
+    if (IsValidUTF8(key)) message += fmt::format(", but those of '{}' match this one", Excerpt(key));
+    Report(rules::kUnmatchableKey, at + index, std::move(message));
   }
 
   void CheckDuplicate(const Definitions& definitions) {
