@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <optional>
 #include <span>
+#include <string_view>
 #include <utility>
 
 #include "EscapeCheck.h"
@@ -139,6 +140,19 @@ class LineCheck {
     } else {
       CheckMatchable(at);
     }
+    if (markLength == 0 || at != 0) CheckDollars(at);
+  }
+
+  // White space is not trimmed, nor do other quotes than double ones count.
+  void CheckDollars(size_t at) {
+    constexpr std::string_view kDollars = "$$$";
+    const Units folder = split->key.first(
+        static_cast<size_t>(std::ranges::find(split->key, '/') - split->key.begin()));
+    const bool hasDollars =
+        std::search(folder.begin(), folder.end(), kDollars.begin(), kDollars.end()) != folder.end();
+    if (!hasDollars && (key.empty() || key[0] != '$')) return;
+    Report(rules::kMisplacedDollars, at,
+           fmt::format("the key is '{}': '$$$' stands at the start, and once", Excerpt(KeyText(key))));
   }
 
   void CheckMatchable(size_t at) {

@@ -34,6 +34,8 @@ constexpr Rule kEmptyKey = {"empty-key", kWarning, "a definition has an empty ke
 constexpr Rule kUnmatchableKey = {"unmatchable-key", kError, "no lookup can match the key"};
 constexpr Rule kMarkInKey = {"mark-in-key", kError,
                              "the byte-order mark sticks to a first key without quotes"};
+constexpr Rule kMisplacedDollars = {"misplaced-dollars", kError,
+                                    "what stands before or behind '$$$' becomes a part of the key"};
 constexpr Rule kDuplicateKey = {"duplicate-key", kError,
                                 "a key is defined more than once; the last definition wins"};
 constexpr Rule kDuplicateAcrossFiles = {"duplicate-across-files", kInfo,
@@ -103,6 +105,7 @@ constexpr const Rule* kRules[] = {&rules::kTooShort,
                                   &rules::kEmptyKey,
                                   &rules::kUnmatchableKey,
                                   &rules::kMarkInKey,
+                                  &rules::kMisplacedDollars,
                                   &rules::kDuplicateKey,
                                   &rules::kDuplicateAcrossFiles,
                                   &rules::kUnknownEscape,

@@ -31,6 +31,7 @@ extern const Rule kSwallowedClosingQuote;
 extern const Rule kEmptyKey;
 extern const Rule kUnmatchableKey;
 extern const Rule kMarkInKey;
+extern const Rule kMisplacedDollars;
 extern const Rule kDuplicateKey;
 extern const Rule kDuplicateAcrossFiles;
 
