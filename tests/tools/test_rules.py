@@ -74,8 +74,9 @@ CASES = [
      ["2:1: error: the key is ' $$$/a': '$$$' stands at the start, and once",
       "3:5: error: the key is '$/b': '$$$' stands at the start, and once",
       "4:1: error: the key is ''$$$/c': '$$$' stands at the start, and once"]),
-    ("duplicate-key", utf16('"$$$/a=b"\n/b=c\n  /a=d'.replace("  ", "")),
-     ["3:1: error: key '/a' is defined again; the last definition wins", "1:2: note: first defined here"]),
+    ("duplicate-key", utf16('"$$$/a=b"\n/b=c\n/a=d\n/a=e'),
+     ["3:1: error: key '/a' is defined again; the last definition wins", "1:2: note: defined here before",
+      "4:1: error: key '/a' is defined again; the last definition wins", "3:1: note: defined here before"]),
     ("unknown-escape", utf16('"$$$/a=^x \\z ^^ \\\\ ^"'),
      ["1:8: warning: '^x' is no escape and stays as it is", "1:11: warning: '\\z' is no escape and stays as it is",
       "1:20: warning: '^' at the end escapes nothing"]),
@@ -163,7 +164,8 @@ class Rules(unittest.TestCase):
     def test_nothing_to_find(self):
         self.file("d", utf16('"$$$/a=^[Open^] \\"it\\" #{nbsp}100%"\r\n\r\n$$$/b=x=y\n  "/c=C:\\\\'))
         self.file("e", image([(580, [(b"/a", HI)])], minor=0))
-        self.assertEqual(self.check("d", "e", "--disable", "duplicate-across-files"), (0, []))
+        self.file("f", '\ufeff"$$$/d=long enough"\0'.encode("utf-16-le"))
+        self.assertEqual(self.check("d", "e", "f", "--disable", "duplicate-across-files"), (0, []))
 
 
 if __name__ == "__main__":

@@ -171,7 +171,7 @@ class LineCheck {
     Report(
         rules::kDuplicateKey, IndexOf(entry),
         fmt::format("key '{}' is defined again; the last definition wins", Excerpt(KeyText(key))))
-        .notes.push_back(NoteOf(earlier->place, "first defined here"));
+        .notes.push_back(NoteOf(earlier->place, "defined here before"));
   }
 
   const std::string& file;

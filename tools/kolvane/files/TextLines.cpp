@@ -40,7 +40,7 @@ bool TextLines::Next(TextLine& line) {
     if (reader->LineLength() == 0) continue;
     const size_t end = Position();
     const bool isWide = reader->Encoding() != TextEncoding::kCodePage;
-    const bool endsInText = stream.good();
+    const bool endsInText = stream.good() && end < image.size();
     const bool lastIsZero = image[end - 1] == 0 && (!isWide || image[end - 2] == 0);
     line = {counter.LineAt(start), {text, reader->LineLength()}, endsInText && lastIsZero};
     return true;

@@ -32,7 +32,7 @@ class LineCounter {
 struct TextLine {
   size_t number = 0;               // from 1
   std::span<const uint16_t> text;  // without its end
-  bool endsAtZero = false;         // it is a zero character that ends it
+  bool endsAtZero = false;         // a zero character ends it, with more behind
 };
 
 // Gives the lines that a translator would, without the empty ones. The first line of UTF-16 begins
