@@ -146,6 +146,7 @@ class Check(unittest.TestCase):
             log = json.loads(self.check("--format=sarif", "./" + text, binary, *more)[1])
             [run] = log["runs"]
             self.assertEqual((log["version"], run["columnKind"]), ("2.1.0", "unicodeCodePoints"))
+            self.assertEqual(sorted(run["newlineSequences"]), ["\n", "\r", "\r\n", "\u2028", "\u2029"])
             [invocation] = run["invocations"]
             self.assertEqual(invocation["executionSuccessful"], not more)
             self.assertEqual(len(invocation["toolExecutionNotifications"]), len(more))

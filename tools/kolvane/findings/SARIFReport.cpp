@@ -149,6 +149,7 @@ JSON RunObject(const Report& report) {
       {"toolExecutionNotifications", ArrayOf(report.unreadFiles, NotificationObject)}};
   return {{"tool", ToolObject()},
           {"columnKind", "unicodeCodePoints"},
+          {"newlineSequences", {"\r\n", "\n", "\r", "\u2028", "\u2029"}},
           {"invocations", JSON::array({std::move(invocation)})},
           {"artifacts", ArrayOf(report.files, artifactObject)},
           {"results", ArrayOf(report.findings, ResultObject)}};
