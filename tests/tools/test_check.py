@@ -201,6 +201,9 @@ class Check(unittest.TestCase):
             with self.subTest(arguments):
                 self.assertEqual(self.check(*arguments)[0], status)
                 self.assertEqual(self.rules(*arguments), rules)
+        short = self.file(b'"$$$/a=b"', "short")
+        self.assertEqual(self.rules("--reference", short, error), ["too-short", "dropped-line"])
+        self.assertEqual(self.rules("--reference", info, short), ["too-short", "missing-key"])
         self.assertEqual(self.check("-", "--no-snippet", "-q", stdin=DROPPED.encode() + 30 * b"\n")[1][:4], "-:1:")
 
     def test_rules_are_listed(self):

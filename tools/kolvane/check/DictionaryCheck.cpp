@@ -21,8 +21,9 @@
 
 namespace {
 
-// How the file ends for a translator, which a look at its lines does not tell.
-void CheckEnd(const ImageFile& file, std::vector<Finding>& findings) {
+// How the file ends for a translator, which a look at its lines does not tell. Returns whether it
+// is loaded at all.
+bool CheckEnd(const ImageFile& file, std::vector<Finding>& findings) {
   DictionaryTable table;
   const LoadStatus status = LoadInto(table, file);
   Finding finding{.place = {.file = file.name}};
@@ -43,19 +44,20 @@ void CheckEnd(const ImageFile& file, std::vector<Finding>& findings) {
       finding.message = "the file ends in half of a character";
       break;
     default:
-      return;
+      return true;
   }
   findings.push_back(std::move(finding));
+  return status.damage != LoadDamage::kTooShort;
 }
 
 Definitions CheckText(const ImageFile& file, FileEncoding encoding,
                       std::vector<Finding>& findings) {
   Definitions definitions;
   if (!CheckEncoding(file, encoding, findings)) return definitions;
-  CheckEnd(file, findings);
+  const bool isLoaded = CheckEnd(file, findings);
   TextLines lines(file.bytes);
   for (TextLine line; lines.Next(line);) CheckLine(file.name, line, definitions, findings);
-  return definitions;
+  return isLoaded ? definitions : Definitions();
 }
 
 Definitions CheckFile(const ImageFile& file, FileEncoding encoding,
@@ -70,6 +72,14 @@ void SortByPlace(std::vector<Finding>& findings) {
     return std::tuple(finding.place.line, finding.place.column, finding.place.offset);
   };
   std::ranges::stable_sort(findings, {}, place);
+}
+
+// What keeps a file, or a part of it, from being read for what it is.
+bool IsUnread(const Finding& finding) {
+  constexpr const Rule* kRules[] = {&rules::kTooShort, &rules::kUTF16WithoutMark,
+                                    &rules::kTruncatedImage, &rules::kDamagedImage,
+                                    &rules::kUnsupportedVersion};
+  return std::ranges::find(kRules, finding.rule) != std::end(kRules);
 }
 
 void CheckAcross(const Definitions& definitions, Definitions& earlier,
@@ -93,9 +103,12 @@ void CheckAcross(const Definitions& definitions, Definitions& earlier,
 
 std::vector<Finding> CheckDictionaries(const std::vector<ImageFile>& files,
                                        const ImageFile* reference, FileEncoding encoding) {
-  std::vector<Finding> all, ignored;
+  std::vector<Finding> all;
   std::optional<Definitions> source;
-  if (reference != nullptr) source = CheckFile(*reference, encoding, ignored);
+  if (reference != nullptr) {
+    source = CheckFile(*reference, encoding, all);
+    std::erase_if(all, [](const Finding& finding) { return !IsUnread(finding); });
+  }
   Definitions earlier;
   for (const ImageFile& file : files) {
     std::vector<Finding> findings;
