@@ -81,6 +81,8 @@ CASES = [
      ["1:8: warning: '^x' is no escape and stays as it is", "1:11: warning: '\\z' is no escape and stays as it is",
       "1:20: warning: '^' at the end escapes nothing"]),
     ("unknown-named-character", utf16('"$$$/a=^n#{Euro} #{euro}"'), ["1:10: warning: '#{Euro}' names no character and stays as it is"]),
+    ("unknown-named-character", utf16('"$$$/a=b#{user.name} #' + "{" + 33 * "x" + '}"'),
+     ["1:9: warning: '#{user.name}' names no character and stays as it is"]),
     ("unfinished-named-character", utf16('"$$$/a=#{amp and #{amp"'),
      ["1:8: warning: '#{amp' lacks its closing brace and stays as it is",
       "1:18: warning: '#{amp' lacks its closing brace and stays as it is"]),

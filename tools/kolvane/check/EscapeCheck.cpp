@@ -18,8 +18,7 @@ using Units = std::span<const uint16_t>;
 constexpr size_t kMostNameUnits = 32;  // what is longer was not meant for a name
 
 bool IsNameUnit(uint16_t unit) noexcept {
-  return (unit >= '0' && unit <= '9') || (unit >= 'A' && unit <= 'Z') ||
-         (unit >= 'a' && unit <= 'z');
+  return unit > ' ' && unit != '#' && unit != '{' && unit != '}';
 }
 
 // Goes through a value as Unescape does, and keeps of each unit that comes out where it came from.
