@@ -55,7 +55,7 @@ CASES = [
     ("malformed-input", '"$$$/a=ä"\n"$$$/b=ö"\n"$$$/d=Ё"\n"$$$/c=é'.encode() + b"\xff\"\n",
      ["4:9: error: a byte here is no UTF-8, so that the whole file is read in the code page"]),
     ("malformed-input", b'"$$$/a=b \x81"' + PAD.encode(), ["1:10: error: a byte here is no character of the code page"]),
-    ("malformed-input", image([(580, [(b"/a", b"\0\xd8")])]), ["entry 1, byte 44: error: U+D800 in the value is half of a character"]),
+    ("malformed-input", image([(580, [(b"/a", b"a\0\0\xd8")])]), ["entry 1, byte 46: error: U+D800 in the value is half of a character"]),
     ("malformed-input", image([(580, [(b"/a", b"a\xff")])], 1, 0), ["entry 1, byte 49: error: a byte of the value is no UTF-8"]),
     ("dropped-line", utf16('"$$/a=b"'), ["1:2: error: the line is dropped: '$$$' is due, or no '$'"]),
     ("missing-equals", utf16('"$$$/a=b"\r\n; a remark'), ["2:1: warning: without '=' all of it is a key, with an empty value"]),
@@ -66,9 +66,11 @@ CASES = [
     ("swallowed-closing-quote", utf16('"$$$/a=C:\\\\"'), ["1:12: error: the backslash before it makes the last quote a part of the value"]),
     ("empty-key", utf16('"$$$=b"'), ["1:5: warning: the key is empty"]),
     ("empty-key", image([(0, [(b"", HI)])]), ["entry 1, byte 42: warning: the key is empty"]),
-    ("unmatchable-key", utf16('"$$$/größe=b"'), ["1:8: error: no lookup matches a key of a text dictionary with U+00F6"]),
-    ("unmatchable-key", utf16('"$$$/\u0141=b"'), ["1:6: error: no lookup matches a key of a text dictionary with U+0141, but those of '/A' match this one"]),
+    ("unmatchable-key", utf16('"$$$/größe=b"'), ["1:8: error: no lookup in UTF-8 matches a key of a text dictionary with U+00F6"]),
+    ("unmatchable-key", utf16('"$$$/\u0141=b"'), ["1:6: error: no lookup in UTF-8 matches a key of a text dictionary with U+0141, but those of '/A' match this one"]),
     ("unmatchable-key", image([(544, [(b"/=", HI)])]), ["entry 1, byte 42: error: no lookup matches '/=': it holds '='"]),
+    ("unmatchable-key", image([(483, [(b"/\0", HI)])]), ["entry 1, byte 42: error: no lookup matches '/\\x00': it holds a zero character"]),
+    ("unmatchable-key", image([(738, [(b"/\xff", HI)])]), ["entry 1, byte 42: error: no lookup in UTF-8 matches '/ÿ', which is none"]),
     ("mark-in-key", utf16("$$$/a=b"), ["1:1: error: the byte-order mark becomes a part of the key; quotes keep it out"]),
     ("misplaced-dollars", utf16('\n $$$/a=b\n"$$$$/b=c"\n\'$$$/c=d\'\n"$$$/d/$$$=5 $$$"'),
      ["2:1: error: the key is ' $$$/a': '$$$' stands at the start, and once",
@@ -90,6 +92,8 @@ CASES = [
     ("truncated-image", ONE[:-1], ["byte 44: error: what begins here is not all there"]),
     ("damaged-image", ONE[:24] + bytes(4) + ONE[28:], ["byte 24: error: the count of groups is 0"]),
     ("damaged-image", image([(1021, [(b"/a", HI)])]), ["byte 40: error: there is no such bucket; the group's entries are dropped"]),
+    ("damaged-image", image([(580, [(b"/a", HI)])], minor=0).replace(b"\x34\0\0\0", b"\x33\0\0\0", 1),
+     ["byte 34: error: a group does not end at its offset"]),
     ("unsupported-version", ONE[:22] + b"\7" + ONE[23:], ["byte 21: error: this version of the binary format is neither 1.0 nor 1.5"]),
     ("misfiled-entry", image([(7, [(b"/a", HI)])]), ["entry 1, byte 42: error: no lookup finds '/a': it lies in bucket 7, not in 580"]),
     ("shadowed-entry", image([(580, [(b"/a", HI)]), (580, [(b"/a", HI), (b"/a", HI)])]),
@@ -166,8 +170,10 @@ class Rules(unittest.TestCase):
     def test_nothing_to_find(self):
         self.file("d", utf16('"$$$/a=^[Open^] \\"it\\" #{nbsp}100%"\r\n\r\n$$$/b=x=y\n  "/c=C:\\\\'))
         self.file("e", image([(580, [(b"/a", HI)])], minor=0))
+        self.file("g", b'"$$$/a=\xc3\xa9"\n"$$$/b=\xe9"\n"$$$/c=\xe8"')
+        self.file("h", '"$$$/a=\\b\x85"'.encode() + PAD.encode())
         self.file("f", '\ufeff"$$$/d=long enough"\0'.encode("utf-16-le"))
-        self.assertEqual(self.check("d", "e", "f", "--disable", "duplicate-across-files"), (0, []))
+        self.assertEqual(self.check("d", "e", "f", "g", "h", "--disable=utf-8-as-code-page", "--disable", "duplicate-across-files"), (0, []))
 
 
 if __name__ == "__main__":

@@ -113,12 +113,12 @@ class ImageCheck {
 
   void CheckKey(const std::string& key, const StoredEntry& entry) {
     const char* fault = nullptr;
-    if (key.find('=') != key.npos) fault = "holds '='";
-    if (key.find('\0') != key.npos) fault = "holds a zero character";
-    if (!IsValidUTF8(key)) fault = "is not UTF-8";
+    if (!IsValidUTF8(key)) fault = "no lookup in UTF-8 matches '{}', which is none";
+    if (key.find('\0') != key.npos) fault = "no lookup matches '{}': it holds a zero character";
+    if (key.find('=') != key.npos) fault = "no lookup matches '{}': it holds '='";
     if (fault != nullptr) {
       Report(rules::kUnmatchableKey, PlaceOf(entry), key,
-             fmt::format("no lookup matches '{}': it {}", Shown(key), fault));
+             fmt::format(fmt::runtime(fault), Shown(key)));
     } else if (key.empty()) {
       Report(rules::kEmptyKey, PlaceOf(entry), key, "the key is empty");
     }

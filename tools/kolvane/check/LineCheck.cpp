@@ -151,17 +151,20 @@ class LineCheck {
     const bool hasDollars =
         std::search(folder.begin(), folder.end(), kDollars.begin(), kDollars.end()) != folder.end();
     if (!hasDollars && (key.empty() || key[0] != '$')) return;
-    Report(rules::kMisplacedDollars, at,
-           fmt::format("the key is '{}': '$$$' stands at the start, and once", Excerpt(KeyText(key))));
+    Report(
+        rules::kMisplacedDollars, at,
+        fmt::format("the key is '{}': '$$$' stands at the start, and once", Excerpt(KeyText(key))));
   }
 
   void CheckMatchable(size_t at) {
     const auto beyond = std::ranges::find_if(split->key, [](uint16_t unit) { return unit > 0x7F; });
     if (beyond == split->key.end()) return;
     const auto index = static_cast<size_t>(beyond - split->key.begin());
-    std::string message = fmt::format("no lookup matches a key of a text dictionary with {}",
-                                      CodePointText(CodePointAt(split->key, index)));
-    if (IsValidUTF8(key)) message += fmt::format(", but those of '{}' match this one", Excerpt(key));
+    std::string message =
+        fmt::format("no lookup in UTF-8 matches a key of a text dictionary with {}",
+                    CodePointText(CodePointAt(split->key, index)));
+    if (IsValidUTF8(key))
+      message += fmt::format(", but those of '{}' match this one", Excerpt(key));
     Report(rules::kUnmatchableKey, at + index, std::move(message));
   }
 

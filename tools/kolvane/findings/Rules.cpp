@@ -31,7 +31,8 @@ constexpr Rule kSwallowedClosingQuote = {
     "a backslash makes the last quote a part of the value instead of its end"};
 
 constexpr Rule kEmptyKey = {"empty-key", kWarning, "a definition has an empty key"};
-constexpr Rule kUnmatchableKey = {"unmatchable-key", kError, "no lookup can match the key"};
+constexpr Rule kUnmatchableKey = {"unmatchable-key", kError,
+                                  "no lookup in UTF-8 can match the key"};
 constexpr Rule kMarkInKey = {"mark-in-key", kError,
                              "the byte-order mark sticks to a first key without quotes"};
 constexpr Rule kMisplacedDollars = {"misplaced-dollars", kError,
