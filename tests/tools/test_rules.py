@@ -77,8 +77,8 @@ CASES = [
       "3:5: error: the key is '$/b': '$$$' stands at the start, and once",
       "4:1: error: the key is ''$$$/c': '$$$' stands at the start, and once"]),
     ("duplicate-key", utf16('"$$$/a=b"\n/b=c\n/a=d\n/a=e'),
-     ["3:1: error: key '/a' is defined again; the last definition wins", "1:2: note: defined here before",
-      "4:1: error: key '/a' is defined again; the last definition wins", "3:1: note: defined here before"]),
+     ["3:1: error: key '/a' is defined again; the last definition wins", "1:2: note: first defined here",
+      "4:1: error: key '/a' is defined again; the last definition wins", "1:2: note: first defined here"]),
     ("unknown-escape", utf16('"$$$/a=^x \\z ^^ \\\\ ^"'),
      ["1:8: warning: '^x' is no escape and stays as it is", "1:11: warning: '\\z' is no escape and stays as it is",
       "1:20: warning: '^' at the end escapes nothing"]),
@@ -162,6 +162,10 @@ class Rules(unittest.TestCase):
             self.file(name, utf16(f'"$$$/{name}=x"\n"$$$/both=x"'))
         self.assertEqual(self.check("a", "b")[1], ["b:2:2: info: key '/both' is defined in another file too [duplicate-across-files]",
                                                    "a:2:2: note: defined here"])
+
+    def test_another_encoding_than_the_files(self):
+        self.file("d", utf16('"$$$/a=b"'))
+        self.assertEqual(self.check("--encoding=utf-8", "d"), (1, ["d: error: this is UTF-16, not UTF-8 [malformed-input]"]))
 
     def test_every_rule_has_its_dictionary(self):
         listed = [line.split()[0] for line in self.check("--list-rules")[1]]

@@ -12,6 +12,8 @@ void Definitions::Put(Definition definition) {
   if (isNew) {
     definitions.push_back(std::move(definition));
   } else {
-    definitions[place->second] = std::move(definition);
+    Definition& earlier = definitions[place->second];
+    definition.first = earlier.first ? std::move(earlier.first) : std::move(earlier.place);
+    earlier = std::move(definition);
   }
 }

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <unordered_map>
 #include <vector>
@@ -12,6 +13,7 @@ struct Definition {
   std::string key;              // bytes
   std::vector<uint16_t> value;  // decoded
   Place place;
+  std::optional<Place> first{};  // of the first definition that it was put in place of
 };
 
 // One definition for each key.

@@ -67,6 +67,10 @@ class EncodingCheck {
 
   bool Run(FileEncoding encoding) {
     if (IsUTF16(file.bytes) && file.utf8.empty()) return true;
+    if (IsUTF16(file.utf8)) {
+      Report(rules::kMalformedInput, {}, "this is UTF-16, not UTF-8");
+      return false;
+    }
     if (file.utf8.empty() && LooksLikeUTF16(file.bytes)) {
       Report(rules::kUTF16WithoutMark, {},
              "this is UTF-16 without its byte-order mark, which is read in the code page");

@@ -174,7 +174,7 @@ class LineCheck {
     Report(
         rules::kDuplicateKey, IndexOf(entry),
         fmt::format("key '{}' is defined again; the last definition wins", Excerpt(KeyText(key))))
-        .notes.push_back(NoteOf(earlier->place, "defined here before"));
+        .notes.push_back(NoteOf(earlier->first.value_or(earlier->place), "first defined here"));
   }
 
   const std::string& file;

@@ -42,8 +42,10 @@ class Parser {
   std::optional<PrintfDirective> Parse() {
     size_t number = 0;
     if (!ParseNumber(number)) return std::nullopt;
-    while (at < text.size() && IsOneOf("-+#0'", text[at])) ++at;
+    const bool isHyphenated = ParseFlags();
+    const size_t widthAt = at;
     if (!ParseWidth()) return std::nullopt;
+    if (isHyphenated && at == widthAt) return std::nullopt;
     if (Skip(".") && !ParseWidth()) return std::nullopt;
     const char size = ParseModifier();
     if (!ParseConversion(number, size)) return std::nullopt;
@@ -78,6 +80,14 @@ class Parser {
     }
     number = value;
     return number >= 1 && number <= kLargestNumber;
+  }
+
+  // Returns whether one of them is a minus sign.
+  bool ParseFlags() {
+    const size_t start = at;
+    while (at < text.size() && IsOneOf("-+#0'", text[at])) ++at;
+    const Units flags = text.subspan(start, at - start);
+    return std::ranges::find(flags, '-') != flags.end();
   }
 
   bool ParseWidth() {

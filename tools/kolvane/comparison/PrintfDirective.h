@@ -33,5 +33,6 @@ struct PrintfDirective {
 
 // What a text that begins with `%` begins with. Nothing where that is no directive, or one that
 // only looks like it: a space as a flag makes none, for `% c` is in `100% complete`, nor does a
-// number that is 0 or above 9999. `%%` is no directive here.
+// minus sign without a width, as in `50%-os`, or a number that is 0 or above 9999. `%%` is no
+// directive here.
 std::optional<PrintfDirective> ParsePrintfDirective(std::span<const uint16_t> text);
