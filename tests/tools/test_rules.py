@@ -163,6 +163,11 @@ class Rules(unittest.TestCase):
         self.assertEqual(self.check("a", "b")[1], ["b:2:2: info: key '/both' is defined in another file too [duplicate-across-files]",
                                                    "a:2:2: note: defined here"])
 
+    def test_columns_behind_a_zero_character(self):
+        for content in [b'\n"$$$/a=\xe9b"\0"$$$/c=^x"', '\ufeff\n"$$$/a=😀b"\0"$$$/c=^x"'.encode("utf-16-be")]:
+            self.file("d", content)
+            self.assertEqual([line.split(" ")[0] for line in self.check("d")[1]], ["d:2:11:", "d:2:19:"])
+
     def test_another_encoding_than_the_files(self):
         self.file("d", utf16('"$$$/a=b"'))
         self.assertEqual(self.check("--encoding=utf-8", "d"), (1, ["d: error: this is UTF-16, not UTF-8 [malformed-input]"]))

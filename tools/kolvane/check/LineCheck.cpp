@@ -70,8 +70,8 @@ class LineCheck {
   Place PlaceAt(size_t unit) const {
     Place place{.file = file, .line = line.number};
     const Units before = line.text.first(std::max(unit, markLength)).subspan(markLength);
-    place.column = 1 + CodePointCount(before);
-    place.lineText = ToUTF8(line.text.subspan(markLength));
+    place.column = 1 + line.charactersBefore + CodePointCount(before);
+    if (line.charactersBefore == 0) place.lineText = ToUTF8(line.text.subspan(markLength));
     return place;
   }
 

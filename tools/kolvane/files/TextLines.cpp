@@ -11,14 +11,21 @@ uint32_t LineCounter::UnitAt(size_t at) const noexcept {
   return unit | uint32_t{static_cast<uint8_t>(image[at + 1 - lowByte])} << 8;
 }
 
+void LineCounter::Pass(uint32_t unit) noexcept {
+  const bool separator = unitSize == 2 && (unit == 0x2028 || unit == 0x2029);
+  const bool afterReturn = unit == '\n' && before == '\r';
+  const bool endsLine = unit == '\n' || unit == '\r' || separator;
+  const bool isMark = unitSize == 2 && position == 0;
+  const bool isSecondHalf = unitSize == 2 && unit >= 0xDC00 && unit < 0xE000;
+  if (endsLine && !afterReturn) ++line;
+  characters = endsLine ? 0 : characters + (isMark || isSecondHalf ? 0 : 1);
+  before = unit;
+}
+
 size_t LineCounter::LineAt(uint64_t offset) noexcept {
   for (; position + unitSize <= offset && position + unitSize <= image.size();
        position += unitSize) {
-    const uint32_t unit = UnitAt(position);
-    const bool separator = unitSize == 2 && (unit == 0x2028 || unit == 0x2029);
-    const bool afterReturn = unit == '\n' && before == '\r';
-    if ((unit == '\n' && !afterReturn) || unit == '\r' || separator) ++line;
-    before = unit;
+    Pass(UnitAt(position));
   }
   return line;
 }
@@ -42,7 +49,9 @@ bool TextLines::Next(TextLine& line) {
     const bool isWide = reader->Encoding() != TextEncoding::kCodePage;
     const bool endsInText = stream.good() && end < image.size();
     const bool lastIsZero = image[end - 1] == 0 && (!isWide || image[end - 2] == 0);
-    line = {counter.LineAt(start), {text, reader->LineLength()}, endsInText && lastIsZero};
+    const size_t number = counter.LineAt(start);
+    line = {
+        number, counter.CharactersBefore(), {text, reader->LineLength()}, endsInText && lastIsZero};
     return true;
   }
 }

@@ -18,19 +18,25 @@ class LineCounter {
   // The number of the line that holds the byte at `offset`.
   size_t LineAt(uint64_t offset) noexcept;
 
+  // The characters of that line before the byte; the file's byte-order mark is none.
+  size_t CharactersBefore() const noexcept { return characters; }
+
  private:
   uint32_t UnitAt(size_t at) const noexcept;
+  void Pass(uint32_t unit) noexcept;
 
   std::string_view image;
   size_t unitSize;
   size_t lowByte;
   size_t position = 0;
   size_t line = 1;
+  size_t characters = 0;
   uint32_t before = 0;
 };
 
 struct TextLine {
   size_t number = 0;               // from 1
+  size_t charactersBefore = 0;     // what a zero character has cut off before it, zero included
   std::span<const uint16_t> text;  // without its end
   bool endsAtZero = false;         // a zero character ends it, with more behind
 };

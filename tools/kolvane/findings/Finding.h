@@ -31,7 +31,7 @@ struct Place {
   size_t entry = 0;    // from 1; 0 where the place is no entry of a binary image
   bool hasOffset = false;
   uint64_t offset = 0;     // in bytes from the image's start
-  std::string lineText{};  // the line in UTF-8 as it is, its end left out; empty with line 0
+  std::string lineText{};  // the line in UTF-8 as it is, its end left out; may be left out
 };
 
 // Another place that has to do with a finding, and what is there. One place may be noted by very
