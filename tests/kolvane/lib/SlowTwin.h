@@ -1,5 +1,5 @@
 // The dictionary once more, written for obviousness alone: lists instead of chains and index, whole
-// images instead of streams, ICU's conversion instead of ours.
+// images instead of streams. Its conversions are the platform's, which have a second opinion of their own.
 #pragma once
 
 #include <map>

@@ -3,6 +3,8 @@
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <memory>
 
+#include "DictionaryWriter.h"
+
 namespace {
 
 template <class Integer>
@@ -113,6 +115,14 @@ Contents ContentsOf(DictionaryTable& table) {
     }
   }
   return contents;
+}
+
+Answers AnswersOf(DictionaryTable& table) {
+  Answers answers;
+  for (const tovali_private::DictionaryEntry* entry : tovali_private::FoundEntries(table)) {
+    answers[{entry->Bytes().begin(), entry->Bytes().end()}] = Text(entry->Value());
+  }
+  return answers;
 }
 
 std::u16string Translated(DictionaryTable& table, const char* text, int selector) {

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <string>
 #include <tuple>
 #include <utility>
@@ -37,5 +38,9 @@ void Load(DictionaryTable& table, const std::string& image);
 // Every entry of a table: bucket, key and value, in the order of the chains.
 using Contents = std::vector<std::tuple<uint32_t, std::string, std::u16string>>;
 Contents ContentsOf(DictionaryTable& table);
+
+// What lookups find: the value of each key.
+using Answers = std::map<std::string, std::u16string>;
+Answers AnswersOf(DictionaryTable& table);
 
 std::u16string Translated(DictionaryTable& table, const char* text, int selector = 1);

@@ -5,7 +5,6 @@
 #include <filesystem>
 #include <fstream>
 #include <iterator>
-#include <map>
 #include <random>
 #include <sstream>
 
@@ -16,16 +15,6 @@
 using namespace tovali_private;
 
 namespace {
-
-using Answers = std::map<std::string, std::u16string>;
-
-Answers AnswersOf(DictionaryTable& table) {
-  Answers answers;
-  for (const DictionaryEntry* entry : FoundEntries(table)) {
-    answers[{entry->Bytes().begin(), entry->Bytes().end()}] = Text(entry->Value());
-  }
-  return answers;
-}
 
 std::string Written(DictionaryTable& table, BinaryVersion version, TextEncoding values, size_t lost = 0) {
   std::ostringstream image;
