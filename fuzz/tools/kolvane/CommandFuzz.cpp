@@ -5,6 +5,7 @@
 #include <fstream>
 #include <iterator>
 #include <random>
+#include <sstream>
 
 #include "Comparison.h"
 #include "DictionaryCheck.h"
@@ -29,6 +30,7 @@ void DiscardOutput() {
   const char* const nowhere =
       std::filesystem::path::preferred_separator == '/' ? "/dev/null" : "NUL";
   Require(std::freopen(nowhere, "w", stdout) != nullptr, "output can be discarded");
+  std::setvbuf(stdout, nullptr, _IOFBF, 1 << 16);
 }
 
 // As the command reads it.
@@ -116,6 +118,22 @@ void CheckKeys(Dictionary& translation, Dictionary& reference, const Findings& f
           "the check knows the keys that are missing");
 }
 
+// As an image from which a check takes the same definitions, to find its values all the same.
+void CheckValues(const ImageFile& file, Dictionary& dictionary, FileEncoding encoding) {
+  using namespace tovali_private;
+  if (!dictionary.IsChecked()) return;
+  std::ostringstream image;
+  const auto lost =
+      WriteBinary(dictionary.table, BinaryVersion::k1_5, TextEncoding::kUTF16LE, image);
+  Require(lost.empty(), "UTF-16 carries everything");
+  const ImageFile written = {"written", image.str(), {}};
+  const Findings findings = CheckDictionaries({file}, &written, encoding);
+  Require(Count(findings, rules::kExtraKey) == 0, "what is written has every key");
+  const Coverage coverage = CoverageOf(dictionary.table, dictionary.table);
+  Require(Count(findings, rules::kUntranslated) == coverage.identical,
+          "the check knows the values that translators have");
+}
+
 void CheckNumbers(Dictionary& translation, Dictionary& reference) {
   StatisticsReport report;
   const Statistics statistics = StatisticsOf(reference.table);
@@ -163,6 +181,7 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   WriteReports(findings, others);
   Dictionary reference(files.front(), encoding), translation(files.back(), encoding);
   CheckKeys(translation, reference, CheckDictionaries({files.back()}, &files.front(), encoding));
+  CheckValues(files.back(), translation, encoding);
   CheckNumbers(translation, reference);
   CompareAll(translation, reference);
   return 0;
