@@ -12,8 +12,10 @@
 
 namespace {
 
+// None where there is no such folder.
 std::vector<std::filesystem::path> FilesIn(const char* folder) {
   std::vector<std::filesystem::path> files;
+  if (!std::filesystem::exists(folder)) return files;
   for (const auto& file : std::filesystem::directory_iterator(folder)) {
     files.push_back(file.path());
   }

@@ -323,6 +323,11 @@ const int* SelectorFor(TextEncoding encoding) noexcept {
   return encoding == TextEncoding::kUTF8 ? &kUTF8Selector : kDefaultSelector;
 }
 
+bool IsBinary(std::string_view image) noexcept {
+  const bool isMarked = image.starts_with("\xFF\xFE") || image.starts_with("\xFE\xFF");
+  return image.substr(isMarked ? 2 : 0).starts_with(kBinaryMagic);
+}
+
 bool ParseBinary(std::istream& image, StoredImage& stored, LoadStatus& status) {
   status.format = ImageFormat::kBinaryOther;
   BinaryParser parser(image, stored, status);

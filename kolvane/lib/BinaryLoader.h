@@ -24,7 +24,12 @@ struct StoredImage;
 
 inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
 
-// Takes the image apart, whose stream stands at offset 0 and is known to begin with the magic:
+// Whether a load takes the image for a binary one: it begins with the magic, or has it behind a
+// byte-order mark of UTF-16. The latter is of no version that is known, for the header is looked
+// for at the start all the same.
+bool IsBinary(std::string_view image) noexcept;
+
+// Takes the image apart, whose stream stands at offset 0 and which is known to be binary:
 // `stored` gets its groups in their order, values as they are stored, and `status` format, encoding
 // and damage, but none of keys. Returns whether the body was there to its end.
 //

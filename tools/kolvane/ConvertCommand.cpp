@@ -93,7 +93,7 @@ std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian) {
 // Throws Failure for what is no text, or malformed.
 std::vector<uint16_t> Decoded(const ImageFile& file) {
   const std::string name = Printable(file.name);
-  if (file.bytes.starts_with(tovali_private::kBinaryMagic)) {
+  if (tovali_private::IsBinary(file.bytes)) {
     throw Failure(name +
                   ": a binary dictionary has no encoding to change; 'kolvane dump' prints it");
   }

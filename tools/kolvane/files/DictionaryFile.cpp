@@ -60,7 +60,7 @@ LoadStatus LoadInto(DictionaryTable& table, const ImageFile& file) {
 std::vector<const DictionaryEntry*> EntriesInFileOrder(DictionaryTable& table,
                                                        const ImageFile& file) {
   FoundOnce found(table);
-  const bool isBinary = file.bytes.starts_with(tovali_private::kBinaryMagic);
+  const bool isBinary = tovali_private::IsBinary(file.bytes);
   isBinary ? FindStored(file, found) : FindLines(file, found);
   return found.Take();
 }

@@ -65,7 +65,7 @@ std::string RecodedFromUTF8(const std::string& name, std::string_view text) {
 
 ImageFile ReadImageFile(const std::string& name, FileEncoding encoding) {
   std::string bytes = ReadBytes(name);
-  const bool isText = !bytes.empty() && !bytes.starts_with(tovali_private::kBinaryMagic);
+  const bool isText = !bytes.empty() && !tovali_private::IsBinary(bytes);
   const bool isUTF8 = isText && (encoding == FileEncoding::kUTF8 ||
                                  (encoding == FileEncoding::kAuto && IsTextInUTF8(bytes)));
   if (!isUTF8) return {name, std::move(bytes), {}};
