@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "Converters.h"
+#include "DictionaryReader.h"
 #include "DictionaryTable.h"
 #include "LittleEndian.h"
 #include "StoredGroups.h"
@@ -324,7 +325,7 @@ const int* SelectorFor(TextEncoding encoding) noexcept {
 }
 
 bool IsBinary(std::string_view image) noexcept {
-  const bool isMarked = image.starts_with("\xFF\xFE") || image.starts_with("\xFE\xFF");
+  const bool isMarked = EncodingByMark(image) != TextEncoding::kCodePage;
   return image.substr(isMarked ? 2 : 0).starts_with(kBinaryMagic);
 }
 

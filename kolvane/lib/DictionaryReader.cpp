@@ -11,9 +11,6 @@
 namespace tovali_private {
 namespace {
 
-constexpr uint16_t kByteOrderMark = 0xFEFF;
-constexpr uint16_t kSwappedByteOrderMark = 0xFFFE;
-
 // What ends a line, and the zero that ends the input too.
 using UnicodeEnds = UnitSet<0, 0x000A, 0x000D, 0x2028, 0x2029>;
 using MultibyteEnds = UnitSet<0, 0x0A, 0x0D>;
@@ -24,15 +21,24 @@ constexpr uint16_t Swapped(uint16_t unit) noexcept {
 
 }  // namespace
 
+TextEncoding EncodingByMark(std::string_view image) noexcept {
+  if (image.starts_with("\xFF\xFE")) return TextEncoding::kUTF16LE;
+  if (image.starts_with("\xFE\xFF")) return TextEncoding::kUTF16BE;
+  return TextEncoding::kCodePage;
+}
+
 std::unique_ptr<DictionaryReader> DictionaryReader::Create(std::istream* stream) {
   const bool readable = stream != nullptr && stream->good();
   uint8_t mark[2] = {};
   uint32_t count = sizeof mark;
   ReadStreamBytes(stream, mark, count);
-  if (count == sizeof mark) {
-    const uint16_t unit = Read16(mark);
-    if (unit == kByteOrderMark) return std::make_unique<UnicodeReader>(stream);
-    if (unit == kSwappedByteOrderMark) return std::make_unique<ByteSwapUnicodeReader>(stream);
+  switch (EncodingByMark({reinterpret_cast<const char*>(mark), count})) {
+    case TextEncoding::kUTF16LE:
+      return std::make_unique<UnicodeReader>(stream);
+    case TextEncoding::kUTF16BE:
+      return std::make_unique<ByteSwapUnicodeReader>(stream);
+    default:
+      break;
   }
   if (readable) {
     stream->clear();  // of the end that a stream of fewer than two bytes has met

@@ -5,11 +5,16 @@
 #include <iosfwd>
 #include <memory>
 #include <span>
+#include <string_view>
 
 #include "GrowableBuffer.h"
 #include "LoadStatus.h"
 
 namespace tovali_private {
+
+// The encoding of a text image, told from its first two bytes: a byte-order mark of UTF-16, or else
+// the system's code page.
+TextEncoding EncodingByMark(std::string_view image) noexcept;
 
 // Reads one stream, which it borrows, from where it stands; whoever owns the stream may move it
 // between two lines. Buffers are kept from line to line, and lines have no length limit but theirs.
@@ -28,9 +33,8 @@ class DictionaryReader {
 
   TextEncoding Encoding() const noexcept { return encoding; }
 
-  // Tells the encoding from the first two bytes: a UTF-16 byte-order mark of either order, which is
-  // left behind the stream's position, or else the system's code page, with the stream moved back
-  // to position 0.
+  // For the encoding that the mark tells. A mark is left behind the stream's position; without one
+  // the stream is moved back to position 0.
   static std::unique_ptr<DictionaryReader> Create(std::istream* stream);
 
  protected:

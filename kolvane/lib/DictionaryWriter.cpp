@@ -1,7 +1,6 @@
 #include "DictionaryWriter.h"
 
 #include <algorithm>
-#include <limits>
 #include <ostream>
 #include <span>
 #include <sstream>
@@ -21,14 +20,7 @@ using Entries = std::vector<const DictionaryEntry*>;
 using Bytes = std::span<const uint8_t>;
 using Units = std::span<const uint16_t>;
 
-constexpr uint64_t kMostImageBytes = std::numeric_limits<int32_t>::max() - 1;
 constexpr size_t kHeaderSize = kBinaryMagic.size() + 3;
-
-bool ComesBefore(const DictionaryEntry* one, const DictionaryEntry* other) noexcept {
-  const Bytes a = one->Bytes();
-  const Bytes b = other->Bytes();
-  return std::lexicographical_compare(a.begin(), a.end(), b.begin(), b.end());
-}
 
 // What the header says of the values' encoding.
 uint8_t EncodingByte(TextEncoding values) noexcept {
@@ -157,6 +149,10 @@ uint64_t Size1_0(const StoredImage& image) noexcept {
 
 }  // namespace
 
+bool KeyComesBefore(const DictionaryEntry* one, const DictionaryEntry* other) noexcept {
+  return std::ranges::lexicographical_compare(one->Bytes(), other->Bytes());
+}
+
 Entries FoundEntries(DictionaryTable& table) {
   Entries entries;
   for (uint32_t bucket = 0; bucket < DictionaryTable::kBucketCount; ++bucket) {
@@ -165,7 +161,7 @@ Entries FoundEntries(DictionaryTable& table) {
       const auto* const entry = static_cast<const DictionaryEntry*>(item);
       if (table.Find(*entry) == entry) entries.push_back(entry);
     }
-    std::sort(entries.begin() + begin, entries.end(), ComesBefore);
+    std::sort(entries.begin() + begin, entries.end(), KeyComesBefore);
   }
   return entries;
 }

@@ -14,6 +14,9 @@ namespace tovali_private {
 
 class DictionaryEntry;
 
+// The order of two entries by their keys as bytes.
+bool KeyComesBefore(const DictionaryEntry* one, const DictionaryEntry* other) noexcept;
+
 // The entries that lookups find, by bucket and, within each, by their keys as bytes: an order that
 // depends on nothing but the keys. They stay the table's. Throws std::bad_alloc.
 std::vector<const DictionaryEntry*> FoundEntries(DictionaryTable& table);

@@ -3,6 +3,9 @@
 
 #include <cstdint>
 
+// The most bytes of an image, text or binary, that a translator takes.
+inline constexpr uint32_t kMostImageBytes = 0x7FFFFFFE;
+
 enum class ImageFormat : uint8_t {
   kNone,  // nothing was loaded, or the image is too short to tell
   kText,

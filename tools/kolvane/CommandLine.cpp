@@ -78,3 +78,9 @@ void CheckFiles(const std::vector<std::string>& files) {
     throw UsageError("standard input is named twice");
   }
 }
+
+std::string OneFile(const std::vector<std::string>& files) {
+  CheckFiles(files);
+  if (files.size() > 1) throw UsageError("more than one file is named");
+  return files.front();
+}

@@ -33,3 +33,7 @@ class CommandLine {
 // For operands that name files to read: throws UsageError where there is none, and where standard
 // input (`-`), which can be read once, is named twice.
 void CheckFiles(const std::vector<std::string>& files);
+
+// The file of a command that takes one; throws UsageError where there is none, and where there are
+// more.
+std::string OneFile(const std::vector<std::string>& files);

@@ -68,10 +68,7 @@ void AddOptions(CLI::App& options, Request& request) {
 // Returns whether the file could be read and is whole, and says what is wrong with it.
 bool Load(const std::string& name, FileEncoding encoding, DictionaryTable& table) {
   try {
-    const ImageFile file = ReadImageFile(name, encoding);
-    const LoadStatus status = LoadInto(table, file);
-    for (const std::string& warning : WarningsOf(file, status)) Say(warning);
-    return status.Complete();
+    return LoadWithWarnings(table, ReadImageFile(name, encoding));
   } catch (const Failure& failure) {
     Say(failure.what());
     return false;

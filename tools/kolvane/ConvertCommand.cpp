@@ -12,6 +12,7 @@
 #include "ChoiceOption.h"
 #include "CommandLine.h"
 #include "Converters.h"
+#include "DictionaryReader.h"
 #include "EncodingOption.h"
 #include "ImageFile.h"
 #include "OutputFile.h"
@@ -20,8 +21,6 @@
 namespace {
 
 using Units = std::span<const uint16_t>;
-
-constexpr std::string_view kMarkInUTF8 = "\xEF\xBB\xBF";
 
 constexpr const char* kAbout =
     R"(Change the encoding of a text dictionary, and nothing else.
@@ -58,13 +57,9 @@ void AddOptions(CLI::App& options, Request& request) {
   AddEncodingOption(options, request.encoding);
 }
 
-constexpr bool EndsLine(uint16_t unit) noexcept {
-  return unit == '\r' || unit == '\n' || unit == 0x2028 || unit == 0x2029;
-}
-
 // With its line end, which CR LF is one of.
 size_t LengthOfLine(Units text) noexcept {
-  const auto end = static_cast<size_t>(std::ranges::find_if(text, EndsLine) - text.begin());
+  const auto end = static_cast<size_t>(std::ranges::find_if(text, IsLineEnd) - text.begin());
   if (end == text.size()) return end;
   const bool isPair = text[end] == '\r' && end + 1 < text.size() && text[end + 1] == '\n';
   return end + (isPair ? 2 : 1);
@@ -73,7 +68,7 @@ size_t LengthOfLine(Units text) noexcept {
 // `name:line:column` of what follows the text.
 std::string PlaceBehind(Units text, const std::string& name) {
   size_t line = 1;
-  for (size_t length = LengthOfLine(text); length != 0 && EndsLine(text[length - 1]);
+  for (size_t length = LengthOfLine(text); length != 0 && IsLineEnd(text[length - 1]);
        length = LengthOfLine(text)) {
     text = text.subspan(length);
     ++line;
@@ -99,14 +94,16 @@ std::vector<uint16_t> Decoded(const ImageFile& file) {
   }
   if (const auto bad = MalformedUTF8At(file.utf8)) {
     std::string_view before = std::string_view(file.utf8).substr(0, *bad);
-    if (before.starts_with(kMarkInUTF8)) before.remove_prefix(kMarkInUTF8.size());
+    if (before.starts_with(kUTF8Mark)) before.remove_prefix(kUTF8Mark.size());
     throw Failure(
         fmt::format("{}: byte {} is malformed UTF-8", PlaceBehind(ToUTF16(before), name), *bad));
   }
-  const bool isLittle = file.bytes.starts_with("\xFF\xFE");
-  const bool isBig = file.bytes.starts_with("\xFE\xFF");
-  if (!isLittle && !isBig) return FromMultiByte(file.bytes, tovali_private::kDefaultSelector);
-  std::vector<uint16_t> units = DecodedUTF16(std::string_view(file.bytes).substr(2), isBig);
+  const TextEncoding source = tovali_private::EncodingByMark(file.bytes);
+  if (source == TextEncoding::kCodePage) {
+    return FromMultiByte(file.bytes, tovali_private::kDefaultSelector);
+  }
+  std::vector<uint16_t> units =
+      DecodedUTF16(std::string_view(file.bytes).substr(2), source == TextEncoding::kUTF16BE);
   if (file.bytes.size() % 2 != 0) {
     throw Failure(fmt::format("{}: byte {} is half a character", PlaceBehind(units, name),
                               file.bytes.size() - 1));
@@ -117,8 +114,8 @@ std::vector<uint16_t> Decoded(const ImageFile& file) {
 // Text without a byte-order mark must not begin with what marks something else.
 void RefuseMisreading(const std::string& name, std::string_view text, TextEncoding target) {
   if (target == TextEncoding::kUTF16LE || target == TextEncoding::kUTF16BE) return;
-  const bool isMarked = text.starts_with("\xFF\xFE") || text.starts_with("\xFE\xFF");
-  if (!isMarked && !text.starts_with(tovali_private::kBinaryMagic)) return;
+  const bool isMarked = tovali_private::EncodingByMark(text) != TextEncoding::kCodePage;
+  if (!isMarked && !tovali_private::IsBinary(text)) return;
   throw Failure(
       fmt::format("{}:1:1: nothing was written, for without a byte-order mark the text "
                   "would be taken for {}",
@@ -208,9 +205,6 @@ ExitStatus RunConvert(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane convert", "INPUT -o OUT --to ENCODING", kAbout);
   AddOptions(commandLine.Options(), request);
-  const std::vector<std::string> inputs = commandLine.Parse(argc, argv);
-  CheckFiles(inputs);
-  if (inputs.size() != 1) throw UsageError("more than one input is named");
-  request.input = inputs.front();
+  request.input = OneFile(commandLine.Parse(argc, argv));
   return Convert(request);
 }

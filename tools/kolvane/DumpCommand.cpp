@@ -7,8 +7,10 @@
 #include <string>
 #include <vector>
 
+#include "BinaryLoader.h"
 #include "CommandLine.h"
 #include "DictionaryFile.h"
+#include "DictionaryWriter.h"
 #include "EncodingOption.h"
 #include "LoadWarnings.h"
 #include "StandardOutput.h"
@@ -52,9 +54,7 @@ void AddOptions(CLI::App& options, Request& request) {
 Entries EntriesOf(const Request& request, DictionaryTable& table, const ImageFile& file) {
   Entries entries = EntriesInFileOrder(table, file);
   if (request.sort) {
-    std::ranges::sort(entries, [](const DictionaryEntry* one, const DictionaryEntry* other) {
-      return std::ranges::lexicographical_compare(one->Bytes(), other->Bytes());
-    });
+    std::ranges::sort(entries, tovali_private::KeyComesBefore);
   }
   return entries;
 }
@@ -102,7 +102,7 @@ class TextDump {
 
  private:
   // The test for the binary format takes that many bytes at least.
-  static constexpr size_t kLeastUnits = 21;
+  static constexpr size_t kLeastUnits = tovali_private::kBinaryMagic.size();
 
   void Write(const std::vector<uint16_t>& units) {
     if (utf16 && unitCount == 0) WriteOutput("\xFF\xFE");
@@ -162,10 +162,8 @@ void PrintJSON(const Entries& entries) {
 ExitStatus Dump(const Request& request) {
   const ImageFile file = ReadImageFile(request.file, request.encoding);
   DictionaryTable table;
-  const LoadStatus loaded = LoadInto(table, file);
-  for (const std::string& warning : WarningsOf(file, loaded)) Say(warning);
+  ExitStatus status = LoadWithWarnings(table, file) ? ExitStatus::kDone : ExitStatus::kFindings;
   const Entries entries = EntriesOf(request, table, file);
-  ExitStatus status = loaded.Complete() ? ExitStatus::kDone : ExitStatus::kFindings;
   if (request.json) {
     PrintJSON(entries);
   } else {
@@ -180,10 +178,7 @@ ExitStatus RunDump(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane dump", "IMAGE", kAbout);
   AddOptions(commandLine.Options(), request);
-  const std::vector<std::string> files = commandLine.Parse(argc, argv);
-  CheckFiles(files);
-  if (files.size() != 1) throw UsageError("more than one image is named");
+  request.file = OneFile(commandLine.Parse(argc, argv));
   if (request.json && request.utf16) throw UsageError("--json is in UTF-8");
-  request.file = files.front();
   return Dump(request);
 }

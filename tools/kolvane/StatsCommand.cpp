@@ -82,14 +82,6 @@ void CheckRequest(Request& request) {
   }
 }
 
-// Returns whether the file is whole, and says what is wrong with it.
-bool Load(const std::string& name, FileEncoding encoding, DictionaryTable& table) {
-  const ImageFile file = ReadImageFile(name, encoding);
-  const LoadStatus status = LoadInto(table, file);
-  for (const std::string& warning : WarningsOf(file, status)) Say(warning);
-  return status.Complete();
-}
-
 class Counting {
  public:
   explicit Counting(const Request& asked) : request(asked) {}
@@ -102,8 +94,13 @@ class Counting {
   }
 
  private:
+  void Load(const std::string& name, DictionaryTable& table) {
+    const bool isWhole = LoadWithWarnings(table, ReadImageFile(name, request.encoding));
+    if (!isWhole) Note(ExitStatus::kFindings);
+  }
+
   void LoadReference(const std::string& name) {
-    if (!Load(name, request.encoding, reference)) Note(ExitStatus::kFindings);
+    Load(name, reference);
     const uint64_t keys = StatisticsOf(reference).keys;
     if (keys == 0) throw Failure(Printable(name) + ": a reference without keys");
     report.reference = {name, keys};
@@ -112,7 +109,7 @@ class Counting {
   void Count(const std::string& name) {
     DictionaryTable table;
     try {
-      if (!Load(name, request.encoding, table)) Note(ExitStatus::kFindings);
+      Load(name, table);
     } catch (const Failure& failure) {
       Say(failure.what());
       return Note(ExitStatus::kNotDone);

@@ -111,7 +111,7 @@ void Load(const ImageFile& file, Translator& translator) {
 // A translator does not tell how the loading of an image went; a table does.
 void Warn(const ImageFile& file) {
   DictionaryTable table;
-  for (const std::string& warning : WarningsOf(file, LoadInto(table, file))) Say(warning);
+  LoadWithWarnings(table, file);
 }
 
 // Loads the files in order, with their warnings. Returns whether all of them could be loaded.

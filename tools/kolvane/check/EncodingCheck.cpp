@@ -5,16 +5,16 @@
 #include <algorithm>
 #include <string_view>
 
+#include "DictionaryReader.h"
+#include "LineCheck.h"
 #include "Rules.h"
 #include "Text.h"
 #include "TextLines.h"
 
 namespace {
 
-constexpr std::string_view kUTF8Mark = "\xEF\xBB\xBF";
-
 bool IsUTF16(std::string_view image) noexcept {
-  return image.starts_with("\xFF\xFE") || image.starts_with("\xFE\xFF");
+  return tovali_private::EncodingByMark(image) != TextEncoding::kCodePage;
 }
 
 // Whether its first two characters have a zero byte each, as ASCII has in UTF-16.
@@ -35,7 +35,7 @@ struct LinesOfUTF8 {
   std::vector<Place> malformed;
 };
 
-Place PlaceIn(std::string_view line, size_t at) {
+Place PlaceInUTF8(std::string_view line, size_t at) {
   Place place;
   place.column = 1 + CodePointCount(ToUTF16(line.substr(0, at)));
   place.lineText = ToUTF8(ToUTF16(line));
@@ -50,7 +50,7 @@ LinesOfUTF8 ReadAsUTF8(std::string_view text) {
     const size_t end = std::min(text.find_first_of("\r\n", at), text.size());
     const std::string_view line = text.substr(at, end - at);
     if (const auto bad = MalformedUTF8At(line)) {
-      Place& place = lines.malformed.emplace_back(PlaceIn(line, *bad));
+      Place& place = lines.malformed.emplace_back(PlaceInUTF8(line, *bad));
       place.line = counter.LineAt(at);
     } else if (std::ranges::any_of(line, IsBeyondASCII)) {
       ++lines.wellFormed;
@@ -109,10 +109,9 @@ class EncodingCheck {
       const auto bad = std::ranges::find_if(
           line.text, [](uint16_t unit) { return unit >= 0x80 && unit < 0xA0; });
       if (bad == line.text.end()) continue;
-      Place place{.file = file.name, .line = line.number};
-      place.column = 1 + static_cast<size_t>(bad - line.text.begin());
-      place.lineText = ToUTF8(line.text);
-      Report(rules::kMalformedInput, place, "a byte here is no character of the code page");
+      const auto at = static_cast<size_t>(bad - line.text.begin());
+      Report(rules::kMalformedInput, PlaceIn(file.name, line, at),
+             "a byte here is no character of the code page");
     }
   }
 

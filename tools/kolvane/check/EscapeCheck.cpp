@@ -46,7 +46,7 @@ class EscapeCheck {
 
   void CheckEscape(const DecodedStart& start, size_t at) {
     if (start.kind == DecodedStart::kUnknownEscape) {
-      const size_t length = CodePointAt(value, at + 1) > 0xFFFF ? 3 : 2;
+      const size_t length = 1 + UnitCount(CodePointAt(value, at + 1));
       Report(
           rules::kUnknownEscape, at,
           fmt::format("'{}' is no escape and stays as it is", ToUTF8(value.subspan(at, length))));

@@ -59,11 +59,11 @@ std::optional<BadCharacter> BadCharacterIn(Bytes value, TextEncoding encoding) {
   const std::vector<uint16_t> units = UnitsOf(value);
   for (size_t at = 0; at < units.size();) {
     const char32_t codePoint = CodePointAt(units, at);
-    if (codePoint >= 0xD800 && codePoint < 0xE000) {
+    if (IsSurrogate(codePoint)) {
       return BadCharacter{
           2 * at, fmt::format("{} in the value is half of a character", CodePointText(codePoint))};
     }
-    at += codePoint > 0xFFFF ? 2 : 1;
+    at += UnitCount(codePoint);
   }
   return std::nullopt;
 }

@@ -29,8 +29,9 @@ bool IsSpace(uint16_t unit) noexcept {
   return unit == ' ' || unit == '\t' || unit == kByteOrderMark;
 }
 
-bool IsSurrogate(char32_t codePoint) noexcept {
-  return codePoint >= 0xD800 && codePoint < 0xE000;
+// The units of the file's byte-order mark.
+size_t MarkLength(const TextLine& line) noexcept {
+  return line.number == 1 && line.text[0] == kByteOrderMark ? 1 : 0;
 }
 
 class LineCheck {
@@ -38,7 +39,7 @@ class LineCheck {
   LineCheck(const std::string& fileName, const TextLine& checkedLine, std::vector<Finding>& list)
       : file(fileName),
         line(checkedLine),
-        markLength(line.number == 1 && line.text[0] == kByteOrderMark ? 1 : 0),
+        markLength(MarkLength(line)),
         entry(tovali_private::EntryText(line.text)),
         split(tovali_private::SplitKolvane(entry)),
         findings(list) {
@@ -67,13 +68,7 @@ class LineCheck {
     return static_cast<size_t>(part.data() - line.text.data());
   }
 
-  Place PlaceAt(size_t unit) const {
-    Place place{.file = file, .line = line.number};
-    const Units before = line.text.first(std::max(unit, markLength)).subspan(markLength);
-    place.column = 1 + line.charactersBefore + CodePointCount(before);
-    if (line.charactersBefore == 0) place.lineText = ToUTF8(line.text.subspan(markLength));
-    return place;
-  }
+  Place PlaceAt(size_t unit) const { return PlaceIn(file, line, unit); }
 
   Finding& Report(const Rule& rule, size_t unit, std::string message) {
     Finding finding{.rule = &rule, .place = PlaceAt(unit), .message = std::move(message)};
@@ -97,7 +92,7 @@ class LineCheck {
         Report(rules::kMalformedInput, at,
                fmt::format("{} is half of a character", CodePointText(codePoint)));
       }
-      at += codePoint > 0xFFFF ? 2 : 1;
+      at += UnitCount(codePoint);
     }
     if (line.endsAtZero) {
       Report(rules::kZeroCharacter, line.text.size(), "a zero character ends the line here");
@@ -187,6 +182,15 @@ class LineCheck {
 };
 
 }  // namespace
+
+Place PlaceIn(const std::string& file, const TextLine& line, size_t unit) {
+  const size_t markLength = MarkLength(line);
+  const Units before = line.text.first(std::max(unit, markLength)).subspan(markLength);
+  Place place{.file = file, .line = line.number};
+  place.column = 1 + line.charactersBefore + CodePointCount(before);
+  if (line.charactersBefore == 0) place.lineText = ToUTF8(line.text.subspan(markLength));
+  return place;
+}
 
 void CheckLine(const std::string& file, const TextLine& line, Definitions& definitions,
                std::vector<Finding>& findings) {

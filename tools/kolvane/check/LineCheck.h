@@ -8,6 +8,9 @@
 #include "Finding.h"
 #include "TextLines.h"
 
+// The place of a unit of the line.
+Place PlaceIn(const std::string& file, const TextLine& line, size_t unit);
+
 // Reports what is wrong with a line of the file, and puts what it defines among the definitions of
 // the lines before it.
 void CheckLine(const std::string& file, const TextLine& line, Definitions& definitions,

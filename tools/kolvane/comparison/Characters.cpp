@@ -2,29 +2,13 @@
 
 #include <boost/spirit/home/support/char_encoding/unicode/query.hpp>
 
+#include "Text.h"
+
 namespace ucd = boost::spirit::ucd;
 
-namespace {
-
-constexpr bool IsHighSurrogate(uint16_t unit) {
-  return (unit & 0xFC00) == 0xD800;
-}
-
-constexpr bool IsLowSurrogate(uint16_t unit) {
-  return (unit & 0xFC00) == 0xDC00;
-}
-
-constexpr char32_t Joined(uint16_t high, uint16_t low) {
-  return 0x10000 + ((char32_t{high} & 0x3FF) << 10) + (char32_t{low} & 0x3FF);
-}
-
-}  // namespace
-
 Character CharacterAt(std::span<const uint16_t> text, size_t at) {
-  const uint16_t unit = text[at];
-  if (!IsHighSurrogate(unit) && !IsLowSurrogate(unit)) return {unit, 1};
-  const bool isPair = IsHighSurrogate(unit) && at + 1 < text.size() && IsLowSurrogate(text[at + 1]);
-  return isPair ? Character{Joined(unit, text[at + 1]), 2} : Character{0xFFFD, 1};
+  const char32_t code = CodePointAt(text, at);
+  return {IsSurrogate(code) ? U'\uFFFD' : code, UnitCount(code)};
 }
 
 bool IsLetter(char32_t code) {
@@ -49,10 +33,6 @@ bool IsQuoteOrBracket(char32_t code) {
 
 bool IsWhiteSpace(char32_t code) {
   return ucd::is_white_space(code);
-}
-
-bool IsLineEnd(char32_t code) {
-  return code == '\n' || code == '\r' || code == 0x2028 || code == 0x2029;
 }
 
 bool IsWrittenWithoutSpaces(char32_t code) {

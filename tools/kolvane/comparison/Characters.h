@@ -23,9 +23,6 @@ bool IsQuoteOrBracket(char32_t code);
 // Line ends included, and spaces that do not break.
 bool IsWhiteSpace(char32_t code);
 
-// Ends a line, alone or as a part of CR LF.
-bool IsLineEnd(char32_t code);
-
 // Chinese or Japanese, punctuation included: written without spaces around it.
 bool IsWrittenWithoutSpaces(char32_t code);
 

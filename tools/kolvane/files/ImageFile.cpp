@@ -6,7 +6,6 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
-#include <limits>
 #include <memory>
 #include <string_view>
 #include <utility>
@@ -14,12 +13,12 @@
 
 #include "BinaryLoader.h"
 #include "File.h"
+#include "LoadStatus.h"
 #include "Messages.h"
 #include "Text.h"
 
 namespace {
 
-constexpr size_t kMostBytes = std::numeric_limits<int32_t>::max() - 1;  // in whole units
 constexpr uint16_t kByteOrderMark = 0xFEFF;
 
 [[noreturn]] void Fail(const std::string& name, std::string_view reason) {
@@ -30,7 +29,8 @@ std::string ReadAll(const std::string& name, std::FILE* file) {
   std::string bytes;
   char block[1 << 16];
   while (const size_t count = std::fread(block, 1, sizeof block, file)) {
-    if (count > kMostBytes - bytes.size()) Fail(name, "larger than a dictionary may be (2 GiB)");
+    if (count > kMostImageBytes - bytes.size())
+      Fail(name, "larger than a dictionary may be (2 GiB)");
     bytes.append(block, count);
   }
   if (std::ferror(file) != 0) Fail(name, std::strerror(errno));
@@ -57,7 +57,7 @@ bool IsTextInUTF8(std::string_view bytes) {
 std::string RecodedFromUTF8(const std::string& name, std::string_view text) {
   std::vector<uint16_t> units = ToUTF16(text);
   if (units.empty() || units.front() != kByteOrderMark) units.insert(units.begin(), kByteOrderMark);
-  if (units.size() > kMostBytes / 2) Fail(name, "too large once it is UTF-16 (2 GiB)");
+  if (units.size() > kMostImageBytes / 2) Fail(name, "too large once it is UTF-16 (2 GiB)");
   return {reinterpret_cast<const char*>(units.data()), units.size() * 2};
 }
 

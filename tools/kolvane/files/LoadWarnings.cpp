@@ -67,3 +67,9 @@ std::vector<std::string> WarningsOf(const ImageFile& file, const LoadStatus& sta
   }
   return warnings;
 }
+
+bool LoadWithWarnings(DictionaryTable& table, const ImageFile& file) {
+  const LoadStatus status = LoadInto(table, file);
+  for (const std::string& warning : WarningsOf(file, status)) Say(warning);
+  return status.Complete();
+}

@@ -71,9 +71,21 @@ char32_t CodePointAt(std::span<const uint16_t> units, size_t at) noexcept {
   return 0x10000 + ((first - 0xD800) << 10) + (second - 0xDC00);
 }
 
+bool IsSurrogate(char32_t codePoint) noexcept {
+  return codePoint >= 0xD800 && codePoint < 0xE000;
+}
+
+size_t UnitCount(char32_t codePoint) noexcept {
+  return codePoint > 0xFFFF ? 2 : 1;
+}
+
+bool IsLineEnd(char32_t codePoint) noexcept {
+  return codePoint == '\n' || codePoint == '\r' || codePoint == 0x2028 || codePoint == 0x2029;
+}
+
 size_t CodePointCount(std::span<const uint16_t> units) noexcept {
   size_t count = 0;
-  for (size_t at = 0; at<units.size(); at += CodePointAt(units, at)> 0xFFFF ? 2 : 1) ++count;
+  for (size_t at = 0; at < units.size(); ++count) at += UnitCount(CodePointAt(units, at));
   return count;
 }
 

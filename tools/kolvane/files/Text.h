@@ -17,6 +17,8 @@ std::vector<uint16_t> ToUTF16(std::string_view text);
 std::string ToMultiByte(std::span<const uint16_t> units, const int* selector);
 std::vector<uint16_t> FromMultiByte(std::string_view text, const int* selector);
 
+inline constexpr std::string_view kUTF8Mark = "\xEF\xBB\xBF";
+
 // The place of the first byte that belongs to no character.
 std::optional<size_t> MalformedUTF8At(std::string_view text);
 bool IsValidUTF8(std::string_view text);
@@ -32,6 +34,15 @@ std::string KeyText(std::string_view key);
 
 // The code point that begins at a unit of the text; an unpaired surrogate is one of its own.
 char32_t CodePointAt(std::span<const uint16_t> units, size_t at) noexcept;
+
+// Whether it is one half of a pair, without the other.
+bool IsSurrogate(char32_t codePoint) noexcept;
+
+// The units that a code point takes.
+size_t UnitCount(char32_t codePoint) noexcept;
+
+// Ends a line of UTF-16, alone or as a part of CR LF.
+bool IsLineEnd(char32_t codePoint) noexcept;
 
 // Pairs of surrogates count once.
 size_t CodePointCount(std::span<const uint16_t> units) noexcept;

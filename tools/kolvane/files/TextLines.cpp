@@ -1,5 +1,7 @@
 #include "TextLines.h"
 
+#include "Text.h"
+
 LineCounter::LineCounter(std::string_view textImage, TextEncoding encoding) noexcept
     : image(textImage),
       unitSize(encoding == TextEncoding::kCodePage ? 1 : 2),
@@ -12,9 +14,8 @@ uint32_t LineCounter::UnitAt(size_t at) const noexcept {
 }
 
 void LineCounter::Pass(uint32_t unit) noexcept {
-  const bool separator = unitSize == 2 && (unit == 0x2028 || unit == 0x2029);
   const bool afterReturn = unit == '\n' && before == '\r';
-  const bool endsLine = unit == '\n' || unit == '\r' || separator;
+  const bool endsLine = IsLineEnd(unit);
   const bool isMark = unitSize == 2 && position == 0;
   const bool isSecondHalf = unitSize == 2 && unit >= 0xDC00 && unit < 0xE000;
   if (endsLine && !afterReturn) ++line;

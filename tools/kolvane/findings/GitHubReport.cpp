@@ -1,7 +1,5 @@
 #include <fmt/format.h>
 
-#include <cstring>
-
 #include "Messages.h"
 #include "PlaceText.h"
 #include "Reports.h"
@@ -21,24 +19,15 @@ const char* CommandOf(Severity severity) noexcept {
   return "notice";
 }
 
-std::string Escaped(std::string_view text, const char* special) {
-  std::string escaped;
-  for (const char character : text) {
-    if (character != '\0' && std::strchr(special, character) != nullptr) {
-      escaped += fmt::format("%{:02X}", static_cast<unsigned char>(character));
-    } else {
-      escaped += character;
-    }
-  }
-  return escaped;
-}
-
 std::string EscapedMessage(std::string_view text) {
-  return Escaped(text, "%\r\n");
+  return PercentEncoded(text,
+                        [](char each) { return each == '%' || each == '\r' || each == '\n'; });
 }
 
 std::string EscapedProperty(std::string_view text) {
-  return Escaped(text, "%\r\n:,");
+  return PercentEncoded(text, [](char each) {
+    return each == '%' || each == '\r' || each == '\n' || each == ':' || each == ',';
+  });
 }
 
 // A place in a binary image has no property, and stands in the message.

@@ -25,3 +25,15 @@ std::string PortableName(const std::string& file) {
   while (name.starts_with("./") && name.size() > 2) name.erase(0, 2);
   return name;
 }
+
+std::string PercentEncoded(std::string_view text, bool (*isSpecial)(char)) {
+  std::string encoded;
+  for (const char character : text) {
+    if (isSpecial(character)) {
+      encoded += fmt::format("%{:02X}", static_cast<unsigned char>(character));
+    } else {
+      encoded += character;
+    }
+  }
+  return encoded;
+}

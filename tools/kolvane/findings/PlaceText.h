@@ -3,6 +3,7 @@
 
 #include <filesystem>
 #include <string>
+#include <string_view>
 
 #include "Finding.h"
 
@@ -18,3 +19,6 @@ inline constexpr bool kHasDrives = std::filesystem::path::preferred_separator ==
 // The file's name with slashes between its folders and without `./` at its start, so that one file
 // has one name on all machines.
 std::string PortableName(const std::string& file);
+
+// The text with each byte that is special written as `%` and two hexadecimal digits.
+std::string PercentEncoded(std::string_view text, bool (*isSpecial)(char));

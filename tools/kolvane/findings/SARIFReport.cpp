@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cctype>
-#include <cstring>
 #include <nlohmann/json.hpp>
 
 #include "JSONOutput.h"
@@ -37,29 +36,21 @@ JSON MessageObject(std::string_view text) {
   return {{"text", escaped}};
 }
 
-bool StandsForItself(char character) noexcept {
-  return std::isalnum(static_cast<unsigned char>(character)) != 0 ||
-         (character != '\0' && std::strchr("-._~/", character) != nullptr);
+bool IsSpecial(char character) noexcept {
+  return std::isalnum(static_cast<unsigned char>(character)) == 0 &&
+         std::string_view("-._~/").find(character) == std::string_view::npos;
 }
 
-std::string PercentEncoded(std::string_view text) {
-  std::string encoded;
-  for (const char character : text) {
-    if (StandsForItself(character)) {
-      encoded += character;
-    } else {
-      encoded += fmt::format("%{:02X}", static_cast<unsigned char>(character));
-    }
-  }
-  return encoded;
+std::string EscapedName(std::string_view name) {
+  return PercentEncoded(name, IsSpecial);
 }
 
 // A relative reference, or a URI where the file is named by its whole path.
 std::string URIOf(const std::string& file) {
   const std::string name = PortableName(file);
   const bool hasDrive = kHasDrives && name.size() > 2 && name[1] == ':';
-  if (hasDrive) return fmt::format("file:///{}:{}", name.front(), PercentEncoded(name.substr(2)));
-  return (name.starts_with('/') ? "file://" : "") + PercentEncoded(name);
+  if (hasDrive) return fmt::format("file:///{}:{}", name.front(), EscapedName(name.substr(2)));
+  return (name.starts_with('/') ? "file://" : "") + EscapedName(name);
 }
 
 // Who shows results demands all three texts.
