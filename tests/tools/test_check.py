@@ -6,11 +6,11 @@ import pathlib
 import re
 import subprocess
 import sys
-import tempfile
 import unicodedata
 import unittest
 
-KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
+from command import KOLVANE, PAD, CommandTest
+
 SAMPLES = pathlib.Path(sys.argv.pop(1)).absolute()
 DROPPED = '"$/dropped=x"\n'
 ESCAPE = '"$$$/escape=^q"\n'
@@ -32,25 +32,15 @@ def fingerprint(*parts):
     return f"{value:016x}"
 
 
-class Check(unittest.TestCase):
-    maxDiff = None
-
-    def setUp(self):
-        folder = tempfile.TemporaryDirectory()
-        self.addCleanup(folder.cleanup)
-        self.folder = pathlib.Path(folder.name)
-
+class Check(CommandTest):
     def file(self, content, name="d.txt"):
-        content = content if isinstance(content, bytes) else f"\ufeff{content}{30 * chr(10)}".encode("utf-16-le")
-        (self.folder / name).write_bytes(content)
-        return name
+        return super().file(content if isinstance(content, bytes) else ("\ufeff" + content + PAD.decode()).encode("utf-16-le"), name)
 
     def check(self, *arguments, stdout=subprocess.PIPE, stdin=b"", **environment):
         """Returns the status, standard output and standard error."""
         clean = {name: value for name, value in os.environ.items() if name not in ("NO_COLOR", "CLICOLOR_FORCE")}
-        done = subprocess.run([*KOLVANE, "check", *arguments], cwd=self.folder, input=stdin, stdout=stdout,
-                              stderr=subprocess.PIPE, timeout=60, env={**clean, **environment})
-        return done.returncode, (done.stdout or b"").decode(), done.stderr.decode()
+        status, output, errors = self.run_kolvane("check", *arguments, stdout=stdout, stdin=stdin, env={**clean, **environment})
+        return status, output.decode(), errors
 
     def findings(self, *arguments):
         return json.loads(self.check("--format=json", *arguments)[1])["findings"]

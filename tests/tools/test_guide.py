@@ -1,15 +1,14 @@
 """Runs what the guide for authors of dictionaries shows: test_guide.py COMMAND GUIDE."""
 
-import os
 import pathlib
 import re
 import shutil
 import subprocess
 import sys
-import tempfile
 import unittest
 
-KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
+from command import KOLVANE, CommandTest
+
 GUIDE = pathlib.Path(sys.argv.pop(1)).read_text(encoding="utf-8")
 BLOCKS = re.findall(r"^```(\w+)(?: file=(\S+))?\n(.*?)^```$", GUIDE, re.M | re.S)
 ROWS = [[cell.strip() for cell in re.split(r"(?<!\\)\|", row)[1:-1]] for row in re.findall(r"^\|.*\|$", GUIDE, re.M)]
@@ -19,14 +18,9 @@ def code(cell):
     return re.findall(r"`([^`]+)`", cell)
 
 
-class Guide(unittest.TestCase):
-    def setUp(self):
-        folder = tempfile.TemporaryDirectory()
-        self.addCleanup(folder.cleanup)
-        self.folder = pathlib.Path(folder.name)
-
-    def run_kolvane(self, *arguments):
-        return subprocess.run([*KOLVANE, *arguments], cwd=self.folder, capture_output=True, timeout=60).stdout.decode()
+class Guide(CommandTest):
+    def output_of(self, *arguments):
+        return self.run_kolvane(*arguments)[1].decode()
 
     @unittest.skipUnless(shutil.which("bash"), "no shell")
     def test_console(self):
@@ -47,12 +41,12 @@ class Guide(unittest.TestCase):
         pairs = [(code(written)[0], character) for row in ROWS for written, character in zip(row[::2], row[1::2])
                  if character.startswith("U+")]
         self.assertEqual(len(pairs), 17 + 6 + 132)
-        answers = self.run_kolvane("translate", "--nul", *("=" + written for written, _ in pairs)).split("\0")
+        answers = self.output_of("translate", "--nul", *("=" + written for written, _ in pairs)).split("\0")
         for (written, character), answer in zip(pairs, answers):
             self.assertEqual(" ".join(f"U+{ord(each):04X}" for each in answer), character, written)
 
     def test_traps(self):
-        listed = {line.split()[0] for line in self.run_kolvane("check", "--list-rules").splitlines()}
+        listed = {line.split()[0] for line in self.output_of("check", "--list-rules").splitlines()}
         rules = [(code(row[0])[0], row[1:]) for row in ROWS if row[0].startswith("`") and code(row[0])[0] in listed]
         self.assertEqual(sorted(rule for rule, _ in rules), sorted(listed))
         for rule, cells in rules:
@@ -66,7 +60,7 @@ class Guide(unittest.TestCase):
                 self.write("r", [])
                 self.write("d", examples[0] if rule == "mark-in-key" else ["", *examples[0]])
             reference = ["--reference", "r"] if len(examples) == 2 else []
-            found = self.run_kolvane("check", "--no-snippet", "--info", "d", *reference)
+            found = self.output_of("check", "--no-snippet", "--info", "d", *reference)
             self.assertIn(f"[{rule}]", found)
             self.assertEqual(found.count("["), 1, found)
 

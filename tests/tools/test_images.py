@@ -3,37 +3,20 @@
 import json
 import os
 import pathlib
-import subprocess
 import sys
-import tempfile
 import unittest
 
-KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
+from command import KOLVANE, PAD, CommandTest
+
 SAMPLES = pathlib.Path(sys.argv.pop(1)).resolve()
 ISO_CODES = pathlib.Path(sys.argv.pop(1)).resolve()
-PAD = b"\n" * 30
 
 
-class Images(unittest.TestCase):
-    def setUp(self):
-        folder = tempfile.TemporaryDirectory()
-        self.addCleanup(folder.cleanup)
-        self.folder = pathlib.Path(folder.name)
-
-    def run_kolvane(self, *arguments, stdin=b"", **options):
-        """Returns the status, standard output and standard error."""
-        done = subprocess.run([*KOLVANE, *map(str, arguments)], input=stdin, cwd=self.folder, timeout=60, stderr=subprocess.PIPE,
-                              stdout=options.pop("stdout", subprocess.PIPE), **options)
-        return done.returncode, done.stdout or b"", done.stderr.decode()
-
+class Images(CommandTest):
     def good(self, *arguments, **options):
         status, output, errors = self.run_kolvane(*arguments, **options)
         self.assertEqual((status, errors), (0, ""), arguments)
         return output
-
-    def file(self, name, content):
-        self.folder.joinpath(name).write_bytes(content)
-        return name
 
     def bytes_of(self, name):
         return self.folder.joinpath(name).read_bytes()
@@ -44,7 +27,7 @@ class Images(unittest.TestCase):
                 with self.subTest(path.name, options=options):
                     self.good("compile", path, "-o", "one", *options)
                     for source, how in [("one", []), ("one", ["--utf-16"]), (path, ["--sort"])]:
-                        self.file("text", self.good("dump", source, *how))
+                        self.file(name="text", content=self.good("dump", source, *how))
                         self.good("compile", "text", "-o", "two", *options)
                         self.assertEqual(self.bytes_of("one"), self.bytes_of("two"))
                     keys = b"".join(b"$$$" + entry["key"].encode() + b"=?\0"
@@ -53,11 +36,11 @@ class Images(unittest.TestCase):
                                      self.good("translate", "--nul", "--dictionary", path, stdin=keys))
 
     def test_inputs_merge_as_loads_do(self):
-        self.file("a", b'"/k=one"\n"/a=first"' + PAD)
-        self.file("b", b'"/k=two"\n"/k=last"\n"/b=second"' + PAD)
+        self.file(name="a", content=b'"/k=one"\n"/a=first"' + PAD)
+        self.file(name="b", content=b'"/k=two"\n"/k=last"\n"/b=second"' + PAD)
         self.good("compile", "a", "b", "-o", "ab")
         self.assertEqual(self.good("dump", "--sort", "ab"), b'"$$$/a=first"\n"$$$/b=second"\n"$$$/k=last"\n')
-        self.file("both", self.bytes_of("b").strip() + b"\n" + self.bytes_of("a"))
+        self.file(name="both", content=self.bytes_of("b").strip() + b"\n" + self.bytes_of("a"))
         self.assertEqual(self.good("dump", "both"), b'"$$$/k=one"\n"$$$/b=second"\n"$$$/a=first"\n')
         self.assertEqual(self.good("compile", "ab", "-", "-o", "-", stdin=self.bytes_of("a")),
                          self.good("compile", "b", "a", "-o", "-"))
@@ -76,7 +59,7 @@ class Images(unittest.TestCase):
             self.assertEqual(self.run_kolvane("compile", "-", "-o", "-", stdin=text)[1], image)
 
     def test_an_equal_image_is_left_alone(self):
-        self.file("a", b'"/k=one"' + PAD)
+        self.file(name="a", content=b'"/k=one"' + PAD)
         self.good("compile", "a", "-o", "out")
         os.utime(self.folder / "out", (1, 1))
         self.good("compile", "a", "-o", "out")
@@ -87,7 +70,7 @@ class Images(unittest.TestCase):
 
     @unittest.skipIf(len(KOLVANE) > 1, "links are the host's, and the emulator's files have no permissions")
     def test_links_and_permissions_stay(self):
-        self.file("a", b'"/k=one"' + PAD)
+        self.file(name="a", content=b'"/k=one"' + PAD)
         self.folder.joinpath("old").touch(0o640)
         for name in ["old", "new"]:
             self.folder.joinpath("to-" + name).symlink_to(name)
@@ -100,10 +83,10 @@ class Images(unittest.TestCase):
         self.assertEqual(sorted(path.name for path in self.folder.iterdir()), ["a", "loop", "new", "old", "to-new", "to-old"])
 
     def test_nothing_is_written_where_something_would_be_lost(self):
-        self.file("polish", '"/k=Żółć"\n"/a=ok"'.encode() + PAD)
-        self.file("half", '\ufeff"/k=a\ud800b"'.encode("utf-16-le", "surrogatepass") + PAD)
+        self.file(name="polish", content='"/k=Żółć"\n"/a=ok"'.encode() + PAD)
+        self.file(name="half", content='\ufeff"/k=a\ud800b"'.encode("utf-16-le", "surrogatepass") + PAD)
         image = self.good("compile", "polish", "-o", "-")
-        self.file("cut", image[:-1])
+        self.file(name="cut", content=image[:-1])
         for arguments, message in [(["polish", "--values", "code-page"], "'/k': its translation holds U+017B, which the code page cannot carry"),
                                    (["half", "--values", "utf-8"], "'/k': its translation holds U+D800, which UTF-8 cannot carry"),
                                    (["missing", "cut"], "cut: warning: the image is cut short"), (["polish", "missing"], "missing: No such file")]:
@@ -122,7 +105,7 @@ class Images(unittest.TestCase):
         lengths = b"".join(len(part).to_bytes(4, "little") for pair in zip(keys, data) for part in pair)
         buckets = b"".join((47 * 32 + key[1]).__mod__(1021).to_bytes(2, "little") for key in keys)
         counts = b"".join((2 * i + 2).to_bytes(4, "little") for i in range(len(keys)))
-        self.file("image", b"Kolvane Binary Format\1\5\0" + len(keys).to_bytes(4, "little") + counts + lengths + buckets
+        self.file(name="image", content=b"Kolvane Binary Format\1\5\0" + len(keys).to_bytes(4, "little") + counts + lengths + buckets
                   + b"".join(key + value for key, value in zip(keys, data)))
         status, output, errors = self.run_kolvane("dump", "image")
         self.assertEqual(status, 1)
@@ -130,7 +113,7 @@ class Images(unittest.TestCase):
         self.assertEqual([line[len("kolvane: image: '/"):][0] for line in errors.splitlines()], ["3", "4", "5", "6"])
         self.assertEqual(self.run_kolvane("dump", "--utf-16", "image")[2].count("\n"), 3)
         self.assertEqual(len(json.loads(self.good("dump", "--json", "image"))["entries"]), len(keys))
-        self.file("cut", self.bytes_of("image")[:-4])
+        self.file(name="cut", content=self.bytes_of("image")[:-4])
         self.assertEqual(self.run_kolvane("dump", "--json", "cut")[0], 1)
 
     def test_convert_changes_the_encoding_alone(self):
@@ -139,7 +122,7 @@ class Images(unittest.TestCase):
                  "utf-16be": b"\xfe\xff" + text.encode("utf-16-be"), "code-page": text.encode("cp1252")}
         for source, content in forms.items():
             for target, expected in forms.items():
-                self.file("in", content)
+                self.file(name="in", content=content)
                 self.good("convert", "in", "-o", "out", "--to", target)
                 self.assertEqual(self.bytes_of("out"), expected, (source, target))
 
@@ -154,7 +137,7 @@ class Images(unittest.TestCase):
                 ('\ufeffÿþ'.encode("utf-16-le"), ["--to", "code-page"], "in:1:1: nothing was written, for without a byte-order mark"),
                 ("\ufeffKolvane Binary Format".encode(), ["--to", "utf-8"], "would be taken for a binary dictionary\n"),
                 (image, ["--to", "utf-8"], "in: a binary dictionary has no encoding to change")]:
-            status, output, errors = self.run_kolvane("convert", self.file("in", content), "-o", "out", *options)
+            status, output, errors = self.run_kolvane("convert", self.file(name="in", content=content), "-o", "out", *options)
             self.assertEqual((status, output), (2, b""))
             self.assertIn(message, errors)
             self.assertFalse(self.folder.joinpath("out").exists())
@@ -173,7 +156,7 @@ class Images(unittest.TestCase):
 
     @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
     def test_output_that_cannot_be_written(self):
-        self.file("in", b'"/a=b"\n"/a=\xe9^x"' + PAD)
+        self.file(name="in", content=b'"/a=b"\n"/a=\xe9^x"' + PAD)
         for command in self.COMMANDS:
             with open("/dev/full", "wb") as full:
                 status, _, errors = self.run_kolvane(*command, "in", stdout=full)
@@ -186,7 +169,7 @@ class Images(unittest.TestCase):
             with os.fdopen(writing, "wb") as closed:
                 status, _, errors = self.run_kolvane(*command, "in", stdout=closed, restore_signals=False)
             self.assertEqual((status, "write" in errors), (2, False), command)
-        self.file("large", b'"/a=' + b"x" * 100000)
+        self.file(name="large", content=b'"/a=' + b"x" * 100000)
         for source, name in [("in", "/dev/full"), ("large", "/dev/full"), ("in", "no-folder/out")]:
             status, output, errors = self.run_kolvane("compile", source, "-o", name)
             self.assertEqual((status, output), (2, b""))

@@ -1,42 +1,12 @@
 """One bad dictionary for each rule of `kolvane check`, and what is said of it: test_rules.py COMMAND."""
 
-import os
-import pathlib
-import struct
-import subprocess
-import sys
-import tempfile
 import unittest
 
-KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
-SAME = "/same/bucket/12"  # with another last character in the same bucket
-PAD = "\n" * 30  # no file is too short for its lines
+from command import PAD, CommandTest, image
 
 
 def utf16(text):
-    return ("\ufeff" + text + PAD).encode("utf-16-le", "surrogatepass")
-
-
-def image(groups, encoding=0, minor=5):
-    """A binary image of groups: (bucket, [(key, value bytes)...])."""
-    head = b"Kolvane Binary Format" + bytes([1, minor, encoding])
-    entries = [entry for _, group in groups for entry in group]
-    if minor == 5:
-        counts, total = b"", 0
-        for _, group in groups:
-            total += 2 * len(group)
-            counts += struct.pack("<I", total)
-        return (head + struct.pack("<I", len(groups)) + counts
-                + b"".join(struct.pack("<II", len(key), len(value)) for key, value in entries)
-                + b"".join(struct.pack("<H", bucket) for bucket, _ in groups)
-                + b"".join(key + value for key, value in entries))
-    records, data = b"", b""
-    start = len(head) + 2 + 6 * (len(groups) + 1)
-    for bucket, group in groups:
-        records += struct.pack("<HI", bucket, start + len(data))
-        for key, value in group:
-            data += struct.pack("<I", len(key)) + key + struct.pack("<I", len(value)) + value
-    return head + struct.pack("<H", len(groups) + 1) + records + struct.pack("<HI", 0, start + len(data)) + data
+    return ("\ufeff" + text + PAD.decode()).encode("utf-16-le", "surrogatepass")
 
 
 HI = "Hi".encode("utf-16-le")
@@ -45,16 +15,16 @@ ONE = image([(580, [(b"/a", HI)])])
 # Rule, dictionary, and its findings without the file's name; then, where there is one, the reference.
 CASES = [
     ("too-short", b'"$$$/a=b"\n', ["error: a file with fewer than 21 bytes, its byte-order mark not counted, is ignored"]),
-    ("zero-character", b'"$$$/a=b"\0' + PAD.encode(), ["1:10: error: a zero character ends the line here"]),
+    ("zero-character", b'"$$$/a=b"\0' + PAD, ["1:10: error: a zero character ends the line here"]),
     ("zero-character", b'"$$$/a=some text"\n\n\0"$$$/b=c"', ["3:1: error: a zero character at the start of the line ends the file for a translator"]),
     ("utf-16-without-mark", '"$$$/a=some text"\n'.encode("utf-16-le"), ["error: this is UTF-16 without its byte-order mark, which is read in the code page"]),
     ("utf-16-without-mark", '"$$$/a=some text"\n'.encode("utf-16-be"), ["error: this is UTF-16 without its byte-order mark, which is read in the code page"]),
-    ("utf-8-as-code-page", '"$$$/a=Größe"'.encode() + PAD.encode(), ["warning: this is UTF-8, which is read in the code page when it is loaded as it is"]),
+    ("utf-8-as-code-page", '"$$$/a=Größe"'.encode() + PAD, ["warning: this is UTF-8, which is read in the code page when it is loaded as it is"]),
     ("malformed-input", utf16('"$$$/a=\ud800b😀"'), ["1:8: error: U+D800 is half of a character"]),
     ("malformed-input", utf16('"$$$/a=b"') + b"\n", ["error: the file ends in half of a character"]),
     ("malformed-input", '"$$$/a=ä"\n"$$$/b=ö"\n"$$$/d=Ё"\n"$$$/c=é'.encode() + b"\xff\"\n",
      ["4:9: error: a byte here is no UTF-8, so that the whole file is read in the code page"]),
-    ("malformed-input", b'"$$$/a=b \x81"' + PAD.encode(), ["1:10: error: a byte here is no character of the code page"]),
+    ("malformed-input", b'"$$$/a=b \x81"' + PAD, ["1:10: error: a byte here is no character of the code page"]),
     ("malformed-input", image([(580, [(b"/a", b"a\0\0\xd8")])]), ["entry 1, byte 46: error: U+D800 in the value is half of a character"]),
     ("malformed-input", image([(580, [(b"/a", b"a\xff")])], 1, 0), ["entry 1, byte 49: error: a byte of the value is no UTF-8"]),
     ("dropped-line", utf16('"$$/a=b"'), ["1:2: error: the line is dropped: '$$$' is due, or no '$'"]),
@@ -121,26 +91,17 @@ TRANSLATIONS = [
 ]
 
 
-class Rules(unittest.TestCase):
-    def setUp(self):
-        folder = tempfile.TemporaryDirectory()
-        self.addCleanup(folder.cleanup)
-        self.folder = pathlib.Path(folder.name)
-
+class Rules(CommandTest):
     def check(self, *options):
-        done = subprocess.run([*KOLVANE, "check", "--no-snippet", "-q", "--info", *options], cwd=self.folder, timeout=60,
-                              capture_output=True)
-        self.assertEqual(done.stderr, b"")
-        return done.returncode, done.stdout.decode().splitlines()
-
-    def file(self, name, content):
-        self.folder.joinpath(name).write_bytes(content)
+        status, output, errors = self.run_kolvane("check", "--no-snippet", "-q", "--info", *options)
+        self.assertEqual(errors, "")
+        return status, output.decode().splitlines()
 
     def test_each_rule(self):
         for rule, content, expected, *reference in CASES:
             with self.subTest(rule, expected=expected):
-                self.file("d", content)
-                self.file("r", utf16("\n" + reference[0]) if reference else b"")
+                self.file(name="d", content=content)
+                self.file(name="r", content=utf16("\n" + reference[0]) if reference else b"")
                 status, lines = self.check("d", *(["--reference", "r"] if reference else []))
                 named = [line for line in lines if f" [{rule}]" in line or ": note: " in line]
                 self.assertEqual([line.replace(f" [{rule}]", "").partition(":")[2].strip() for line in named], expected)
@@ -150,8 +111,8 @@ class Rules(unittest.TestCase):
     def test_each_rule_beside_a_reference(self):
         for rule, reference, translation, severity in TRANSLATIONS:
             with self.subTest(rule):
-                self.file("d", utf16(f'"$$$/a={translation}"'))
-                self.file("r", utf16(f'"$$$/a={reference}"'))
+                self.file(name="d", content=utf16(f'"$$$/a={translation}"'))
+                self.file(name="r", content=utf16(f'"$$$/a={reference}"'))
                 status, lines = self.check("d", "--reference", "r")
                 self.assertRegex(lines[0], rf"^d:1:2: {severity}: .* \[{rule}\]$")
                 self.assertEqual(lines[1:], ["r:1:2: note: the reference is here"])
@@ -159,17 +120,17 @@ class Rules(unittest.TestCase):
 
     def test_across_files(self):
         for name in "ab":
-            self.file(name, utf16(f'"$$$/{name}=x"\n"$$$/both=x"'))
+            self.file(name=name, content=utf16(f'"$$$/{name}=x"\n"$$$/both=x"'))
         self.assertEqual(self.check("a", "b")[1], ["b:2:2: info: key '/both' is defined in another file too [duplicate-across-files]",
                                                    "a:2:2: note: defined here"])
 
     def test_columns_behind_a_zero_character(self):
         for content in [b'\n"$$$/a=\xe9b"\0"$$$/c=^x"', '\ufeff\n"$$$/a=😀b"\0"$$$/c=^x"'.encode("utf-16-be")]:
-            self.file("d", content)
+            self.file(name="d", content=content)
             self.assertEqual([line.split(" ")[0] for line in self.check("d")[1]], ["d:2:11:", "d:2:19:"])
 
     def test_another_encoding_than_the_files(self):
-        self.file("d", utf16('"$$$/a=b"'))
+        self.file(name="d", content=utf16('"$$$/a=b"'))
         self.assertEqual(self.check("--encoding=utf-8", "d"), (1, ["d: error: this is UTF-16, not UTF-8 [malformed-input]"]))
 
     def test_every_rule_has_its_dictionary(self):
@@ -177,11 +138,11 @@ class Rules(unittest.TestCase):
         self.assertEqual(sorted(listed), sorted({case[0] for case in CASES + TRANSLATIONS} | {"duplicate-across-files"}))
 
     def test_nothing_to_find(self):
-        self.file("d", utf16('"$$$/a=^[Open^] \\"it\\" #{nbsp}100%"\r\n\r\n$$$/b=x=y\n  "/c=C:\\\\'))
-        self.file("e", image([(580, [(b"/a", HI)])], minor=0))
-        self.file("g", b'"$$$/a=\xc3\xa9"\n"$$$/b=\xe9"\n"$$$/c=\xe8"')
-        self.file("h", '"$$$/a=\\b\x85"'.encode() + PAD.encode())
-        self.file("f", '\ufeff"$$$/d=long enough"\0'.encode("utf-16-le"))
+        self.file(name="d", content=utf16('"$$$/a=^[Open^] \\"it\\" #{nbsp}100%"\r\n\r\n$$$/b=x=y\n  "/c=C:\\\\'))
+        self.file(name="e", content=image([(580, [(b"/a", HI)])], minor=0))
+        self.file(name="g", content=b'"$$$/a=\xc3\xa9"\n"$$$/b=\xe9"\n"$$$/c=\xe8"')
+        self.file(name="h", content='"$$$/a=\\b\x85"'.encode() + PAD)
+        self.file(name="f", content='\ufeff"$$$/d=long enough"\0'.encode("utf-16-le"))
         self.assertEqual(self.check("d", "e", "f", "g", "h", "--disable=utf-8-as-code-page", "--disable", "duplicate-across-files"), (0, []))
 
 

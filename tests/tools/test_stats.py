@@ -6,25 +6,17 @@ import io
 import json
 import os
 import pathlib
-import struct
 import subprocess
 import sys
-import tempfile
 import unittest
 
-KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1), "stats"]
-SAMPLES = pathlib.Path(sys.argv.pop(1))
-PADDING = "\n" * 25  # too short a file is no dictionary
+from command import KOLVANE, PAD, CommandTest, image
 
-
-def stats(*arguments, stdin=b"", stdout=subprocess.PIPE):
-    """Returns the status, standard output and standard error."""
-    done = subprocess.run([*KOLVANE, *map(str, arguments)], input=stdin, stdout=stdout, stderr=subprocess.PIPE, timeout=60)
-    return done.returncode, (done.stdout or b"").decode(), done.stderr.decode()
+SAMPLES = pathlib.Path(sys.argv.pop(1)).absolute()
 
 
 def text(**values):
-    return ("\ufeff" + "".join(f'"$$$/{key}={value}"\n' for key, value in values.items()) + PADDING).encode()
+    return ("\ufeff" + "".join(f'"$$$/{key}={value}"\n' for key, value in values.items())).encode() + PAD
 
 
 class Page(html.parser.HTMLParser):
@@ -57,19 +49,17 @@ class Page(html.parser.HTMLParser):
             self.rows[-1].append(data)
 
 
-class Stats(unittest.TestCase):
-    def setUp(self):
-        folder = tempfile.TemporaryDirectory()
-        self.addCleanup(folder.cleanup)
-        self.folder = pathlib.Path(folder.name)
-
+class Stats(CommandTest):
     def file(self, content, name="d.txt"):
-        path = self.folder / name
-        path.write_bytes(content)
-        return path
+        return self.folder / super().file(content, name)
+
+    def stats(self, *arguments, **options):
+        """Returns the status, standard output and standard error."""
+        status, output, errors = self.run_kolvane("stats", *arguments, **options)
+        return status, output.decode(), errors
 
     def figures(self, *arguments, status=0):
-        done = stats("--format", "json", *arguments)
+        done = self.stats("--format", "json", *arguments)
         self.assertEqual(done[0], status, done[2])
         return json.loads(done[1])["files"]
 
@@ -99,23 +89,21 @@ class Stats(unittest.TestCase):
         spread = list(self.figures(self.file(text(**keys)))[0].values())[3:]
         self.assertEqual((len(keys), spread), (4, [2, 3, 1.75]))
         # Of a key's two entries the second is never found, and the first entry has no business in this bucket.
-        image = (b"Kolvane Binary Format\1\5\1" + struct.pack("<8I", 1, 6, 2, 1, 2, 1, 2, 1) + struct.pack("<H", 580)
-                 + b"/bx" + b"/ay" + b"/az")
-        path = self.file(image)
+        path = self.file(image([(580, [(b"/b", b"x"), (b"/a", b"y"), (b"/a", b"z")])], 1))
         self.assertEqual(list(self.figures(path, status=1)[0].values())[1:], [1, 1, 1, 3, 2.0])
-        self.assertIn("warning: byte 58: the image is damaged, a key is filed where it is never found", stats(path)[2])
+        self.assertIn("warning: byte 58: the image is damaged, a key is filed where it is never found", self.stats(path)[2])
 
     def test_every_format_has_the_same_numbers(self):
-        name = 'a,"b" <&>.txt' if os.name != "nt" and len(KOLVANE) == 2 else "a,'b' &.txt"
+        name = 'a,"b" <&>.txt' if os.name != "nt" and len(KOLVANE) == 1 else "a,'b' &.txt"
         reference = self.file(text(a="A", b="B", c="C"), "r.txt")
         arguments = ["--reference", reference, self.file(text(a="Ä", b="B", d="D"), name), SAMPLES / "it.bin"]
         files = self.figures(*arguments)
         self.assertEqual(list(files[0].values())[1:], [3, 3, 1, 1, 1, 1, 33.3, 3, 1, 1.0])
-        rows = list(csv.DictReader(io.StringIO(stats("--format", "csv", *arguments)[1])))
+        rows = list(csv.DictReader(io.StringIO(self.stats("--format", "csv", *arguments)[1])))
         self.assertEqual(rows, [{key: f"{value:.2f}" if key == "meanSteps" else str(value) for key, value in file.items()}
                                 for file in files])
-        page = Page(stats("--format", "html", *arguments)[1])
-        table = stats(*arguments)[1].splitlines()
+        page = Page(self.stats("--format", "html", *arguments)[1])
+        table = self.stats(*arguments)[1].splitlines()
         self.assertEqual(table[0], f"compared with {reference}, 3 keys")
         self.assertEqual(len(set(map(len, table[2:]))), 1)
         for row, line, shown in zip(rows, table[3:], page.rows[1:], strict=True):
@@ -126,42 +114,42 @@ class Stats(unittest.TestCase):
             self.assertEqual([cell for cell in shown if cell.strip()], [
                 row["file"], row["translatedPercent"] + " %", *map(row.get, ["translated", "identical", "missing", "extra", "keys", "words"])])
             self.assertIn("{usedBuckets} in use, the fullest with {longestChain}; {meanSteps} steps to a key".format(**row), page.texts)
-        self.assertEqual(stats(reference)[1].split(), ["file", "keys", "words", "buckets", "longest", "steps",
+        self.assertEqual(self.stats(reference)[1].split(), ["file", "keys", "words", "buckets", "longest", "steps",
                                                        str(reference), "3", "3", "3", "1", "1.00"])
-        self.assertEqual(Page(stats("--format", "html", reference)[1]).rows[1], [str(reference), "3", "3"])
+        self.assertEqual(Page(self.stats("--format", "html", reference)[1]).rows[1], [str(reference), "3", "3"])
 
     def test_fail_under(self):
         reference = self.file(text(a="A", b="B", c="C"), "r.txt")
         path = self.file(text(a="Ä", b="Ö", c="C"))
         for percent, status in [("66.6", 0), ("66.666666", 0), ("66.666667", 1), ("67", 1), ("100", 1), ("0", 0)]:
-            self.assertEqual(stats("--reference", reference, "--fail-under", percent, path)[0], status, percent)
+            self.assertEqual(self.stats("--reference", reference, "--fail-under", percent, path)[0], status, percent)
         self.assertIn(f"{path}: 66.6 % is translated, less than 67 %",
-                      stats("--reference", reference, path, reference, "--fail-under=67")[2])
+                      self.stats("--reference", reference, path, reference, "--fail-under=67")[2])
         for wrong in [["--fail-under", "5", path], ["--reference", path, "--fail-under", "100.1", path, path], [],
                       ["--reference", reference, reference], ["--reference", "-", "-"], ["--format", "xml", path],
                       ["--reference", reference, "--fail-under", "nan", path], ["--reference", "", path, "-", "-"]]:
-            status, output, errors = stats(*wrong)
+            status, output, errors = self.stats(*wrong)
             self.assertEqual((status, output), (2, ""), wrong)
             self.assertIn("try 'kolvane stats --help'", errors)
 
     def test_files_that_are_not_as_they_should_be(self):
         path, reference = self.file(text(a="x")), self.file(text(b="y"), "r.txt")
         cut = self.file((SAMPLES / "it.bin").read_bytes()[:1500], "cut.bin")
-        status, output, errors = stats(path, "missing", cut, "-", stdin=path.read_bytes())
+        status, output, errors = self.stats(path, "missing", cut, "-", stdin=path.read_bytes())
         self.assertEqual((status, [line.split()[0] for line in output.splitlines()]), (2, ["file", str(path), str(cut), "-"]))
         self.assertRegex(errors, r"^kolvane: missing: No such file.*\nkolvane: .*cut.bin: warning: the image is cut short: .*\n$")
-        for other, status in [(cut, 1), ("missing", 2), (self.file(PADDING.encode(), "no-keys"), 2), (reference, 0)]:
-            self.assertEqual(stats("--reference", other, path)[0], status, other)
+        for other, status in [(cut, 1), ("missing", 2), (self.file(PAD, "no-keys"), 2), (reference, 0)]:
+            self.assertEqual(self.stats("--reference", other, path)[0], status, other)
 
     @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
     def test_output_that_cannot_be_written(self):
         path = self.file(text(a="x"))
         with open("/dev/full", "wb") as full:
-            self.assertEqual(stats(path, "--format", "html", stdout=full)[0], 2)
+            self.assertEqual(self.stats(path, "--format", "html", stdout=full)[0], 2)
         ours, theirs = os.pipe()
         os.close(ours)
         with open(theirs, "wb") as closed:
-            done = subprocess.run([*KOLVANE, path, "--format=html"], stdout=closed, stderr=subprocess.PIPE, timeout=60,
+            done = subprocess.run([*KOLVANE, "stats", path, "--format=html"], stdout=closed, stderr=subprocess.PIPE, timeout=60,
                                   restore_signals=False)
         self.assertEqual((done.returncode, done.stderr), (2, b""))
 
