@@ -1,10 +1,12 @@
-// Runs a target over every file of the folders that are named, without an engine.
+// Runs a target over every file of the folders that are named, without an engine; after
+// `--random COUNT` over so many inputs of random bytes, too.
 #include <algorithm>
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <memory>
+#include <random>
 #include <string>
 #include <vector>
 
@@ -24,13 +26,27 @@ std::vector<std::filesystem::path> FilesIn(const char* folder) {
 }
 
 // From a block that ends where the input ends.
+void Run(const std::string& input) {
+  const auto block = std::make_unique<uint8_t[]>(input.size());
+  std::copy(input.begin(), input.end(), block.get());
+  LLVMFuzzerTestOneInput(block.get(), input.size());
+}
+
 void Replay(const std::filesystem::path& path) {
   std::ifstream stream(path, std::ios::binary);
   Require(stream.is_open(), "an input can be opened");
-  const std::string bytes(std::istreambuf_iterator<char>(stream), {});
-  const auto block = std::make_unique<uint8_t[]>(bytes.size());
-  std::copy(bytes.begin(), bytes.end(), block.get());
-  LLVMFuzzerTestOneInput(block.get(), bytes.size());
+  Run(std::string(std::istreambuf_iterator<char>(stream), {}));
+}
+
+void RunRandom(size_t count) {
+  std::mt19937 random(8);
+  for (size_t number = 0; number < count; ++number) {
+    std::string input(random() % 2048, 0);
+    for (char& byte : input) byte = static_cast<char>(random() >> 24);
+    std::fprintf(stderr, "\rrandom input %zu", number);
+    Run(input);
+  }
+  std::fprintf(stderr, "\n");
 }
 
 }  // namespace
@@ -38,6 +54,13 @@ void Replay(const std::filesystem::path& path) {
 int main(int argc, char** argv) {
   size_t count = 0;
   for (int i = 1; i < argc; ++i) {
+    if (argv[i] == std::string("--random")) {
+      Require(i + 1 < argc, "a count follows --random");
+      const size_t randomCount = std::stoul(argv[++i]);
+      RunRandom(randomCount);
+      count += randomCount;
+      continue;
+    }
     for (const auto& file : FilesIn(argv[i])) {
       std::fprintf(stderr, "%s\n", file.string().c_str());
       Replay(file);
