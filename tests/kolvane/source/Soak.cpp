@@ -22,8 +22,8 @@
 
 namespace {
 
-constexpr int kRests = 10;
-constexpr int kWarmUp = 3;
+constexpr uint32_t kRests = 10;
+constexpr uint32_t kWarmUp = 3;
 constexpr uint64_t kReloadEvery = 2000;
 constexpr size_t kMostGrowth = size_t{64} << 10;
 constexpr size_t kMostResidentGrowth = size_t{4} << 20;  // pages that the allocator keeps vary
@@ -96,8 +96,8 @@ void WalkTo(uint64_t count, TranslatorWalk& walk, Resident& resident) {
   walk.Rest();
 }
 
-void Compare(const Memory& now, Memory& most, int rest) {
-  std::fprintf(stderr, "%d: %zu bytes allocated, %zu resident\n", rest, now.allocated, now.resident);
+void Compare(const Memory& now, Memory& most, uint32_t rest) {
+  std::fprintf(stderr, "%u: %zu bytes allocated, %zu resident\n", rest, now.allocated, now.resident);
   if (rest < kWarmUp) {
     most = {std::max(most.allocated, now.allocated), std::max(most.resident, now.resident)};
     return;
@@ -115,7 +115,7 @@ void Soak(uint64_t count) {
   walk.Rest();
   const VRKHostLiveCounts atRest = LiveCounts();
   Memory most{};
-  for (int rest = 0; rest < kRests; ++rest) {
+  for (uint32_t rest = 0; rest < kRests; ++rest) {
     WalkTo(count * (rest + 1) / kRests, walk, resident);
     const VRKHostLiveCounts now = LiveCounts();
     Require(std::memcmp(&now, &atRest, sizeof now) == 0, "nothing is left over");
