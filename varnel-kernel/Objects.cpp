@@ -127,12 +127,12 @@ VRKResult Objects::Release(VRKObject object) {
   const Object* const found = handles.Find<Object>(object);
   if (found == nullptr) return kVRKInvalidHandle;
   const bool isLast = handles.Release<Object>(object) == 0;
-  if (isLast && !found->isDying && found->deliveries == 0) Die(object);
+  if (isLast && found->deliveries == 0) Die(object);
   return kVRKNoError;
 }
 
 // References that handlers take to a dying object do not bring it back: once they all have been
-// told, its handle is stale.
+// told, in a delivery too, its handle is stale.
 void Objects::Die(VRKObject object) {
   Object& dying = *handles.Find<Object>(object);
   dying.isDying = true;
