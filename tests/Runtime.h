@@ -2,4 +2,8 @@
 // one to the other and the program's operator new serves both. Not where each brings its own.
 #pragma once
 
-inline constexpr bool kLibrariesShareRuntime = LIBRARIES_SHARE_RUNTIME != 0;
+#if defined(_WIN32)
+inline constexpr bool kLibrariesShareRuntime = false;
+#else
+inline constexpr bool kLibrariesShareRuntime = true;
+#endif
