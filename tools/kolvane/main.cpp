@@ -1,10 +1,7 @@
-// The kolvane command: finds the subcommand, runs it, and turns whatever happens into a message and
-// an exit status.
+// The kolvane command: finds the subcommand and runs it.
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <exception>
-#include <new>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -15,8 +12,8 @@
 #include "Console.h"
 #include "ConvertCommand.h"
 #include "DumpCommand.h"
+#include "Guard.h"
 #include "Messages.h"
-#include "OVErrException.h"
 #include "StandardOutput.h"
 #include "StatsCommand.h"
 #include "TranslateCommand.h"
@@ -74,20 +71,10 @@ void PrintVersion() {
                   KOLVANE_VERSION));
 }
 
-ExitStatus RunCommand(const Command& command, int argc, const char* const* argv) {
-  try {
-    return command.run(argc, argv);
-  } catch (const CommandLine::HelpPrinted&) {
-    return ExitStatus::kDone;
-  } catch (const UsageError& error) {
-    Say(fmt::format("{0}: {1}\ntry 'kolvane {0} --help'", command.name, error.what()));
-    return ExitStatus::kNotDone;
-  }
-}
-
 ExitStatus RunNamed(std::string_view name, int argc, const char* const* argv) {
   for (const Command& command : kCommands) {
-    if (name == command.name) return RunCommand(command, argc, argv);
+    if (name != command.name) continue;
+    return Guard(name, [&] { return command.run(argc, argv); });
   }
   throw UsageError(fmt::format("unknown command '{}'", Printable(name)));
 }
@@ -110,35 +97,17 @@ ExitStatus Run(int argc, const char* const* argv) {
   return RunNamed(first, argc - 1, argv + 1);
 }
 
-// Every way that a run can fail ends here, as a message and a status.
-template <class Action>
-ExitStatus Guard(Action action) {
-  try {
-    return action();
-  } catch (const UsageError& error) {
-    Say(fmt::format("{}\ntry 'kolvane --help'", error.what()));
-  } catch (const ClosedPipe&) {
-  } catch (const OVErrException& error) {
-    Say(fmt::format("a text could not be converted (code {:#010x})", error.Code()));
-  } catch (const std::bad_alloc&) {
-    Say("out of memory");
-  } catch (const std::exception& error) {
-    Say(error.what());
-  }
-  return ExitStatus::kNotDone;
-}
-
 }  // namespace
 
 int main(int argc, char** argv) {
   platform::SpeakUTF8();
-  const ExitStatus run = Guard([&] {
+  const ExitStatus run = Guard("", [&] {
     const std::vector<std::string> arguments = platform::Arguments(argc, argv);
     std::vector<const char*> words(arguments.size());
     std::ranges::transform(arguments, words.begin(), &std::string::c_str);
     return Run(static_cast<int>(words.size()), words.data());
   });
-  const ExitStatus closed = Guard([] {
+  const ExitStatus closed = Guard("", [] {
     CloseOutput();
     return ExitStatus::kDone;
   });

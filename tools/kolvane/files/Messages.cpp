@@ -3,7 +3,6 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <cstdio>
 
 namespace {
 
@@ -17,11 +16,6 @@ bool IsControlPair(unsigned char first, unsigned char second) {
 }
 
 }  // namespace
-
-void Say(std::string_view message) {
-  const std::string line = fmt::format("kolvane: {}\n", message);
-  static_cast<void>(std::fwrite(line.data(), 1, line.size(), stderr));
-}
 
 std::string Printable(std::string_view text) {
   std::string printable;
