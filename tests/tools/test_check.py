@@ -81,16 +81,6 @@ class Check(CommandTest):
         self.assertIn(len(mark) - 1 - sum(room(line[:line.index("^")])), (0, 1))
         self.assertEqual(len(self.findings(self.file('"$$$/escape=' + "^q" * 100000 + '"\n'))), 20)
 
-    def test_controls_are_escaped(self):
-        name = self.file('"$$$/twi\x1b[31mce=\x07"\n"$$$/twi\x1b[31mce=\u009b^q"\n')
-        for form in ["text", "github", "json", "sarif"]:
-            status, output, _ = self.check(f"--format={form}", name)
-            self.assertEqual(status, 1)
-            if form in ("text", "github"):
-                self.assertNotRegex(output, "[\0-\x08\x0b-\x1f\x7f-\x9f]")
-        self.assertIn(r"  " + r'"$$$/twi\x1B[31mce=\xC2\x9B^q"', self.check(name)[1])
-        self.assertIn("twi\x1b[31mce", self.findings(name)[0]["key"])
-
     def test_colours(self):
         name = self.file(DROPPED)
         plain = self.check(name)[1]

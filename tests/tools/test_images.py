@@ -35,28 +35,9 @@ class Images(CommandTest):
                     self.assertEqual(self.good("translate", "--nul", "--dictionary", "one", stdin=keys),
                                      self.good("translate", "--nul", "--dictionary", path, stdin=keys))
 
-    def test_inputs_merge_as_loads_do(self):
-        self.file(name="a", content=b'"/k=one"\n"/a=first"' + PAD)
-        self.file(name="b", content=b'"/k=two"\n"/k=last"\n"/b=second"' + PAD)
-        self.good("compile", "a", "b", "-o", "ab")
-        self.assertEqual(self.good("dump", "--sort", "ab"), b'"$$$/a=first"\n"$$$/b=second"\n"$$$/k=last"\n')
-        self.file(name="both", content=self.bytes_of("b").strip() + b"\n" + self.bytes_of("a"))
-        self.assertEqual(self.good("dump", "both"), b'"$$$/k=one"\n"$$$/b=second"\n"$$$/a=first"\n')
-        self.assertEqual(self.good("compile", "ab", "-", "-o", "-", stdin=self.bytes_of("a")),
-                         self.good("compile", "b", "a", "-o", "-"))
-
-    def test_images_are_not_taken_for_text(self):
-        image = self.good("compile", "-", "-o", "-", "--values", "utf-8", stdin='"/k=é"'.encode() + PAD)
-        image.decode()
-        for encoding in ["auto", "image", "utf-8"]:
-            self.assertEqual(self.good("dump", "--encoding", encoding, "-", stdin=image).strip().decode(), '"$$$/k=é"')
-
-    def test_nothing_comes_back_too(self):
-        _, image, _ = self.run_kolvane("compile", "-", "-o", "-", stdin=PAD)
-        for how in [[], ["--utf-16"]]:
-            status, text, _ = self.run_kolvane("dump", "-", *how, stdin=image)
-            self.assertEqual(status, 0)
-            self.assertEqual(self.run_kolvane("compile", "-", "-o", "-", stdin=text)[1], image)
+    def test_dump_keeps_the_order_of_the_file(self):
+        self.file(name="both", content=b'"/k=two"\n"/b=second"\n"/a=first"\n"/k=last"' + PAD)
+        self.assertEqual(self.good("dump", "both"), b'"$$$/k=last"\n"$$$/b=second"\n"$$$/a=first"\n')
 
     def test_an_equal_image_is_left_alone(self):
         self.file(name="a", content=b'"/k=one"' + PAD)

@@ -1,0 +1,136 @@
+#include "CommandTrial.h"
+
+#include <algorithm>
+#include <array>
+#include <fstream>
+#include <iterator>
+#include <random>
+
+#include "CheckCommand.h"
+#include "CompileCommand.h"
+#include "ConvertCommand.h"
+#include "DictionaryFile.h"
+#include "DumpCommand.h"
+#include "Guard.h"
+#include "Input.h"
+#include "StandardOutput.h"
+#include "StatsCommand.h"
+#include "Text.h"
+
+namespace {
+
+namespace fs = std::filesystem;
+
+struct Command {
+  std::string_view name;
+  ExitStatus (*run)(int argc, const char* const* argv);
+};
+
+constexpr Command kCommands[] = {{"check", RunCheck},
+                                 {"compile", RunCompile},
+                                 {"convert", RunConvert},
+                                 {"dump", RunDump},
+                                 {"stats", RunStats}};
+
+std::string gOutput, gSaid;
+
+std::string NameOf(const fs::path& path) {
+  const std::u8string name = path.u8string();
+  return {name.begin(), name.end()};
+}
+
+std::optional<std::string> BytesOf(const fs::path& path) {
+  std::ifstream stream(path, std::ios::binary);
+  if (!stream.is_open()) return {};
+  return std::string(std::istreambuf_iterator<char>(stream), {});
+}
+
+}  // namespace
+
+// The command's own ones, which are not linked then, write to the standard streams.
+
+void Say(std::string_view message) {
+  Require(!message.empty() && IsValidUTF8(message), "messages are UTF-8");
+  Require(Printable(message) == message, "messages are one line, without controls");
+  gSaid.append(message) += '\n';
+}
+
+void WriteOutput(std::string_view text) {
+  gOutput += text;
+}
+
+void FlushOutput() {}
+
+Words operator+(Words words, const Words& more) {
+  words.insert(words.end(), more.begin(), more.end());
+  return words;
+}
+
+CommandRun RunCommand(const Words& words) {
+  std::vector<const char*> argv(words.size());
+  std::ranges::transform(words, argv.begin(), &std::string::c_str);
+  const auto* const command = std::ranges::find(kCommands, words.front(), &Command::name);
+  gOutput.clear();
+  gSaid.clear();
+  const ExitStatus status = Guard(
+      words.front(), [&] { return command->run(static_cast<int>(argv.size()), argv.data()); });
+  Require(status != ExitStatus::kNotDone || !gSaid.empty(), "who refuses says why");
+  return {status, std::move(gOutput), std::move(gSaid)};
+}
+
+Trial::Trial(const uint8_t* choice, size_t choiceCount, const std::vector<std::string>& contents)
+    : choices(choice, choiceCount),
+      folder(fs::temp_directory_path() /
+             ("kolvane-fuzz-" + std::to_string(std::random_device()()))) {
+  constexpr std::array kEncodings = {FileEncoding::kAuto, FileEncoding::kImage,
+                                     FileEncoding::kUTF8};
+  constexpr std::array kWords = {"auto", "image", "utf-8"};
+  const uint32_t number = choices.Below(kEncodings.size());
+  encoding = kEncodings[number];
+  encodingOption = {"--encoding", kWords[number]};
+  isOutputThere = choices.OneIn(2);
+  fs::create_directory(folder);
+  for (const std::string& bytes : contents) {
+    files.push_back(Write("\u00E9, &" + std::to_string(files.size()), bytes));
+  }
+}
+
+Trial::~Trial() {
+  fs::remove_all(folder);
+}
+
+std::string Trial::Pick(const Words& words) {
+  return words[choices.Below(static_cast<uint32_t>(words.size()))];
+}
+
+std::string Trial::Write(std::string_view name, std::string_view bytes) const {
+  const fs::path file = folder / std::u8string(name.begin(), name.end());
+  std::ofstream(file, std::ios::binary) << bytes;
+  return NameOf(file);
+}
+
+std::optional<std::string> Trial::Written(const Words& words) const {
+  const fs::path out = folder / "out";
+  fs::remove(out);
+  if (isOutputThere) Write("out", "as it was");
+  const auto before = BytesOf(out);
+  const CommandRun run = RunCommand(words + Words{"-o", NameOf(out)});
+  Require(run.output.empty(), "what has an output file writes nothing else");
+  for (const auto& file : fs::directory_iterator(folder)) {
+    Require(file.path().extension() != ".tmp", "no file is left behind");
+  }
+  const auto after = BytesOf(out);
+  if (run.status == ExitStatus::kDone) return after;
+  Require(run.status == ExitStatus::kNotDone, "all is written or nothing");
+  Require(after == before, "who refuses leaves what was there");
+  return {};
+}
+
+Loaded::Loaded(const Words& files, FileEncoding encoding) {
+  for (const std::string& name : files) {
+    const LoadStatus status = LoadInto(table, ReadImageFile(name, encoding));
+    isWhole = isWhole && status.Complete();
+    isTooShort = isTooShort || status.damage == LoadDamage::kTooShort;
+  }
+  answers = AnswersOf(table);
+}

@@ -1,0 +1,118 @@
+// What `kolvane compile`, `convert` and `dump` make of any bytes.
+#include <algorithm>
+#include <nlohmann/json.hpp>
+
+#include "CommandTrial.h"
+#include "DictionaryFile.h"
+#include "DictionaryReader.h"
+#include "DictionaryWriter.h"
+#include "Input.h"
+#include "Text.h"
+
+namespace {
+
+using JSON = nlohmann::json;
+using Entries = std::vector<const tovali_private::DictionaryEntry*>;
+
+// The name of what `compile` makes of the file, which is whole.
+std::string Compiled(const Trial& trial) {
+  const auto image = trial.Written(Words{"compile", trial.files.front()} + trial.encodingOption);
+  Require(image.has_value(), "what is whole compiles");
+  return trial.Write("compiled", *image);
+}
+
+void RequireSame(const JSON& object, const tovali_private::DictionaryEntry& entry) {
+  const auto key = object.contains("key")
+                       ? object["key"].get<std::string>()
+                       : std::string(AsText(object["keyBytes"].get<std::vector<uint8_t>>()));
+  const auto value = object.contains("value")
+                         ? ToUTF16(object["value"].get_ref<const std::string&>())
+                         : object["valueUnits"].get<std::vector<uint16_t>>();
+  Require(key == AsText(entry.Bytes()), "JSON has the keys");
+  Require(std::ranges::equal(value, entry.Value().Units()), "JSON has the values");
+}
+
+void TryDumpAsJSON(Trial& trial) {
+  const Words options =
+      trial.choices.OneIn(2) ? Words{"dump", "--json"} : Words{"dump", "--json", "--sort"};
+  const CommandRun run = trial.Run(options + Words{trial.files.front()});
+  Loaded input({trial.files.front()}, trial.encoding);
+  Entries entries =
+      EntriesInFileOrder(input.table, ReadImageFile(trial.files.front(), trial.encoding));
+  if (options.size() == 3) std::ranges::sort(entries, tovali_private::KeyComesBefore);
+  const JSON objects = JSON::parse(run.output)["entries"];
+  Require(objects.size() == input.answers.size(), "JSON has each entry");
+  for (size_t i = 0; i < entries.size(); ++i) RequireSame(objects[i], *entries[i]);
+  Require((run.status == ExitStatus::kDone) == input.isWhole, "the status tells of damage");
+  if (!input.isWhole || options.size() != 3) return;
+  Require(RunCommand(options + Words{Compiled(trial)}).output == run.output, "an image tells all");
+}
+
+void TryDumpAsText(Trial& trial) {
+  const bool isUTF16 = trial.choices.OneIn(2);
+  Words options = {"dump"};
+  if (trial.choices.OneIn(2)) options.push_back("--sort");
+  if (isUTF16) options.push_back("--utf-16");
+  const CommandRun run = trial.Run(options + Words{trial.files.front()});
+  const Loaded input({trial.files.front()}, trial.encoding);
+  const bool isLost = run.said.find("cannot be written as text") != run.said.npos;
+  Require((run.status == ExitStatus::kDone) == (input.isWhole && !isLost), "the status tells all");
+  Require(isUTF16 || IsValidUTF8(run.output), "text is UTF-8");
+  const Words text = {trial.Write("text", run.output)};
+  const Loaded back(text, FileEncoding::kAuto);
+  Require(back.isWhole, "text is whole");
+  Require(isLost || back.answers == input.answers, "text loads back");
+  Require(RunCommand(options + text).output == run.output, "text is the same the next time");
+}
+
+// UTF-16 in little-endian order of the text in `name`, or none where it is no text.
+std::optional<std::string> InUTF16(const Trial& trial, const std::string& name,
+                                   const Words& encodingOption) {
+  return trial.Written(Words{"convert", "--to", "utf-16le", name} + encodingOption);
+}
+
+// A mark is a part of the first line, which only matters where there are no quotes.
+void RequireSameLoad(const std::string& name, FileEncoding encoding, const Loaded& expected) {
+  const Loaded loaded({name}, encoding);
+  const std::string image = ReadImageFile(name, encoding).bytes;
+  const bool isMarked =
+      tovali_private::EncodingByMark(image) != TextEncoding::kCodePage || image.starts_with('"');
+  const bool isLoaded = isMarked && !loaded.isTooShort && !expected.isTooShort;
+  Require(!isLoaded || loaded.answers == expected.answers, "the encoding alone changes");
+}
+
+}  // namespace
+
+void TryCompile(Trial& trial) {
+  const std::string values = trial.Pick({"utf-16", "utf-8", "code-page"});
+  const Words options = {"compile", "--format", trial.Pick({"1.0", "1.5"}), "--values", values};
+  const auto image = trial.Written(options + trial.encodingOption + trial.files);
+  const Loaded inputs(trial.files, trial.encoding);
+  Require(inputs.isWhole || !image, "nothing is made of what is damaged");
+  Require(image || !inputs.isWhole || values != "utf-16", "UTF-16 carries everything");
+  if (!image) return;
+  const Words copy = {trial.Write("image", *image)};
+  const Loaded back(copy, trial.encoding);
+  Require(back.isWhole && back.answers == inputs.answers, "an image has what its inputs have");
+  Require(trial.Written(options + copy) == image, "equal contents, equal bytes");
+}
+
+void TryConvert(Trial& trial) {
+  const std::string& input = trial.files.front();
+  const std::string target = trial.Pick({"utf-8", "utf-16le", "utf-16be", "code-page"});
+  const auto output = trial.Written(Words{"convert", "--to", target, input} + trial.encodingOption);
+  if (!output) return;
+  const std::string copy = trial.Write("converted", *output);
+  const FileEncoding encoding = target == "utf-8" ? FileEncoding::kUTF8 : FileEncoding::kImage;
+  const Words encodingOption = {"--encoding", target == "utf-8" ? "utf-8" : "image"};
+  const auto units = InUTF16(trial, input, trial.encodingOption);
+  Require(units.has_value(), "UTF-16 carries everything");
+  Require(InUTF16(trial, copy, encodingOption) == units, "the text stays");
+  const Loaded expected({trial.Write("units", *units)}, FileEncoding::kImage);
+  RequireSameLoad(input, trial.encoding, expected);
+  RequireSameLoad(copy, encoding, expected);
+}
+
+void TryDump(Trial& trial) {
+  trial.choices.OneIn(2) ? TryDumpAsJSON(trial) : TryDumpAsText(trial);
+}
