@@ -1,62 +1,63 @@
 #include "AllocationMeter.h"
 
+#include <atomic>
 #include <cstdlib>
 #include <new>
 
 namespace {
 
-bool gWatching = false;
-bool gFailed = false;
+Fault* gFault = nullptr;  // while there is a meter
 size_t gTotalBytes = 0;
-ptrdiff_t gLiveBlocks = 0;
-size_t gUntilFailure = 0;
+ptrdiff_t gBlocksBefore = 0;
+std::atomic<ptrdiff_t> gLiveBlocks = 0;
 
-bool MayAllocate(size_t size) {
-  if (!gWatching) return true;
-  gTotalBytes += size;
-  gFailed |= gUntilFailure == 1;
-  if (gUntilFailure != 0 && --gUntilFailure == 0) return false;
+void* Allocate(size_t size) {
+  if (gFault != nullptr) {
+    gTotalBytes += size;
+    if (gFault->Strikes()) return nullptr;
+  }
   ++gLiveBlocks;
-  return true;
+  return std::malloc(size != 0 ? size : 1);
 }
 
 void Free(void* block) {
-  if (gWatching && block != nullptr) --gLiveBlocks;
+  if (block != nullptr) --gLiveBlocks;
   std::free(block);
 }
 
 }  // namespace
 
-AllocationMeter::AllocationMeter(size_t failAt) {
-  gFailed = false;
+AllocationMeter::AllocationMeter(Fault& fault) {
   gTotalBytes = 0;
-  gLiveBlocks = 0;
-  gUntilFailure = failAt;
-  gWatching = true;
+  gBlocksBefore = gLiveBlocks;
+  gFault = &fault;
 }
 
 AllocationMeter::~AllocationMeter() {
-  gWatching = false;
+  gFault = nullptr;
 }
 
 size_t AllocationMeter::TotalBytes() const {
   return gTotalBytes;
 }
 ptrdiff_t AllocationMeter::LiveBlocks() const {
-  return gLiveBlocks;
+  return gLiveBlocks - gBlocksBefore;
 }
 bool AllocationMeter::Failed() const {
-  return gFailed;
+  return gFault->hasFired;
+}
+ptrdiff_t AllocationMeter::LiveBlocksInAll() {
+  return gLiveBlocks;
 }
 
 void* operator new(size_t size) {
-  void* const block = MayAllocate(size) ? std::malloc(size != 0 ? size : 1) : nullptr;
+  void* const block = Allocate(size);
   if (block == nullptr) throw std::bad_alloc();
   return block;
 }
 
 void* operator new(size_t size, const std::nothrow_t&) noexcept {
-  return MayAllocate(size) ? std::malloc(size != 0 ? size : 1) : nullptr;
+  return Allocate(size);
 }
 
 void* operator new[](size_t size) {

@@ -3,11 +3,25 @@
 
 #include <cstddef>
 
+// Where something is to fail: the nth time (from 1), or never (0).
+struct Fault {
+  size_t at = 0;
+  bool lasts = false;  // and each time after that
+  size_t times = 0;    // so far
+  bool hasFired = false;
+
+  // Whether this time is one to fail.
+  bool Strikes() {
+    hasFired |= ++times == at;
+    return times == at || (lasts && hasFired);
+  }
+};
+
 // Counts from its construction on; one at a time.
 class AllocationMeter {
  public:
-  // With failAt = n, the nth allocation fails (from 1); 0 lets all succeed.
-  explicit AllocationMeter(size_t failAt = 0);
+  explicit AllocationMeter(size_t failAt = 0) : AllocationMeter(own) { own.at = failAt; }
+  explicit AllocationMeter(Fault& fault);
   ~AllocationMeter();
   AllocationMeter(const AllocationMeter&) = delete;
   AllocationMeter& operator=(const AllocationMeter&) = delete;
@@ -15,4 +29,10 @@ class AllocationMeter {
   size_t TotalBytes() const;
   ptrdiff_t LiveBlocks() const;  // those freed that were allocated before count less than nothing
   bool Failed() const;
+
+  // Since the program began, with a meter or without.
+  static ptrdiff_t LiveBlocksInAll();
+
+ private:
+  Fault own;
 };

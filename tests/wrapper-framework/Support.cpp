@@ -34,7 +34,7 @@ CallTrace::CallTrace() {
 
 CallTrace::~CallTrace() {
   VRKHostSetTraceHook(nullptr, nullptr);
-  if (makeGood) makeGood();
+  for (const auto& again : makeGood) again();
 }
 
 std::vector<std::string> CallTrace::Take() {
@@ -53,11 +53,16 @@ VRKResult CallTrace::Note(const VRKHostTraceCall& call) {
     if (argument.isOut != 0 || argument.kind == kVRKTraceText) continue;
     if (argument.kind != kVRKTracePointer) calls.back() += ' ' + std::to_string(argument.number);
   }
-  if (calls.size() != failAt && call.operation != failNext) return 0;
-  failNext.clear();
+  if (!Strikes(call.operation)) return 0;
+  if (auto again = Again(call)) makeGood.push_back(std::move(again));
+  if (fault != nullptr && fault->times > fault->at) return kLaterFailure;
   failed = call.operation;
-  makeGood = Again(call);
   return kFailure;
+}
+
+bool CallTrace::Strikes(const std::string& operation) {
+  if (operation == failNext) return failNext.clear(), true;
+  return fault != nullptr && !(fault->lasts && EndsRegistration(operation)) && fault->Strikes();
 }
 
 // Does later what a call is kept from giving up now.
@@ -71,6 +76,8 @@ std::function<void()> CallTrace::Again(const VRKHostTraceCall& call) {
       {"VRKDictionaryRelease", [=] { VRKDictionaryRelease(VRKDictionary{handle}); }},
       {"VRKObjectRelease", [=] { VRKObjectRelease(VRKObject{handle}); }},
       {"VRKMemoryDeallocate", [=] { VRKMemoryDeallocate(first); }},
+      {"VRKMessageHandlerRemove",
+       [=, object = call.arguments[1].number] { VRKMessageHandlerRemove(VRKMessageHandler{handle}, VRKObject{object}); }},
       {"VRKDataCoercionHandlerRemove", [=] { VRKDataCoercionHandlerRemove(AsCallback<VRKDataCoercionCallback>(first), second, 0, 0); }},
       {"VRKObjectFactoryUnregister", [=] { VRKObjectFactoryUnregister(0, AsCallback<VRKObjectFactoryCallback>(second), third); }}};
   const auto found = giveUps.find(call.operation);
@@ -82,6 +89,16 @@ VRKResult CodeOf(const std::function<void()>& body) {
     body();
     return 0;
   });
+}
+
+std::set<VRKResult> ResultsOf(const std::string& failed, bool lasts, Hears hears) {
+  if (failed.empty() || hears == Hears::kNothing) return {0};
+  const VRKResult code = failed == "VRKMemoryAllocate" ? Varnel::kResultOutOfMemory : CallTrace::kFailure;
+  if (!CallTrace::GivesUp(failed) && hears == Hears::kAll) return {code};
+  std::set<VRKResult> results = {0};
+  if (failed.ends_with("Release") || failed == "VRKMessageHandlerRemove" || hears == Hears::kSome) results.insert(code);
+  if (lasts) results.insert({CallTrace::kLaterFailure, Varnel::kResultOutOfMemory});
+  return results;
 }
 
 uint32_t Report::Note(uint32_t severity, const char* domain, const char* expression, const char* sourceFile, uint32_t line,

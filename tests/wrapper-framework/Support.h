@@ -4,13 +4,17 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <set>
 #include <string>
 #include <utility>
 #include <vector>
 
 #include "DataCoercion.h"
+#include "FaultSweep.h"
 #include "MessageHandler.h"
 #include "ObjectFactory.h"
+#include "ResultCodes.h"
+#include "Runtime.h"
 #include "VarnelKernelHost.h"
 
 // What is alive in the kernel, by kind; empty when nothing is.
@@ -31,29 +35,36 @@ std::string Call(std::string operation, Arguments... arguments) {
   return operation;
 }
 
-// Notes the calls made to the kernel, from its construction on, and can make one of them fail; one
-// at a time. A call that fails and would have given something up is made good by the destructor.
+// Notes the calls made to the kernel, from its construction on, and can make some of them fail; one
+// at a time. Calls that fail and would have given something up are made good by the destructor.
 class CallTrace {
  public:
   static constexpr VRKResult kFailure = 4242;
+  static constexpr VRKResult kLaterFailure = 4343;  // of faults that last, from the second one on
 
   CallTrace();
   ~CallTrace();
   CallTrace(const CallTrace&) = delete;
   CallTrace& operator=(const CallTrace&) = delete;
 
-  // Fails the nth call from now on (from 1), or the next one of an operation.
-  void FailAt(size_t n) { failAt = calls.size() + n; }
+  // Fails the next call of an operation, or those from now on that are a fault's. One that lasts spares
+  // the ends of registrations: a kernel that goes on calling what is gone cannot be survived.
   void FailNext(std::string operation) { failNext = std::move(operation); }
+  void Fail(Fault& newFault) { fault = &newFault; }
 
-  // Whether an operation gives up what the caller has.
+  // Whether an operation ends a registration, or gives up what the caller has.
+  static bool EndsRegistration(const std::string& operation) { return operation.ends_with("Remove") || operation.ends_with("Unregister"); }
   static bool GivesUp(const std::string& operation) {
-    const auto endsWith = [&](const char* end) { return operation.ends_with(end); };
-    return endsWith("Release") || endsWith("Deallocate") || endsWith("Remove") || endsWith("Unregister");
+    return operation.ends_with("Release") || operation.ends_with("Deallocate") || EndsRegistration(operation);
   }
 
-  // The operation that was made to fail, or empty.
+  // The operation that was made to fail first, or empty.
   const std::string& Failed() const { return failed; }
+
+  // What was heard of is not made good: its caller has what it had.
+  void Hear(VRKResult result) {
+    if (result == kFailure && GivesUp(failed)) makeGood.erase(makeGood.begin());
+  }
 
   // The calls so far, but for those that retain or release nothing; forgets them.
   std::vector<std::string> Take();
@@ -62,12 +73,13 @@ class CallTrace {
   static VRKResult VRK_CALL Hook(const VRKHostTraceCall* call, void* context);
   static std::function<void()> Again(const VRKHostTraceCall& call);
   VRKResult Note(const VRKHostTraceCall& call);
+  bool Strikes(const std::string& operation);
 
   std::vector<std::string> calls;
-  size_t failAt = 0;
   std::string failNext;
+  Fault* fault = nullptr;
   std::string failed;
-  std::function<void()> makeGood;
+  std::vector<std::function<void()>> makeGood;
 };
 
 // A callback as the trace shows it.
@@ -140,3 +152,54 @@ struct Report {
 
 // What a boundary would return for what `body` throws, or 0.
 VRKResult CodeOf(const std::function<void()>& body);
+
+// Whether a phase throws what fails in it: always, or unless nobody is to hear of it, or never.
+enum class Hears { kAll, kSome, kNothing };
+
+// One of the things that are done in a world, how many calls and allocations it takes at least, and what
+// is alive in the kernel when it is done, and may be when it failed; what was before where nothing is said.
+template <class World>
+struct Phase {
+  const char* name;
+  void (World::*run)();
+  Hears hears;
+  size_t calls, allocations;
+  std::string done = {};
+  std::set<std::string> failed = {};
+};
+
+// What a phase may return when `failed` was the first operation to fail, or empty.
+std::set<VRKResult> ResultsOf(const std::string& failed, bool lasts, Hears hears);
+
+// Runs the phase, in a world of its own each time, with faults at the kernel's calls and at allocations.
+// The world looks itself at what it made of them.
+template <class World>
+void SweepPhase(const Phase<World>& phase) {
+  SCOPED_TRACE(phase.name);
+  const auto sweep = [&phase](size_t least, const auto& runWith) {
+    SweepFaults(least, [&](Fault& fault) {
+      World world(phase);
+      const std::string before = Alive();
+      const auto [result, expected] = runWith(fault, [&] { (world.*phase.run)(); });
+      EXPECT_TRUE(expected.contains(result)) << result;
+      const std::set<std::string> failed = phase.failed.empty() ? std::set{before} : phase.failed;
+      EXPECT_TRUE(result != 0 ? failed.contains(Alive()) : Alive() == (phase.done.empty() ? before : phase.done)) << Alive();
+      world.Check(phase);
+    });
+  };
+  sweep(phase.calls, [&](Fault& fault, const auto& body) {
+    CallTrace trace;
+    trace.Fail(fault);
+    const VRKResult result = CodeOf(body);
+    trace.Hear(result);
+    return std::pair(result, ResultsOf(trace.Failed(), fault.lasts, phase.hears));
+  });
+  sweep(kLibrariesShareRuntime ? phase.allocations : 0, [&](Fault& fault, const auto& body) {
+    VRKResult result = 0;
+    {
+      const AllocationMeter meter(fault);
+      result = CodeOf(body);
+    }
+    return std::pair(result, ResultsOf(fault.hasFired ? "VRKMemoryAllocate" : "", fault.lasts, phase.hears));
+  });
+}

@@ -10,9 +10,9 @@
 #include <random>
 #include <sstream>
 
-#include "AllocationMeter.h"
 #include "Converters.h"
 #include "DictionaryReader.h"
+#include "FaultSweep.h"
 #include "OVErrException.h"
 #include "SlowTwin.h"
 #include "Support.h"
@@ -292,26 +292,23 @@ TEST(Load, StoresALineWholeOrNotAtAll) {
   }
   entries.insert(entries.end(), 2, {"0A2_4_6_8_", Bytes(u"y")});
   const std::string image = Image1_5(0, {{static_cast<uint16_t>(BucketOf("0A2_4_6_8_")), entries}});
-  size_t failures = 0;
-  for (bool failed = true; failed; failures += failed) {
+  SweepFaults(2, [&](Fault& fault) {
     DictionaryTable table, untouched;
     Load(table, image);
     Load(untouched, image);
     const auto line = Units(u"0A2_4_6_8_=new");
     bool threw = false;
     {
-      const AllocationMeter meter(failures + 1);
+      const AllocationMeter meter(fault);
       try {
         table.StoreLine(line);
       } catch (const std::bad_alloc&) {
         threw = true;
       }
-      failed = meter.Failed();
     }
-    ASSERT_EQ(threw, failed);
-    ASSERT_EQ(ContentsOf(table) == ContentsOf(untouched), threw) << failures;
-  }
-  EXPECT_GT(failures, 2u);
+    ASSERT_EQ(threw, fault.hasFired);
+    ASSERT_EQ(ContentsOf(table) == ContentsOf(untouched), threw);
+  });
 }
 
 // Whatever allocation fails, the table keeps only whole entries, and the next load is as good as
@@ -327,13 +324,12 @@ TEST(Load, SurvivesEveryFailedAllocation) {
       const Contents contents = twin.AllContents();
       possible.insert(possible.end(), contents.begin(), contents.end());
     }
-    size_t failures = 0;
-    for (bool failed = true; failed; failures += failed) {
+    SweepFaults(7, [&](Fault& fault) {
       DictionaryTable table;
       bool loaded = false;
       boost::interprocess::ibufferstream stream(image.data(), image.size());
       {
-        const AllocationMeter meter(failures + 1);
+        const AllocationMeter meter(fault);
         try {
           table.Load(stream);
           loaded = true;
@@ -341,7 +337,6 @@ TEST(Load, SurvivesEveryFailedAllocation) {
           table.LastLoad();  // looks into every bucket
         } catch (const std::bad_alloc&) {
         }
-        failed = meter.Failed();
       }
       if (loaded) {
         ASSERT_EQ(ContentsOf(table), twin.AllContents());
@@ -353,8 +348,7 @@ TEST(Load, SurvivesEveryFailedAllocation) {
       for (const auto& [bucket, key, value] : twin.AllContents()) {
         ASSERT_EQ(Translated(table, key.c_str()), twin.Translate(key));
       }
-    }
-    EXPECT_GE(failures, 7u);
+    });
   }
 }
 

@@ -1,22 +1,19 @@
 #include "PlugInTest.h"
 
 #include <boost/interprocess/streams/bufferstream.hpp>
-#include <filesystem>
-#include <fstream>
 #include <map>
 #include <set>
 #include <sstream>
 
-#include "AllocationMeter.h"
-#include "KolvaneDictionary.h"
-#include "ResultCodes.h"
-#include "Runtime.h"
-#include "TranslatedString.h"
+#include "DictionaryTable.h"
+#include "DictionaryWriter.h"
+#include "Exceptions.h"
 #include "VRKTranslationImage.h"
 
 namespace {
 
 using namespace std::string_literals;
+using Translator = boost::shared_ptr<Varnel::StringTranslatorInterface>;
 
 // Two factories, a coercion of three pairs, and the first translator's object with its handler.
 constexpr char kStarted[] = "objects 1 handlers 1 factories 2 coercions 3 blocks 4 ";
@@ -26,18 +23,16 @@ TEST_F(PlugInTest, GoesThroughItsStates) {
   EXPECT_EQ(entry.version(), 0x00010000u);
   EXPECT_EQ(entry.initialize(1), 13u);
   EXPECT_EQ(Alive(), "");
-  for (int round = 0; round < 3; ++round) {
+  for (const char* const alive : {kStarted, "objects 2 handlers 2 factories 2 coercions 3 blocks 5 "}) {
     EXPECT_EQ(VRKHostPlugInInitialize(plugIn), 0u);
-    EXPECT_EQ(Alive(), kStarted);
+    EXPECT_EQ(Alive(), alive);
     EXPECT_EQ(entry.terminate(1), 13u);
     EXPECT_EQ(VRKHostPlugInUnload(plugIn), kVRKInUse);
     EXPECT_EQ(Coerced("$$$/k=default"), "default");
-    EXPECT_EQ(VRKHostPlugInInitialize(plugIn), 0u) << "without having been terminated";
-    EXPECT_EQ(Alive(), "objects 2 handlers 2 factories 2 coercions 3 blocks 5 ");
-    EXPECT_EQ(Coerced("$$$/k=default"), "default");
+  }
+  for (int round = 0; round < 2; ++round) {
     EXPECT_EQ(VRKHostPlugInTerminate(plugIn), 0u);
     EXPECT_EQ(Alive(), "");
-    EXPECT_EQ(VRKHostPlugInTerminate(plugIn), 0u);
   }
 }
 
@@ -57,38 +52,34 @@ class Notes {
 
  private:
   static VRKResult VRK_CALL Hook(const VRKHostTraceCall* call, void* context) {
-    if (call->isFinished == 0) static_cast<Notes*>(context)->Note(call->operation, call->arguments);
+    auto& self = *static_cast<Notes*>(context);
+    const std::string note = call->isFinished == 0 ? self.NoteOf(call->operation, call->arguments) : "";
+    if (!note.empty()) self.text += note + '\n';
     return 0;
   }
 
-  // A token's text, without what all have in common.
-  static std::string Short(const VRKHostTraceArgument& token) {
-    const std::string name = VRKTokenGetString(VRKToken{token.number});
-    return name.substr(name.find_last_of(".:") + 1);
-  }
+  // Without what all have in common.
+  static std::string Short(const std::string& name) { return name.substr(name.find_last_of(".:") + 1); }
+  static std::string Short(const VRKHostTraceArgument& token) { return Short(VRKTokenGetString(VRKToken{token.number})); }
 
-  void Note(const std::string& operation, const VRKHostTraceArgument* arguments) {
-    if (operation == "VRKTokenCreate" && arguments[1].number == 1) {
-      const std::string name = static_cast<const char*>(arguments[0].pointer);
-      text += "token " + name.substr(name.find_last_of(".:") + 1) + '\n';
-    } else if (operation == "VRKObjectFactoryRegister") {
-      text += "register " + (classes[arguments[3].pointer] = Short(arguments[0])) + '\n';
-    } else if (operation == "VRKObjectFactoryUnregister") {
-      text += "unregister " + classes[arguments[2].pointer] + '\n';
-    } else if (operation == "VRKMessageHandlerAddMessages") {
-      const auto* const messages = static_cast<const VRKToken*>(arguments[1].pointer);
-      for (uint32_t i = 0; i < arguments[2].number; ++i) text += "hear " + std::string(VRKTokenGetString(messages[i])).substr(8) + '\n';
-    } else if (operation == "VRKObjectDeliverMessage") {
-      text += "send " + Short(arguments[1]) + '\n';
-    } else if (operation == "VRKObjectRelease" && arguments[0].number != 0) {
-      text += "release\n";
-    } else if (operation == "VRKDataCoercionHandlerInstall") {
-      text += "coerce " + Short(arguments[0]) + " to " + Short(arguments[1]) + '\n';
-      coercionCallback = AsCallback<VRKDataCoercionCallback>(arguments[3].pointer);
-      coercion = const_cast<void*>(arguments[4].pointer);
-    } else if (operation == "VRKDataCoercionHandlerRemove") {
-      text += arguments[1].pointer == coercion ? "remove coercion\n" : "remove earlier coercion\n";
+  std::string NoteOf(const std::string& operation, const VRKHostTraceArgument* arguments) {
+    const auto& [first, second] = std::tie(arguments[0], arguments[1]);
+    if (operation == "VRKTokenCreate" && second.number == 1) return "token " + Short(static_cast<const char*>(first.pointer));
+    if (operation == "VRKObjectFactoryRegister") return "register " + (classes[arguments[3].pointer] = Short(first));
+    if (operation == "VRKObjectFactoryUnregister") return "unregister " + classes[arguments[2].pointer];
+    if (operation == "VRKObjectDeliverMessage") return "send " + Short(second);
+    if (operation == "VRKObjectRelease" && first.number != 0) return "release";
+    if (operation == "VRKMessageHandlerAddMessages") {
+      std::string heard = "hear";
+      const auto* const messages = static_cast<const VRKToken*>(second.pointer);
+      for (uint32_t i = 0; i < arguments[2].number; ++i) heard += ' ' + Short(VRKTokenGetString(messages[i]));
+      return heard;
     }
+    if (operation == "VRKDataCoercionHandlerRemove") return second.pointer == coercion ? "remove coercion" : "remove earlier coercion";
+    if (operation != "VRKDataCoercionHandlerInstall") return "";
+    coercionCallback = AsCallback<VRKDataCoercionCallback>(arguments[3].pointer);
+    coercion = const_cast<void*>(arguments[4].pointer);
+    return "coerce " + Short(first) + " to " + Short(second);
   }
 
   std::string text;
@@ -97,10 +88,8 @@ class Notes {
 
 TEST_F(PlugInTest, StartsUpAndShutsDownInOrder) {
   Notes notes;
-  const std::string object = "hear orvane.vrk.object-died\n", release = "release\n";
-  const std::string messages =
-      "hear orvane.localizable-strings.make-default\nhear orvane.localizable-strings.set-translations\n"
-      "hear orvane.localizable-strings.translate-string\n";
+  const std::string object = "hear object-died\n", release = "release\n";
+  const std::string messages = "hear make-default set-translations translate-string\n";
   const std::string messageTokens = "token make-default\ntoken set-translations\ntoken translate-string\n";
   for (int round = 0; round < 2; ++round) {
     VRKHostPlugInInitialize(plugIn);
@@ -143,148 +132,125 @@ void Load(Varnel::StringTranslatorInterface& translator, const std::string& byte
   translator.SetTranslations(image.units.get(), image.unitCount);
 }
 
-VRKResult Use() {
-  return CodeOf([] {
-    const auto translator = Varnel::CreateStringTranslator();
-    Load(*translator, "\"$$$/k=a translation\"\n");
-    translator->MakeDefault();
-    EXPECT_EQ(TranslatedBy(*translator, "$$$/k=default").size(), 13u);
-    EXPECT_EQ(Coerced("$$$/k=default"), "a translation");
-  });
+std::string BinaryImage(const std::string& text) {
+  DictionaryTable table;
+  boost::interprocess::ibufferstream in(text.data(), text.size());
+  table.Load(in);
+  std::ostringstream out;
+  EXPECT_TRUE(WriteBinary(table, tovali_private::BinaryVersion::k1_5, TextEncoding::kUTF8, out).empty());
+  return out.str();
 }
 
-// How a phase went with a fault in it; `failed` is empty when it was too short for the fault.
-struct Faulted {
-  VRKResult result;
-  std::string failed;
+// Two translators, the first of which is the default, and what a host does with them.
+class Translators {
+ public:
+  explicit Translators(const Phase<Translators>& phase) {
+    if (phase.run != &Translators::StartUp) Prepare();
+  }
+
+  void StartUp() { Varnel::ThrowIfFailed(VRKHostPlugInInitialize(plugIn)); }
+  void StartUpAgain() { StartUp(); }
+  void LoadText() { ExpectLoaded("\"$$$/text=loaded\"\n// some more\n", "$$$/text=default"); }
+  void LoadBinary() { ExpectLoaded(binary, "$$$/binary=default"); }
+  void LoadBytes() {
+    first->SetTranslations("\"$$$/bytes=loaded\"\n// more\n", 27);
+    EXPECT_EQ(By(first, "$$$/bytes=default"), "loaded");
+  }
+  void Translate() { EXPECT_EQ(By(first, "$$$/k=default"), "first"); }
+  void TranslateKey() {
+    Varnel::DictionaryRef parameters;
+    parameters.Create();
+    parameters.SetEntry(Varnel::MakeToken(Varnel::kParameterTranslationKey),
+                        Varnel::MakeData(Varnel::kTypeLocaleIndependentUTF8, "$$$/k=", 6));
+    Varnel::DeliverMessage(secondObject.Get(), Varnel::MakeToken(Varnel::kMessageTranslateString), parameters, false);
+    EXPECT_EQ(Varnel::GetUTF8(parameters.GetEntry(Varnel::MakeToken(Varnel::kParameterMessageResult))), "second's first\0"s);
+  }
+  void Coerce() {
+    EXPECT_EQ(Coerced("$$$/k=default"), "first");
+    std::vector<uint16_t> units;
+    Varnel::GetUTF16LE(Varnel::MakeData(Varnel::kTypeLocaleIndependentUTF8, "$$$/k=", 6), units);
+    EXPECT_EQ(units.size(), 6u);
+  }
+  void CreateOfDefault() { ofDefault.Create(Varnel::MakeToken(Varnel::kClassDefaultStringTranslator), {}); }
+  void MakeDefault() { Varnel::DeliverMessage(secondObject.Get(), Varnel::MakeToken(Varnel::kMessageMakeDefault), {}, false); }
+  void Die() { secondObject.Reset(); }
+  void ShutDown() { Varnel::ThrowIfFailed(VRKHostPlugInTerminate(plugIn)); }
+
+  // What was translated before still is, and all can be done again.
+  void Check(const Phase<Translators>& phase) {
+    if (first != nullptr) Translate();
+    if (Alive().find("coercions 3") != std::string::npos) {
+      const bool startsUp = phase.run == &Translators::StartUp || phase.run == &Translators::StartUpAgain;
+      const std::string changed = startsUp ? "default" : phase.run == &Translators::MakeDefault ? "second" : "first";
+      EXPECT_TRUE((std::set{"first"s, changed}).contains(Coerced("$$$/k=default")));
+    }
+    EXPECT_EQ(CodeOf([&] { (this->*phase.run)(); }), 0u);
+    Prepare();
+    for (const auto run : {&Translators::LoadText, &Translators::TranslateKey, &Translators::Coerce}) (this->*run)();
+    first.reset();
+    ofDefault.Reset();
+    Die();
+    ShutDown();
+    EXPECT_EQ(Alive(), "");
+  }
+
+  static inline VRKPlugIn plugIn{};
+
+ private:
+  void Prepare() {
+    StartUp();
+    first = Varnel::CreateStringTranslator();
+    Load(*first, "\"$$$/k=first\"\n// and more\n");
+    first->MakeDefault();
+    secondObject.Create(Varnel::MakeToken(Varnel::kClassStringTranslator), {});
+    Varnel::StringTranslatorClient second;
+    second.SetObject(secondObject);
+    Load(second, "\"$$$/k=second\"\n\"$$$first=second's first\"\n");
+  }
+  static std::string By(const Translator& translator, const std::string& key) {
+    const std::vector<uint16_t> units = TranslatedBy(*translator, key);
+    return {units.begin(), units.end()};
+  }
+  void ExpectLoaded(const std::string& image, const std::string& key) {
+    Load(*first, image);
+    EXPECT_EQ(By(first, key), "loaded");
+  }
+
+  Translator first;
+  Varnel::ObjectRef secondObject, ofDefault;
+  std::string binary = BinaryImage("\"$$$/binary=loaded\"\n// and more\n");
 };
 
-// Starts up, starts up again, translates and shuts down, each once for every point where `run` puts a fault into it.
-// Classes and coercions are there afterwards all or not at all; the next start works, and nothing is
-// left in the end. Returns what there was after start-ups.
-using Installed = std::set<std::pair<uint32_t, uint32_t>>;  // factories and coercions
-template <class Run, class Check>
-Installed SurviveEveryFault(VRKPlugIn plugIn, const Run& run, const Check& check) {
-  Installed afterStartUp;
-  const struct {
-    std::function<VRKResult()> run;
-    Installed allowed;  // afterwards
-  } phases[] = {{[=] { return VRKHostPlugInInitialize(plugIn); }, {{0, 0}, {2, 0}, {2, 3}}},
-                {[=] { return VRKHostPlugInInitialize(plugIn); }, {{0, 3}, {2, 0}, {2, 3}}},
-                {Use, {{2, 3}}},
-                {[=] { return VRKHostPlugInTerminate(plugIn); }, {{0, 0}}}};
-  for (const auto& phase : phases) {
-    const bool startsUp = &phase == phases;
-    std::string failed = "none yet";
-    for (size_t n = 1; !failed.empty(); ++n) {
-      if (!startsUp) {
-        EXPECT_EQ(VRKHostPlugInInitialize(plugIn), 0u);
-        EXPECT_EQ(Use(), 0u);
-      }
-      const Faulted faulted = run(n, phase.run);
-      failed = faulted.failed;
-      SCOPED_TRACE(failed + ' ' + std::to_string(n));
-      check(faulted);
-      VRKHostLiveCounts left{};
-      EXPECT_EQ(VRKHostGetLiveCounts(&left), 0u);
-      const std::pair installed(left.objectFactories, left.dataCoercions);
-      EXPECT_TRUE(phase.allowed.contains(installed)) << installed.first << ", " << installed.second;
-      if (startsUp) {
-        EXPECT_EQ(faulted.result == 0, left.dataCoercions == 3);
-        afterStartUp.insert(installed);
-      }
-      EXPECT_EQ(VRKHostPlugInInitialize(plugIn), 0u);
-      EXPECT_EQ(Use(), 0u);
-      EXPECT_EQ(VRKHostPlugInTerminate(plugIn), 0u);
-      EXPECT_EQ(Alive(), "");
-    }
-  }
-  return afterStartUp;
-}
-
-TEST_F(PlugInTest, SurvivesEveryFailedCall) {
-  std::map<std::string, std::set<VRKResult>> results;  // of each operation that failed
-  const auto run = [](size_t n, const std::function<VRKResult()>& phase) {
-    CallTrace trace;
-    trace.FailAt(n);
-    const VRKResult result = phase();
-    return Faulted{result, trace.Failed()};
-  };
-  const auto check = [&](const Faulted& faulted) { results[faulted.failed].insert(faulted.result); };
-  const Installed afterStartUp = SurviveEveryFault(plugIn, run, check);
-  EXPECT_EQ(afterStartUp, (Installed{{0, 0}, {2, 0}, {2, 3}}));
-
-  using Results = std::set<VRKResult>;
-  const Results heard{CallTrace::kFailure}, unheard{0}, either{0, CallTrace::kFailure};
-  const std::map<std::string, Results> expected = {{"", unheard},
-                                                   {"VRKMemoryAllocate", {Varnel::kResultOutOfMemory}},
-                                                   {"VRKMemoryDeallocate", unheard},
-                                                   {"VRKMessageHandlerRemove", unheard},
-                                                   {"VRKObjectFactoryUnregister", unheard},
-                                                   {"VRKDataCoercionHandlerRemove", unheard},
-                                                   // A death tells nobody of what fails in it.
-                                                   {"VRKTokenCreate", either},
-                                                   {"VRKDictionaryRetain", either},
-                                                   // Only where a holder gets another handle.
-                                                   {"VRKDataRelease", either},
-                                                   {"VRKListRelease", either},
-                                                   {"VRKDictionaryRelease", either},
-                                                   {"VRKObjectRelease", either}};
-  for (const auto& [operation, codes] : results) {
-    const auto found = expected.find(operation);
-    EXPECT_EQ(codes, found != expected.end() ? found->second : heard) << operation;
-  }
-  EXPECT_GT(results.size(), 20u);
-}
-
-TEST_F(PlugInTest, SurvivesEveryFailedAllocation) {
-  if (!kLibrariesShareRuntime) GTEST_SKIP() << "the plug-in's allocations are its own";
-  const auto run = [](size_t n, const std::function<VRKResult()>& phase) {
-    const AllocationMeter meter(n);
-    const VRKResult result = phase();
-    return Faulted{result, meter.Failed() ? "allocation" : ""};
-  };
-  const auto check = [](const Faulted& faulted) { EXPECT_EQ(faulted.result, faulted.failed.empty() ? 0 : Varnel::kResultOutOfMemory); };
-  EXPECT_TRUE(SurviveEveryFault(plugIn, run, check).contains({0, 0}));
-}
-
-// The name of each entry of a dictionary in UTF-16 with a definition a line, as a key.
-std::vector<std::string> KeysOf(const std::string& bytes) {
-  const std::string text = Varnel::GetUTF8(Varnel::MakeData(Varnel::kTypeUTF16, bytes.data(), static_cast<uint32_t>(bytes.size())));
-  std::vector<std::string> keys;
-  std::istringstream lines(text);
-  for (std::string line; std::getline(lines, line);) keys.push_back(line.substr(1, line.find('=')) + "default");
-  return keys;
-}
-
-// Real dictionaries through the kernel, held against the dictionary library.
-TEST_F(PlugInTest, TranslatesAsTheLibraryDoes) {
-  ASSERT_EQ(VRKHostPlugInInitialize(plugIn), 0u);
-  size_t compared = 0;
-  for (const auto& file : std::filesystem::directory_iterator(ISO_CODES_FOLDER)) {
-    SCOPED_TRACE(file.path());
-    std::ifstream stream(file.path(), std::ios::binary);
-    const std::string bytes(std::istreambuf_iterator<char>(stream), {});
-    KolvaneDictionary dictionary;
-    boost::interprocess::ibufferstream image(bytes.data(), bytes.size());
-    dictionary.Load(image);
-    const auto translator = Varnel::CreateStringTranslator();
-    Load(*translator, bytes);
-    translator->MakeDefault();
-    for (const std::string& key : KeysOf(bytes)) {
-      constexpr int kUTF8 = 1;
-      const TranslatedString translated = dictionary.Translate(key.c_str(), &kUTF8);
-      std::vector<uint16_t> expected(translated.BufferSize()), coerced;
-      translated.CopyTo(expected.data(), translated.BufferSize(), true);
-      Varnel::GetUTF16LE(Varnel::MakeData(Varnel::kTypeLocaleIndependentUTF8, key.data(), static_cast<uint32_t>(key.size())), coerced);
-      ASSERT_EQ(coerced, expected) << key;
-      expected.pop_back();
-      ASSERT_EQ(TranslatedBy(*translator, key), expected) << key;
-      ++compared;
-    }
-  }
-  EXPECT_GT(compared, 10000u);
-  EXPECT_EQ(VRKHostPlugInTerminate(plugIn), 0u);
+TEST_F(PlugInTest, SurvivesEveryFault) {
+  Translators::plugIn = plugIn;
+  using T = Translators;
+  const Phase<T> phases[] = {
+      {"start-up",
+       &T::StartUp,
+       Hears::kAll,
+       50,
+       15,
+       kStarted,
+       {"", "objects 1 handlers 1 blocks 1 ", "objects 1 handlers 1 factories 2 blocks 3 "}},
+      {"start-up again",
+       &T::StartUpAgain,
+       Hears::kAll,
+       45,
+       15,
+       "objects 4 handlers 4 factories 2 coercions 3 blocks 7 ",
+       {"objects 3 handlers 3 coercions 3 blocks 4 ", "objects 4 handlers 4 coercions 3 blocks 5 ",
+        "objects 4 handlers 4 factories 2 blocks 6 "}},
+      {"load text", &T::LoadText, Hears::kAll, 60, 15},
+      {"load binary", &T::LoadBinary, Hears::kAll, 60, 30},
+      {"load bytes", &T::LoadBytes, Hears::kAll, 60, 15},
+      {"translate", &T::Translate, Hears::kAll, 40, 5},
+      {"translate key", &T::TranslateKey, Hears::kAll, 50, 10},
+      {"coerce", &T::Coerce, Hears::kAll, 45, 8},
+      {"create of default", &T::CreateOfDefault, Hears::kAll, 20, 5, "objects 4 handlers 4 factories 2 coercions 3 blocks 7 "},
+      {"make default", &T::MakeDefault, Hears::kAll, 5, 0},
+      {"death", &T::Die, Hears::kNothing, 4, 0, "objects 2 handlers 2 factories 2 coercions 3 blocks 5 "},
+      {"shut-down", &T::ShutDown, Hears::kNothing, 6, 0, "objects 2 handlers 2 blocks 2 "}};
+  for (const auto& phase : phases) SweepPhase(phase);
 }
 
 }  // namespace

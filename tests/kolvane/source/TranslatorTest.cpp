@@ -1,6 +1,5 @@
 // The plug-in's translator, default translator and coercion, apart from its entry points.
 
-#include "AllocationMeter.h"
 #include "Data.h"
 #include "Exceptions.h"
 #include "ResultCodes.h"
@@ -50,25 +49,20 @@ TEST(Translator, LoadsImagesAndTranslates) {
 }
 
 TEST(Translator, SurvivesEveryFailedAllocation) {
-  size_t failures = 0;
-  for (bool failed = true; failed; failures += failed) {
+  SweepFaults(3, [](Fault& fault) {
     Units result(2, 5);
     VRKResult code = 0;
     {
-      const AllocationMeter meter(failures + 1);
+      const AllocationMeter meter(fault);
       code = CodeOf([&] {
         const Shared translator = CreateStringTranslatorImpl({});
         translator->SetTranslations("\"$$$/k=a text of some length\"\n", 0);
         translator->TranslateString("$$$/k=default", 0, result);
       });
-      failed = meter.Failed();
     }
-    EXPECT_EQ(code, failed ? kResultOutOfMemory : 0);
-    if (failed) {
-      EXPECT_EQ(result, Units(2, 5));
-    }
-  }
-  EXPECT_GT(failures, 3u);
+    EXPECT_EQ(code, fault.hasFired ? kResultOutOfMemory : 0);
+    EXPECT_EQ(result == Units(2, 5), fault.hasFired);
+  });
 }
 
 TEST(DefaultTranslator, IsKnownToBeDead) {
