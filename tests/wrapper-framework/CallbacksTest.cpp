@@ -191,7 +191,9 @@ TEST_F(CallbacksTest, MayDeleteThemselvesWithTheirObjects) {
     EXPECT_EQ(VRKObjectDeliverMessage(object.Get(), died, {}, 1), code);
     EXPECT_EQ(Alive(), "objects 1 ");
   }
+  answer = 0;
   new Handler(take, object.Get(), true);
+  object.Reset();
 }
 
 // Reaches the callbacks as another kernel would.

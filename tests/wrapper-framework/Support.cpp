@@ -67,7 +67,7 @@ bool CallTrace::Strikes(const std::string& operation) {
 
 // Does later what a call is kept from giving up now.
 std::function<void()> CallTrace::Again(const VRKHostTraceCall& call) {
-  const uint32_t handle = call.arguments[0].number;
+  const uint32_t handle = call.arguments[0].number, object = call.argumentCount > 1 ? call.arguments[1].number : 0;
   const auto pointer = [&call](uint32_t i) { return i < call.argumentCount ? const_cast<void*>(call.arguments[i].pointer) : nullptr; };
   void *const first = pointer(0), *const second = pointer(1), *const third = pointer(2);
   const std::map<std::string, std::function<void()>> giveUps = {
@@ -76,8 +76,7 @@ std::function<void()> CallTrace::Again(const VRKHostTraceCall& call) {
       {"VRKDictionaryRelease", [=] { VRKDictionaryRelease(VRKDictionary{handle}); }},
       {"VRKObjectRelease", [=] { VRKObjectRelease(VRKObject{handle}); }},
       {"VRKMemoryDeallocate", [=] { VRKMemoryDeallocate(first); }},
-      {"VRKMessageHandlerRemove",
-       [=, object = call.arguments[1].number] { VRKMessageHandlerRemove(VRKMessageHandler{handle}, VRKObject{object}); }},
+      {"VRKMessageHandlerRemove", [=] { VRKMessageHandlerRemove(VRKMessageHandler{handle}, VRKObject{object}); }},
       {"VRKDataCoercionHandlerRemove", [=] { VRKDataCoercionHandlerRemove(AsCallback<VRKDataCoercionCallback>(first), second, 0, 0); }},
       {"VRKObjectFactoryUnregister", [=] { VRKObjectFactoryUnregister(0, AsCallback<VRKObjectFactoryCallback>(second), third); }}};
   const auto found = giveUps.find(call.operation);
