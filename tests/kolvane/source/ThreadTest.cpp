@@ -86,7 +86,9 @@ class Worker {
       const DataRef image = DataOf(kTypeUTF8, "\"$$$/" + name + "=" + text + "\"\n");
       EXPECT_EQ(Send(object, kMessageSetTranslations, kParameterTranslations, image, parameters), 0u);
     }
-    if (round % 3 != 0) EXPECT_EQ(Send(object, kMessageMakeDefault, nullptr, {}, parameters), 0u);
+    if (round % 3 != 0) {
+      EXPECT_EQ(Send(object, kMessageMakeDefault, nullptr, {}, parameters), 0u);
+    }
     EXPECT_EQ(Translated(object, "$$$/own" + std::to_string(number) + "=none").text, text);
     EXPECT_EQ(Translated(object, "$$$/shared=none").text, text);
     const std::string other = "$$$/own" + std::to_string((number + 1) % kThreads) + "=none";
