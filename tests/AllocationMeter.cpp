@@ -1,35 +1,99 @@
 #include "AllocationMeter.h"
 
+#include <malloc.h>
+
+#include <algorithm>
 #include <atomic>
 #include <cstdlib>
 #include <new>
+#include <utility>
 
 namespace {
 
-Fault* gFault = nullptr;  // while there is a meter
-size_t gTotalBytes = 0;
-ptrdiff_t gBlocksBefore = 0;
 std::atomic<ptrdiff_t> gLiveBlocks = 0;
 
-void* Allocate(size_t size) {
-  if (gFault != nullptr) {
-    gTotalBytes += size;
-    if (gFault->Strikes()) return nullptr;
-  }
+// While there is a meter:
+Fault* gFault = nullptr;
+size_t gMost = 0;
+size_t gTotalBytes = 0;
+ptrdiff_t gBlocksBefore = 0;
+ptrdiff_t gLiveBytes = 0;
+ptrdiff_t gPeakBytes = 0;
+
+bool MayAllocate(size_t size) {
+  if (gFault == nullptr) return true;
+  const bool isTooLarge = size > gMost;
+  gFault->hasFired |= isTooLarge;
+  return !gFault->Strikes() && !isTooLarge;
+}
+
+void CountAllocated(size_t size) {
   ++gLiveBlocks;
-  return std::malloc(size != 0 ? size : 1);
+  if (gFault == nullptr) return;
+  gTotalBytes += size;
+  gLiveBytes += static_cast<ptrdiff_t>(size);
+  gPeakBytes = std::max(gPeakBytes, gLiveBytes);
+}
+
+void CountFreed(size_t size) {
+  --gLiveBlocks;
+  if (gFault != nullptr) gLiveBytes -= static_cast<ptrdiff_t>(size);
+}
+
+size_t SizeOf(void* block) {
+#ifdef _WIN32
+  return _msize(block);
+#else
+  return malloc_usable_size(block);
+#endif
+}
+
+void* Allocate(size_t size) {
+  void* const block = MayAllocate(size) ? std::malloc(size != 0 ? size : 1) : nullptr;
+  if (block != nullptr) CountAllocated(gFault != nullptr ? SizeOf(block) : size);
+  return block;
 }
 
 void Free(void* block) {
-  if (block != nullptr) --gLiveBlocks;
+  if (block != nullptr) CountFreed(gFault != nullptr ? SizeOf(block) : 0);
   std::free(block);
 }
 
 }  // namespace
 
-AllocationMeter::AllocationMeter(Fault& fault) {
+#ifdef MEMORY_IS_WRAPPED
+
+// The names that the linker gives platform::AllocateMemory and FreeMemory, which take large memory
+// from the system and other from operator new, and what stands in for them.
+extern "C" {
+void* __real__ZN8platform14AllocateMemoryEm(size_t size) noexcept;
+void __real__ZN8platform10FreeMemoryEPvm(void* memory, size_t size) noexcept;
+
+void* __wrap__ZN8platform14AllocateMemoryEm(size_t size) noexcept {
+  if (!MayAllocate(size)) return nullptr;
+  Fault* const fault = std::exchange(gFault, nullptr);
+  void* const memory = __real__ZN8platform14AllocateMemoryEm(size);
+  gFault = fault;
+  if (memory != nullptr) CountAllocated(size);
+  return memory;
+}
+
+void __wrap__ZN8platform10FreeMemoryEPvm(void* memory, size_t size) noexcept {
+  if (memory != nullptr) CountFreed(size);
+  Fault* const fault = std::exchange(gFault, nullptr);
+  __real__ZN8platform10FreeMemoryEPvm(memory, size);
+  gFault = fault;
+}
+}
+
+#endif
+
+AllocationMeter::AllocationMeter(Fault& fault, size_t most) {
+  gMost = most;
   gTotalBytes = 0;
   gBlocksBefore = gLiveBlocks;
+  gLiveBytes = 0;
+  gPeakBytes = 0;
   gFault = &fault;
 }
 
@@ -37,14 +101,20 @@ AllocationMeter::~AllocationMeter() {
   gFault = nullptr;
 }
 
+bool AllocationMeter::Failed() const {
+  return gFault->hasFired;
+}
 size_t AllocationMeter::TotalBytes() const {
   return gTotalBytes;
 }
 ptrdiff_t AllocationMeter::LiveBlocks() const {
   return gLiveBlocks - gBlocksBefore;
 }
-bool AllocationMeter::Failed() const {
-  return gFault->hasFired;
+ptrdiff_t AllocationMeter::LiveBytes() const {
+  return gLiveBytes;
+}
+ptrdiff_t AllocationMeter::PeakBytes() const {
+  return gPeakBytes;
 }
 ptrdiff_t AllocationMeter::LiveBlocksInAll() {
   return gLiveBlocks;

@@ -1,7 +1,9 @@
-// Watches, and fails, what the code under test allocates with operator new.
+// Watches, and fails, what the code under test allocates: with operator new everywhere, and where a
+// test's binary wraps it (tests/CMakeLists.txt) also the memory that comes from the system itself.
 #pragma once
 
 #include <cstddef>
+#include <limits>
 
 // Where something is to fail: the nth time (from 1), or never (0).
 struct Fault {
@@ -20,15 +22,26 @@ struct Fault {
 // Counts from its construction on; one at a time.
 class AllocationMeter {
  public:
-  explicit AllocationMeter(size_t failAt = 0) : AllocationMeter(own) { own.at = failAt; }
-  explicit AllocationMeter(Fault& fault);
+  static constexpr size_t kAnySize = std::numeric_limits<size_t>::max();
+
+  // Allocations of more than `most` bytes fail, too.
+  explicit AllocationMeter(size_t failAt = 0, size_t most = kAnySize)
+      : AllocationMeter(own, most) {
+    own.at = failAt;
+  }
+  explicit AllocationMeter(Fault& fault, size_t most = kAnySize);
   ~AllocationMeter();
   AllocationMeter(const AllocationMeter&) = delete;
   AllocationMeter& operator=(const AllocationMeter&) = delete;
 
-  size_t TotalBytes() const;
-  ptrdiff_t LiveBlocks() const;  // those freed that were allocated before count less than nothing
   bool Failed() const;
+  size_t TotalBytes() const;
+
+  // What is freed that was allocated before counts less than nothing.
+  ptrdiff_t LiveBlocks() const;
+  ptrdiff_t LiveBytes() const;
+
+  ptrdiff_t PeakBytes() const;  // the most bytes that lived at a time
 
   // Since the program began, with a meter or without.
   static ptrdiff_t LiveBlocksInAll();

@@ -29,6 +29,7 @@ class GrowableBuffer {
 
   // Appends elements that hold nothing yet, and returns their place.
   std::span<Element> Extend(size_t count) {
+    if (count > kMostElements - length) throw std::bad_alloc();  // before the sum wraps, on 32 bits
     Reserve(length + count);
     const std::span<Element> place(storage.get() + length, count);
     length += static_cast<uint32_t>(count);

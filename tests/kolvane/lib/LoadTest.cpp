@@ -3,7 +3,6 @@
 
 #include <algorithm>
 #include <boost/interprocess/streams/bufferstream.hpp>
-#include <chrono>
 #include <cstdio>
 #include <fstream>
 #include <optional>
@@ -400,45 +399,6 @@ TEST(Load, ReadsEveryKindOfStream) {
     }
   }
   std::remove(path.c_str());
-}
-
-// Counts that promise the world.
-TEST(Load, AllocatesNoMoreThanTheImageJustifies) {
-  for (std::string image : ValidImages()) {
-    for (size_t at = 0; at + 4 <= image.size(); ++at) {
-      std::string promising = image;
-      promising.replace(at, 4, "\xFF\xFF\xFF\x7F");
-      boost::interprocess::ibufferstream stream(promising.data(), promising.size());
-      DictionaryTable table;
-      AllocationMeter meter;
-      table.Load(stream);
-      ASSERT_LT(meter.TotalBytes(), 12288 + 64 * image.size()) << at;
-    }
-  }
-}
-
-// Keys of which every one falls into the same bucket: loading 32 times as many must not take 1024
-// times as long. Between the two there is room for caches and for a busy machine.
-TEST(Load, TakesTimeLinearInTheImage) {
-  const auto secondsFor = [](int count) {
-    std::string image;
-    for (int i = 0; i < count; ++i) {
-      std::string key = "/App/Page/Dialog/Item000000000/Label";
-      const std::string number = std::to_string(i);
-      for (size_t digit = 0; digit < number.size(); ++digit) key[22 + digit] = number[digit];
-      image += "\"$$$" + key + "=x\"\n";
-    }
-    double best = 1e9;
-    for (int round = 0; round < 5; ++round) {
-      const auto start = std::chrono::steady_clock::now();
-      DictionaryTable table;
-      Load(table, image);
-      const std::chrono::duration<double> taken = std::chrono::steady_clock::now() - start;
-      best = std::min(best, taken.count());
-    }
-    return best;
-  };
-  EXPECT_LT(secondsFor(160000), 300 * secondsFor(5000));
 }
 
 }  // namespace
