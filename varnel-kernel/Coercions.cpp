@@ -1,6 +1,7 @@
 #include "Coercions.h"
 
 #include <algorithm>
+#include <iterator>
 #include <memory>
 #include <utility>
 
@@ -59,8 +60,10 @@ VRKResult Coercions::Convert(VRKData data, VRKToken fromType, VRKToken toType, V
 
 const Coercion* Coercions::LatestBefore(uint64_t number, VRKToken fromType,
                                         VRKToken toType) const noexcept {
-  const auto found = std::find_if(installed.rbegin(), installed.rend(), [&](const Coercion& each) {
-    return each.number < number && each.fromType == fromType && each.toType == toType;
+  const auto end = std::ranges::lower_bound(installed, number, {}, &Coercion::number);
+  const auto latest = std::make_reverse_iterator(end);
+  const auto found = std::find_if(latest, installed.rend(), [&](const Coercion& each) {
+    return each.fromType == fromType && each.toType == toType;
   });
   return found == installed.rend() ? nullptr : &*found;
 }

@@ -4,6 +4,7 @@
 #include <array>
 #include <mutex>
 #include <new>
+#include <stdexcept>
 
 #include "Callbacks.h"
 #include "Coercions.h"
@@ -59,6 +60,8 @@ VRKResult Guarded(Body body) noexcept {
   try {
     return body();
   } catch (const std::bad_alloc&) {
+    return kVRKOutOfMemory;
+  } catch (const std::length_error&) {  // a vector that 32 bits cannot address
     return kVRKOutOfMemory;
   }
 }

@@ -8,10 +8,10 @@
 #include <limits>
 #include <memory>
 #include <new>
-#include <random>
 #include <utility>
 
 #include "Memory.h"
+#include "ProcessSeed.h"
 
 namespace tovali_private {
 namespace {
@@ -21,14 +21,6 @@ constexpr uint32_t kMostSlots = 1u << 31;
 
 constexpr uint32_t MostRuns(uint32_t slotCount) noexcept {
   return slotCount / 4 * 3;
-}
-
-uint64_t ProcessSeed() {
-  static const uint64_t seed = [] {
-    std::random_device random;
-    return uint64_t{random()} << 32 | random();
-  }();
-  return seed;
 }
 
 // Whoever has found the run copies its bytes next: they are on their way while keys are compared.
@@ -57,7 +49,7 @@ KeyIndex::Slots KeyIndex::MakeSlots(size_t count) {
 }
 
 KeyIndex::KeyIndex()
-    : seed(ProcessSeed()),
+    : seed(platform::ProcessSeed()),
       mask(kFirstSlots - 1),
       most(MostRuns(kFirstSlots)),
       slots(MakeSlots(kFirstSlots)) {}

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "Finding.h"
+#include "SeededHash.h"
 
 struct Definition {
   std::string key;              // bytes
@@ -30,5 +31,5 @@ class Definitions {
 
  private:
   std::vector<Definition> definitions;
-  std::unordered_map<std::string, size_t> places;
+  std::unordered_map<std::string, size_t, tovali_private::SeededHash> places;
 };

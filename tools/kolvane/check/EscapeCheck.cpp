@@ -22,21 +22,25 @@ bool IsNameUnit(uint16_t unit) noexcept {
 }
 
 // Goes through a value as Unescape does, and keeps of each unit that comes out where it came from.
+// Names are looked for after the escapes, of which any may stand before them or behind.
 class EscapeCheck {
  public:
-  explicit EscapeCheck(Units checked) : value(checked) {}
+  EscapeCheck(Units checked, size_t mostFaults)
+      : value(checked), most(mostFaults), room(mostFaults) {}
 
   std::vector<EscapeFault> Run() {
     for (size_t at = 0; at < value.size();) at += TakeEscape(at);
-    for (size_t at = 0; at < decoded.size(); ++at) CheckName(at);
+    room = most;
+    for (size_t at = 0; at < decoded.size() && room != 0; ++at) CheckName(at);
     std::ranges::stable_sort(faults, {}, &EscapeFault::at);
+    if (faults.size() > most) faults.resize(most);
     return std::move(faults);
   }
 
  private:
   size_t TakeEscape(size_t at) {
     const DecodedStart start = tovali_private::DecodeStart(value.subspan(at));
-    CheckEscape(start, at);
+    if (room != 0) CheckEscape(start, at);
     for (size_t i = 0; i < start.count; ++i) {
       decoded.push_back(start.units[i]);
       origins.push_back(at + (start.count == start.taken ? i : 0));
@@ -87,9 +91,12 @@ class EscapeCheck {
 
   void Report(const Rule& rule, size_t at, std::string message) {
     faults.push_back({&rule, at, std::move(message)});
+    --room;
   }
 
   Units value;
+  size_t most;
+  size_t room;  // for what is found of one kind
   std::vector<uint16_t> decoded;
   std::vector<size_t> origins;
   std::vector<EscapeFault> faults;
@@ -97,7 +104,7 @@ class EscapeCheck {
 
 }  // namespace
 
-std::vector<EscapeFault> FaultsOfEscapes(std::span<const uint16_t> value) {
+std::vector<EscapeFault> FaultsOfEscapes(Units value, size_t most) {
   if (tovali_private::EscapeStarts::RunBefore(value) == value.size()) return {};
-  return EscapeCheck(value).Run();
+  return EscapeCheck(value, most).Run();
 }

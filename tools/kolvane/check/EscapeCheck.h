@@ -14,5 +14,6 @@ struct EscapeFault {
   std::string message;
 };
 
-// Takes a value as a text dictionary writes it. Unpaired surrogates are shown replaced.
-std::vector<EscapeFault> FaultsOfEscapes(std::span<const uint16_t> value);
+// The first of them, at most `most`. Takes a value as a text dictionary writes it. Unpaired
+// surrogates are shown replaced.
+std::vector<EscapeFault> FaultsOfEscapes(std::span<const uint16_t> value, size_t most);

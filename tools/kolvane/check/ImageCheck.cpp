@@ -14,6 +14,7 @@
 #include "DictionaryTable.h"
 #include "Messages.h"
 #include "Rules.h"
+#include "SeededHash.h"
 #include "StoredGroups.h"
 #include "Text.h"
 
@@ -163,7 +164,7 @@ class ImageCheck {
   StoredImage image;
   LoadStatus status;
   Definitions definitions;
-  std::unordered_map<std::string, const StoredGroup*> definingGroups;
+  std::unordered_map<std::string, const StoredGroup*, tovali_private::SeededHash> definingGroups;
   size_t number = 0;
 };
 

@@ -77,9 +77,7 @@ class LineCheck {
   }
 
   void CheckEscapes() {
-    std::vector<EscapeFault> faults = FaultsOfEscapes(split->value);
-    if (faults.size() > kMostFaults) faults.resize(kMostFaults);
-    for (const EscapeFault& fault : faults) {
+    for (const EscapeFault& fault : FaultsOfEscapes(split->value, kMostFaults)) {
       Report(*fault.rule, IndexOf(split->value) + fault.at, fault.message);
     }
   }

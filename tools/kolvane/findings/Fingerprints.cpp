@@ -7,6 +7,7 @@
 #include <unordered_map>
 
 #include "PlaceText.h"
+#include "SeededHash.h"
 
 namespace {
 
@@ -29,7 +30,7 @@ std::string Identity(const Finding& finding) {
 
 std::vector<std::string> Fingerprints(std::span<const Finding> findings) {
   std::vector<std::string> fingerprints;
-  std::unordered_map<std::string, size_t> counts;
+  std::unordered_map<std::string, size_t, tovali_private::SeededHash> counts;
   for (const Finding& finding : findings) {
     const std::string identity = Identity(finding);
     const size_t before = counts[identity]++;
