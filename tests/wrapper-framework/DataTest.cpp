@@ -235,6 +235,12 @@ TEST_F(DataTest, MayBeNestedDeeply) {
   });
 }
 
+TEST_F(DataTest, MayBeSharedOnlyByAMillionValues) {
+  DataRef shared = Text("x");
+  for (int i = 0; i < 60; ++i) shared = i % 2 == 0 ? Wrapped(List({shared, shared})) : Wrapped(Dictionary({{"a", shared}, {"b", shared}}));
+  EXPECT_THROW(AsValue(shared), std::length_error);
+}
+
 // Such a list never dies, so its kernel ends with it.
 TEST(DataThatContainsItself, IsNestedTooDeeply) {
   ASSERT_EQ(VRKHostStart(), 0u);

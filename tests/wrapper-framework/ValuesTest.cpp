@@ -108,6 +108,17 @@ TEST(Values, NaNEqualsNothingExceptInWhatIsShared) {
   EXPECT_FALSE(dictionary == Dictionary({{"a", nan}}));
 }
 
+// As many places as no machine could visit, of which each is one of sixty.
+TEST(Values, CompareWhatIsSharedOnce) {
+  const auto nested = [](double innermost) {
+    value_t value(innermost);
+    for (int i = 0; i < 60; ++i) value = i % 2 == 0 ? value_t(Array({value, value})) : value_t(Dictionary({{"a", value}, {"b", value}}));
+    return value;
+  };
+  EXPECT_TRUE(nested(1) == nested(1));
+  EXPECT_FALSE(nested(1) == nested(2));
+}
+
 TEST(Names, AreInternedAndOrderedByBytes) {
   static const char text[] = "interned", same[] = "interned", none[] = "";
   const name_t name(text);

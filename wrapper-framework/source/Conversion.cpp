@@ -1,9 +1,11 @@
 #include "Conversion.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <memory>
 #include <optional>
 #include <stdexcept>
+#include <string>
 #include <utility>
 #include <vector>
 
@@ -70,34 +72,39 @@ class ListFrame final : public Frame {
 
 class DictionaryFrame final : public Frame {
  public:
-  explicit DictionaryFrame(DictionaryRef source)
-      : dictionary(std::move(source)), keys(dictionary.CreateKeyList()) {}
+  explicit DictionaryFrame(DictionaryRef source) : dictionary(std::move(source)) {
+    const ListRef keyList = dictionary.CreateKeyList();
+    const uint32_t size = keyList.GetSize();
+    keys.reserve(size);
+    for (uint32_t i = 0; i < size; ++i) {
+      const VRKToken token = ExtractData<VRKToken>(keyList.GetEntry(i));
+      keys.emplace_back(TokenName(token), token);
+    }
+    std::ranges::sort(keys, {}, &Key::first);
+  }
 
   bool Advance() override {
-    if (index >= keys.GetSize()) return false;
-    key = keys.GetEntry(index++);
-    keyToken = ExtractData<VRKToken>(key);
-    entry = dictionary.GetEntry(keyToken);
+    if (index >= keys.size()) return false;
+    entry = dictionary.GetEntry(keys[index++].second);
     return true;
   }
 
   const DataRef& Datum() const override { return entry; }
 
   void Accept(orvane::value_t value) override {
-    result.insert_or_assign(TokenName(keyToken), value);
+    result.insert_or_assign(keys[index - 1].first, value);
     entry.Reset();
-    key.Reset();
   }
 
   orvane::value_t Result() const override { return orvane::value_t(result); }
 
  private:
+  using Key = std::pair<orvane::name_t, VRKToken>;
+
   DictionaryRef dictionary;
-  ListRef keys;
+  std::vector<Key> keys;  // in the order in which the result has them, to be put at its end
   orvane::dictionary_t result;
-  uint32_t index = 0;
-  DataRef key;
-  VRKToken keyToken{};
+  size_t index = 0;
   DataRef entry;
 };
 
@@ -111,11 +118,17 @@ class Conversion {
   orvane::value_t Run();
 
  private:
+  void CountValue();
+  std::string Counted(std::string text);
+
   std::vector<std::unique_ptr<Frame>> frames;
   std::optional<orvane::value_t> finished;  // what the innermost frame has to accept
+  size_t valueCount = 0;
+  uint64_t textBytes = 0;
 };
 
 void Conversion::Begin(const DataRef& datum) {
+  CountValue();
   DataRef source(datum);
   VRKToken type{};
   ThrowIfFailed(VRKDataGetData(source.Get(), nullptr, nullptr, &type));
@@ -129,7 +142,7 @@ void Conversion::Begin(const DataRef& datum) {
   } else if (becomes(kTypeBool)) {
     finished.emplace(GetBool(coerced));
   } else if (becomes(kTypeUTF8)) {
-    finished.emplace(GetUTF8(coerced));
+    finished.emplace(Counted(GetUTF8(coerced)));
   } else if (becomes(kTypeNull)) {
     finished.emplace();
   } else if (becomes(kTypeToken)) {
@@ -143,6 +156,18 @@ void Conversion::Begin(const DataRef& datum) {
   } else {
     throw std::domain_error("Attempt to convert unsupported data type in Varnel::AsValue");
   }
+}
+
+void Conversion::CountValue() {
+  if (++valueCount > kValueLimit) {
+    throw std::length_error("Lists and dictionaries hold too much in Varnel::AsValue");
+  }
+}
+
+std::string Conversion::Counted(std::string text) {
+  textBytes += text.size();
+  if (textBytes > kTextLimit) throw std::length_error("Too much text in Varnel::AsValue");
+  return text;
 }
 
 void Conversion::Enter(std::unique_ptr<Frame> frame) {

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstddef>
+#include <set>
 
 namespace orvane {
 namespace {
@@ -204,7 +205,7 @@ void dictionary_t::insert_or_assign(name_t name, const value_t& value) {
 class comparison {
  public:
   bool compare(const array_t& left, const array_t& right) {
-    if (left.shares_with(right)) return true;
+    if (left.shares_with(right) || is_known(left, right)) return true;
     return std::ranges::equal(left.elements(), right.elements(),
                               [this](const value_t& leftElement, const value_t& rightElement) {
                                 return compare_or_defer(leftElement, rightElement);
@@ -212,7 +213,7 @@ class comparison {
   }
 
   bool compare(const dictionary_t& left, const dictionary_t& right) {
-    if (left.shares_with(right)) return true;
+    if (left.shares_with(right) || is_known(left, right)) return true;
     return std::ranges::equal(left.elements(), right.elements(),
                               [this](const auto& leftPair, const auto& rightPair) {
                                 return leftPair.first == rightPair.first &&
@@ -230,6 +231,14 @@ class comparison {
   }
 
  private:
+  // Whether the two were compared before, or are being compared, which decides for them here too.
+  // Only what is shared can be met again.
+  template <class Sequence>
+  bool is_known(const Sequence& left, const Sequence& right) {
+    if (left.use_count() == 1 || right.use_count() == 1) return false;
+    return !known.emplace(left.elements().data(), right.elements().data()).second;
+  }
+
   bool compare_inside(const value_t& left, const value_t& right) {
     if (const array_t* const array = left.get_if<array_t>()) {
       return compare(*array, *right.get_if<array_t>());
@@ -245,6 +254,7 @@ class comparison {
   }
 
   std::vector<std::pair<const value_t*, const value_t*>> deferred;
+  std::set<std::pair<const void*, const void*>> known;
 };
 
 bool operator==(const value_t& left, const value_t& right) {
