@@ -35,6 +35,16 @@ void* Arena::HandOut(Chunk& chunk, uint8_t* place) noexcept {
   return ::new (place) Header{&chunk} + 1;
 }
 
+Arena& Arena::operator=(Arena&& other) noexcept {
+  Retire();
+  current = std::exchange(other.current, nullptr);
+  next = other.next;
+  left = std::exchange(other.left, 0);
+  nextChunkSize = other.nextChunkSize;
+  handedOut = std::exchange(other.handedOut, 0);
+  return *this;
+}
+
 void Arena::Expect(uint64_t byteCount) noexcept {
   constexpr size_t kMost = platform::kHugePage;
   const size_t expected = byteCount < kMost / 2 ? static_cast<size_t>(byteCount) : kMost;
@@ -48,11 +58,13 @@ void* Arena::Allocate(uint64_t size) {
     const bool isLarge = needed > nextChunkSize / 4;
     if (isLarge) {
       Chunk* const own = CreateChunk(sizeof(Chunk) + needed);
+      handedOut += needed;
       return HandOut(*own, reinterpret_cast<uint8_t*>(own + 1));
     }
     BeginChunk();
   }
   left -= static_cast<size_t>(needed);
+  handedOut += needed;
   return HandOut(*current, std::exchange(next, next + needed));
 }
 

@@ -18,11 +18,17 @@ class Arena {
   Arena& operator=(const Arena&) = delete;
   ~Arena() { Retire(); }
 
+  // Takes over the other's chunk.
+  Arena& operator=(Arena&& other) noexcept;
+
   // Has the next chunk be large enough for this many bytes, as far as chunks become so large.
   void Expect(uint64_t byteCount) noexcept;
 
   // Aligned for pointers. Throws std::bad_alloc.
   void* Allocate(uint64_t size);
+
+  // The bytes that it has handed out since it was made, whether they were freed or not.
+  uint64_t HandedOut() const noexcept { return handedOut; }
 
   // Gives back what any arena has handed out.
   static void Free(void* memory) noexcept;
@@ -40,6 +46,7 @@ class Arena {
   uint8_t* next = nullptr;
   size_t left = 0;
   size_t nextChunkSize = size_t{1} << 12;
+  uint64_t handedOut = 0;
 };
 
 }  // namespace tovali_private

@@ -120,6 +120,15 @@ std::unique_ptr<DictionaryEntry> DictionaryEntry::Create(EntryMemory& memory, co
   return Create(memory, key, {reinterpret_cast<const uint8_t*>(units.data()), units.size_bytes()});
 }
 
+std::unique_ptr<DictionaryEntry> DictionaryEntry::CopyIn(EntryMemory& memory) const {
+  return Create(memory, *this,
+                {reinterpret_cast<const uint8_t*>(value.Data()), size_t{value.ByteLength()}});
+}
+
+uint64_t DictionaryEntry::MemorySize() const noexcept {
+  return sizeof(KeyedRun) + sizeof(DictionaryEntry) + uint64_t{Bytes().size()} + value.ByteLength();
+}
+
 uint32_t DictionaryEntry::SerializedSize() const {
   return ByteRunKey::SerializedSize() + 2 * value.Length();
 }

@@ -112,6 +112,14 @@ class KeyedRun final : public ByteRunValue {
 
 // What lookups look into, apart from what they do not. It may end before what was made in it.
 struct EntryMemory {
+  // For entries from so many bytes of text, or as many of their own.
+  void Expect(uint64_t byteCount) noexcept {
+    runs.Expect(byteCount);
+    entries.Expect(byteCount / 2);
+  }
+
+  uint64_t HandedOut() const noexcept { return runs.HandedOut() + entries.HandedOut(); }
+
   Arena runs;
   Arena entries;
 };
@@ -126,6 +134,9 @@ class DictionaryEntry final : public ByteRunKey {
   static std::unique_ptr<DictionaryEntry> Create(EntryMemory& memory, const ByteRunKey& key,
                                                  std::span<const uint16_t> text);
 
+  // The same key and value, on no chain.
+  std::unique_ptr<DictionaryEntry> CopyIn(EntryMemory& memory) const;
+
   ~DictionaryEntry() override { run.entry = nullptr; }
   static void operator delete(void* entry) noexcept { Arena::Free(entry); }
 
@@ -133,6 +144,9 @@ class DictionaryEntry final : public ByteRunKey {
   uint32_t Write(std::ostream& out, bool binary, const int* selector) const override;
   uint32_t WriteKey(std::ostream& out, bool binary, const int* selector) const override;
   uint32_t WriteValue(std::ostream& out, bool binary, const int* selector) const override;
+
+  // About what it was handed of its EntryMemory.
+  uint64_t MemorySize() const noexcept;
 
   const KolvaneString& Value() const noexcept { return value; }
   KeyedRun& Run() const noexcept { return run; }

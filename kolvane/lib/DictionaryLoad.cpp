@@ -55,6 +55,18 @@ void CheckTextEnd(std::istream& image, TextEncoding encoding, LoadStatus& status
 
 }  // namespace
 
+// Also where a load throws.
+class DictionaryTable::MoveAtEnd {
+ public:
+  explicit MoveAtEnd(DictionaryTable& loadedTable) noexcept : table(loadedTable) {}
+  MoveAtEnd(const MoveAtEnd&) = delete;
+  MoveAtEnd& operator=(const MoveAtEnd&) = delete;
+  ~MoveAtEnd() { table.MoveFromMostlyDeadMemory(); }
+
+ private:
+  DictionaryTable& table;
+};
+
 void DictionaryTable::Load(std::istream& image) {
   lastLoad = {};
   ++loadNumber;
@@ -64,9 +76,11 @@ void DictionaryTable::Load(std::istream& image) {
     case Recognised::kTooShort:
       lastLoad.damage = LoadDamage::kTooShort;
       break;
-    case Recognised::kText:
+    case Recognised::kText: {
+      const MoveAtEnd moving(*this);
       LoadText(image, *reader);
       break;
+    }
     case Recognised::kBinary:
       tovali_private::LoadBinary(*this, image, lastLoad);
       break;
@@ -77,8 +91,7 @@ void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
   lastLoad.format = ImageFormat::kText;
   lastLoad.encoding = reader.Encoding();
   const uint64_t size = SizeOf(image);
-  memory.runs.Expect(size);
-  memory.entries.Expect(size / 2);
+  memory.Expect(size);
   while (const uint16_t* line = reader.GetNextLine()) {
     if (line[0] == 0) continue;
     switch (StoreLine({line, reader.LineLength()})) {

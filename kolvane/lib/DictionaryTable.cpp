@@ -47,6 +47,7 @@ std::unique_ptr<DictionaryTable::DictionaryEntry> DictionaryTable::Detach(const 
   } else {
     index.Remove(found->Run());
   }
+  liveBytes -= found->MemorySize();
   Unlink(*found);
   return found;
 }
@@ -119,6 +120,7 @@ void DictionaryTable::DestroyEntries() noexcept {
       head = item->next;
     }
   }
+  liveBytes = 0;
 }
 
 // Returns whether the entry hides another one of its key.
@@ -128,6 +130,7 @@ bool DictionaryTable::LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntr
   item->next = buckets[bucket];
   if (item->next != nullptr) item->next->previous = item;
   buckets[bucket] = item;
+  liveBytes += item->MemorySize();
   const KeyedRun* const before = canBeFound ? index.Put(item->Run()) : nullptr;
   if (before == nullptr) return false;
   item->hidden = before->entry;

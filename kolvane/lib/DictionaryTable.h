@@ -1,7 +1,7 @@
 // The dictionary proper: entries in 1021 buckets, found by key, loaded from images.
 //
-// DictionaryTable.cpp keeps the entries, DictionaryLoad.cpp is the road of an image in, and
-// DictionaryLookup.cpp the road of a key through.
+// DictionaryTable.cpp keeps the entries, DictionaryLoad.cpp is the road of an image in,
+// DictionaryLookup.cpp the road of a key through, and DictionaryMove.cpp keeps their memory small.
 #pragma once
 
 #include <cstdint>
@@ -24,7 +24,9 @@ enum class StoredLine : uint8_t { kDropped, kAdded, kReplaced };
 
 // Owns its entries. Not for concurrent use: even a lookup writes to the table, and values are
 // shared with plain reference counts. The memory of an entry that is replaced comes back with that
-// of the entries that were made next to it.
+// of the entries that were made next to it, and at the end of a text load at the latest: entries
+// move there to memory of their own, as far as there is any, when more than four times as much was
+// used as they take, and 64 KB. Pointers to entries are good until the next load.
 class DictionaryTable {
  public:
   using DictionaryEntry = tovali_private::DictionaryEntry;
@@ -93,6 +95,8 @@ class DictionaryTable {
   void Clear() noexcept;
 
  private:
+  class MoveAtEnd;
+
   tovali_private::KeyedRun* FindRun(std::span<const uint8_t> key);
   void Settle(uint32_t bucket);
   void MakeRoom(uint32_t bucket);
@@ -101,9 +105,12 @@ class DictionaryTable {
   bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry,
                   bool canBeFound) noexcept;
   void Unlink(tovali_private::HashItem& item) noexcept;
+  void MoveFromMostlyDeadMemory() noexcept;
+  void MoveChain(tovali_private::HashItem*& head);
   void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
 
   tovali_private::EntryMemory memory;
+  uint64_t liveBytes = 0;  // what the entries take
 
   // The chains are the truth, as far as no group waits for its bucket. The index finds what a walk
   // from a chain's head would find first.

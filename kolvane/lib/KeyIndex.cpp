@@ -70,6 +70,11 @@ KeyedRun* KeyIndex::Put(KeyedRun& run) noexcept {
   return std::exchange(slot.run, &run);
 }
 
+void KeyIndex::Replace(const KeyedRun& run, KeyedRun& other) noexcept {
+  Slot& slot = slots[SlotFor(HashOf(run.Key()), run.Key())];
+  if (slot.run == &run) slot.run = &other;
+}
+
 // Closes the gap: each run behind it, up to the next empty slot, moves into it unless it is to be
 // looked for only from behind the gap on.
 void KeyIndex::Remove(const KeyedRun& run) noexcept {

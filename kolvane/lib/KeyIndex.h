@@ -32,6 +32,9 @@ class KeyIndex {
   // Makes the run the one that is found by its key. Returns the one that was, or null.
   KeyedRun* Put(KeyedRun& run) noexcept;
 
+  // Has a run found no longer, if it was, but another one of its key.
+  void Replace(const KeyedRun& run, KeyedRun& other) noexcept;
+
   // Forgets a run that Find finds.
   void Remove(const KeyedRun& run) noexcept;
 

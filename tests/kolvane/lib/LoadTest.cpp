@@ -351,23 +351,23 @@ TEST(Load, SurvivesEveryFailedAllocation) {
   }
 }
 
-// Dictionaries that are loaded over and over again, and a translation that outlives its own.
-TEST(Load, KeepsNoMemoryOfWhatItReplaced) {
-  std::string image;
-  for (int i = 0; i < 500; ++i) image += "\"$$$/key" + std::to_string(i) + "=value " + std::to_string(i) + "\"\n";
+// Dictionaries that are loaded over and over again, each time with a key that never comes again, and
+// a translation that outlives its own.
+TEST(Load, KeepsLittleMemoryOfWhatItReplaced) {
+  std::string first, second;
+  for (int i = 0; i < 500; ++i) (i < 250 ? first : second) += "\"$$$/key" + std::to_string(i) + "=value " + std::to_string(i) + "\"\n";
   const AllocationMeter meter;
   {
     std::optional<TranslatedString> kept;
     {
       DictionaryTable table;
-      ptrdiff_t most = 0;
-      for (int round = 0; round < 40; ++round) {
+      for (int round = 0; round < 600; ++round) {
+        const std::string image = first + "\"$$$/" + std::to_string(round) + "=x\"\n" + second;
         boost::interprocess::ibufferstream stream(image.data(), image.size());
         table.Load(stream);
-        if (round < 4) most = std::max(most, meter.LiveBlocks());
-        ASSERT_LE(meter.LiveBlocks(), most + 2) << round;
+        if (round == 100) kept.emplace(table.Translate("$$$/key77=none", nullptr));
+        ASSERT_LT(meter.LiveBytes(), 4 * 150 * (500 + round) + 300'000) << round;
       }
-      kept.emplace(table.Translate("$$$/key77=none", nullptr));
     }
     EXPECT_LE(meter.LiveBlocks(), 1);
     uint16_t units[9];
@@ -375,6 +375,44 @@ TEST(Load, KeepsNoMemoryOfWhatItReplaced) {
     EXPECT_TRUE(std::equal(units, units + 9, u"value 77"));
   }
   EXPECT_EQ(meter.LiveBlocks(), 0);
+}
+
+// Entries that hide others or lie in a wrong bucket, before a load that has all move.
+TEST(Load, MovesEntriesAsFarAsThereIsMemory) {
+  const std::string binary =
+      Image1_5(0, {{580, {{"/a", Bytes(u"1")}, {"/a", Bytes(u"2")}, {"/b", Bytes(u"3")}, {"/a", ""}, {"/a", Bytes(u"5")}}}});
+  std::string text = "\"$$$/a=6\"\n";
+  for (int i = 0; i < 20; ++i) text += "\"$$$/k=" + std::string(4000, static_cast<char>('a' + i)) + "\"\n";
+  SlowTwin twin;
+  for (const std::string& image : {binary, binary, text}) twin.Load(image);
+  size_t failures = 0;
+  for (bool failed = true; failed; failures += failed) {
+    DictionaryTable table;
+    Load(table, binary);
+    Load(table, binary);
+    ASSERT_EQ(table.LastLoad().entriesReplaced, 4u);
+    const TranslatedString kept = table.Translate("$$$/a", nullptr);
+    boost::interprocess::ibufferstream stream(text.data(), text.size());
+    {
+      const AllocationMeter meter(failures + 1);
+      try {
+        table.Load(stream);
+      } catch (const std::bad_alloc&) {
+      }
+      failed = meter.Failed();
+    }
+    if (table.LastLoad().damage == LoadDamage::kInterrupted) continue;
+    ASSERT_EQ(ContentsOf(table), twin.AllContents()) << failures;
+    for (const char16_t* const value : {u"6", u"2", u"", u"5", u"1", u"2", u"", u"5"}) {
+      const auto detached = table.Detach({reinterpret_cast<const uint8_t*>("/a"), 2, false});
+      ASSERT_NE(detached, nullptr);
+      ASSERT_EQ(Text(detached->Value()), value);
+    }
+    uint16_t units[2];
+    kept.CopyTo(units, 2, true);
+    ASSERT_EQ(units[0], '1');
+  }
+  EXPECT_GT(failures, 10u);
 }
 
 // Streams that hold all, a little, or nothing of what they read in memory.
