@@ -25,26 +25,6 @@ std::unique_ptr<DictionaryEntry> Entry(const std::string& key, const std::u16str
   return DictionaryEntry::Create(gMemory, Key(key), {reinterpret_cast<const uint8_t*>(bytes.data()), bytes.size()});
 }
 
-class Mortal : public RefCountObj {
- public:
-  explicit Mortal(int& deathCount) : deaths(deathCount) {}
-  ~Mortal() override { ++deaths; }
-
- private:
-  int& deaths;
-};
-
-TEST(RefCountObj, DiesOnceWithItsLastHandle) {
-  int deaths = 0;
-  auto* const object = new Mortal(deaths);
-  object->AddRef();
-  object->AddRef();
-  object->Release();
-  EXPECT_EQ(deaths, 0);
-  object->Release();
-  EXPECT_EQ(deaths, 1);
-}
-
 TEST(KolvaneString, SharesItsBytes) {
   const uint8_t bytes[] = {'a', 0, 'b', 0, 'c'};
   KolvaneString odd(bytes, 5);
@@ -169,30 +149,6 @@ TEST(DictionaryTable, FindsWhatAWalkOfTheChainFinds) {
   table.Clear();
   EXPECT_TRUE(ContentsOf(table).empty());
   EXPECT_EQ(table.Find(Key(keys[0])), nullptr);
-}
-
-// Blocks of every size, which must neither overlap nor move, freed in any order, some of them after
-// their arena.
-TEST(Arena, KeepsBlocksApart) {
-  std::mt19937 random(6);
-  std::vector<std::pair<uint8_t*, size_t>> blocks;
-  {
-    Arena arena;
-    for (int i = 0; i < 4000; ++i) {
-      const size_t size = random() % (i % 50 == 0 ? 20000 : 200);
-      auto* const block = static_cast<uint8_t*>(arena.Allocate(size));
-      ASSERT_EQ(reinterpret_cast<uintptr_t>(block) % alignof(void*), 0u);
-      std::fill_n(block, size, static_cast<uint8_t>(i));
-      blocks.emplace_back(block, size);
-    }
-    for (size_t i = 0; i < blocks.size(); ++i) {
-      const auto& [block, size] = blocks[i];
-      ASSERT_EQ(std::count(block, block + size, static_cast<uint8_t>(i)), static_cast<ptrdiff_t>(size)) << i;
-    }
-    std::shuffle(blocks.begin(), blocks.end(), random);
-    for (; blocks.size() > 2000; blocks.pop_back()) Arena::Free(blocks.back().first);
-  }
-  for (const auto& [block, size] : blocks) Arena::Free(block);
 }
 
 TEST(Converters, GuardTheirBuffers) {
