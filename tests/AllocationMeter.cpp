@@ -6,11 +6,11 @@
 #include <atomic>
 #include <cstdlib>
 #include <new>
-#include <utility>
 
 namespace {
 
 std::atomic<ptrdiff_t> gLiveBlocks = 0;
+bool gIsSystem = false;  // memory is taken from the system or given back, and counted as that
 
 // While there is a meter:
 Fault* gFault = nullptr;
@@ -21,13 +21,14 @@ ptrdiff_t gLiveBytes = 0;
 ptrdiff_t gPeakBytes = 0;
 
 bool MayAllocate(size_t size) {
-  if (gFault == nullptr) return true;
+  if (gFault == nullptr || gIsSystem) return true;
   const bool isTooLarge = size > gMost;
   gFault->hasFired |= isTooLarge;
   return !gFault->Strikes() && !isTooLarge;
 }
 
 void CountAllocated(size_t size) {
+  if (gIsSystem) return;
   ++gLiveBlocks;
   if (gFault == nullptr) return;
   gTotalBytes += size;
@@ -36,6 +37,7 @@ void CountAllocated(size_t size) {
 }
 
 void CountFreed(size_t size) {
+  if (gIsSystem) return;
   --gLiveBlocks;
   if (gFault != nullptr) gLiveBytes -= static_cast<ptrdiff_t>(size);
 }
@@ -71,18 +73,18 @@ void __real__ZN8platform10FreeMemoryEPvm(void* memory, size_t size) noexcept;
 
 void* __wrap__ZN8platform14AllocateMemoryEm(size_t size) noexcept {
   if (!MayAllocate(size)) return nullptr;
-  Fault* const fault = std::exchange(gFault, nullptr);
+  gIsSystem = true;
   void* const memory = __real__ZN8platform14AllocateMemoryEm(size);
-  gFault = fault;
+  gIsSystem = false;
   if (memory != nullptr) CountAllocated(size);
   return memory;
 }
 
 void __wrap__ZN8platform10FreeMemoryEPvm(void* memory, size_t size) noexcept {
   if (memory != nullptr) CountFreed(size);
-  Fault* const fault = std::exchange(gFault, nullptr);
+  gIsSystem = true;
   __real__ZN8platform10FreeMemoryEPvm(memory, size);
-  gFault = fault;
+  gIsSystem = false;
 }
 }
 

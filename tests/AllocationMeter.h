@@ -25,10 +25,7 @@ class AllocationMeter {
   static constexpr size_t kAnySize = std::numeric_limits<size_t>::max();
 
   // Allocations of more than `most` bytes fail, too.
-  explicit AllocationMeter(size_t failAt = 0, size_t most = kAnySize)
-      : AllocationMeter(own, most) {
-    own.at = failAt;
-  }
+  explicit AllocationMeter(size_t failAt = 0, size_t most = kAnySize) : AllocationMeter(own, most) { own.at = failAt; }
   explicit AllocationMeter(Fault& fault, size_t most = kAnySize);
   ~AllocationMeter();
   AllocationMeter(const AllocationMeter&) = delete;

@@ -31,7 +31,7 @@ class Frame {
   // Puts the datum's value where it belongs, and lets go of the datum.
   virtual void Accept(orvane::value_t value) = 0;
 
-  virtual orvane::value_t Result() const = 0;
+  virtual orvane::value_t Result() = 0;
 
   // Holds on to the data that the list or dictionary came out of.
   void Hold(DataRef from, DataRef coercedFrom) noexcept {
@@ -61,7 +61,7 @@ class ListFrame final : public Frame {
     entry.Reset();
   }
 
-  orvane::value_t Result() const override { return orvane::value_t(array); }
+  orvane::value_t Result() override { return orvane::value_t(array); }
 
  private:
   ListRef list;
@@ -72,39 +72,47 @@ class ListFrame final : public Frame {
 
 class DictionaryFrame final : public Frame {
  public:
-  explicit DictionaryFrame(DictionaryRef source) : dictionary(std::move(source)) {
-    const ListRef keyList = dictionary.CreateKeyList();
-    const uint32_t size = keyList.GetSize();
-    keys.reserve(size);
-    for (uint32_t i = 0; i < size; ++i) {
-      const VRKToken token = ExtractData<VRKToken>(keyList.GetEntry(i));
-      keys.emplace_back(TokenName(token), token);
-    }
-    std::ranges::sort(keys, {}, &Key::first);
-  }
+  explicit DictionaryFrame(DictionaryRef source)
+      : dictionary(std::move(source)), keys(dictionary.CreateKeyList()) {}
 
   bool Advance() override {
-    if (index >= keys.size()) return false;
-    entry = dictionary.GetEntry(keys[index++].second);
+    if (index >= keys.GetSize()) return false;
+    key = keys.GetEntry(index++);
+    keyToken = ExtractData<VRKToken>(key);
+    entry = dictionary.GetEntry(keyToken);
     return true;
   }
 
   const DataRef& Datum() const override { return entry; }
 
   void Accept(orvane::value_t value) override {
-    result.insert_or_assign(keys[index - 1].first, value);
+    accepted.push_back({TokenName(keyToken), index, std::move(value)});
     entry.Reset();
+    key.Reset();
   }
 
-  orvane::value_t Result() const override { return orvane::value_t(result); }
+  // Puts each value at the result's end, where it need not make room for it.
+  orvane::value_t Result() override {
+    std::ranges::sort(accepted, {},
+                      [](const Accepted& each) { return std::pair(each.name, each.place); });
+    orvane::dictionary_t result;
+    for (const Accepted& each : accepted) result.insert_or_assign(each.name, each.value);
+    return orvane::value_t(result);
+  }
 
  private:
-  using Key = std::pair<orvane::name_t, VRKToken>;
+  struct Accepted {
+    orvane::name_t name;
+    uint32_t place;
+    orvane::value_t value;
+  };
 
   DictionaryRef dictionary;
-  std::vector<Key> keys;  // in the order in which the result has them, to be put at its end
-  orvane::dictionary_t result;
-  size_t index = 0;
+  ListRef keys;
+  std::vector<Accepted> accepted;
+  uint32_t index = 0;
+  DataRef key;
+  VRKToken keyToken{};
   DataRef entry;
 };
 
