@@ -1,6 +1,7 @@
 #include "Arena.h"
 
 #include <algorithm>
+#include <boost/smart_ptr/make_local_shared.hpp>
 #include <limits>
 #include <new>
 #include <utility>
@@ -11,9 +12,14 @@ namespace tovali_private {
 
 struct Arena::Chunk {
   void Release() noexcept {
-    if (--holders == 0) platform::FreeMemory(this, size);
+    if (--holders != 0) return;
+    const size_t bytes = size;
+    *heldBytes -= bytes;
+    this->~Chunk();
+    platform::FreeMemory(this, bytes);
   }
 
+  boost::local_shared_ptr<uint64_t> heldBytes;
   size_t size;
   size_t holders;  // what was handed out, and the arena while this is its current chunk
 };
@@ -23,11 +29,14 @@ struct Arena::Header {
   Chunk* chunk;
 };
 
-Arena::Chunk* Arena::CreateChunk(uint64_t size) {
+Arena::Arena() : heldBytes(boost::make_local_shared<uint64_t>()) {}
+
+Arena::Chunk* Arena::CreateChunk(uint64_t size) const {
   if (size > std::numeric_limits<size_t>::max()) throw std::bad_alloc();
   void* const memory = platform::AllocateMemory(static_cast<size_t>(size));
   if (memory == nullptr) throw std::bad_alloc();
-  return ::new (memory) Chunk{static_cast<size_t>(size), 0};
+  *heldBytes += size;
+  return ::new (memory) Chunk{heldBytes, static_cast<size_t>(size), 0};
 }
 
 void* Arena::HandOut(Chunk& chunk, uint8_t* place) noexcept {
@@ -41,7 +50,7 @@ Arena& Arena::operator=(Arena&& other) noexcept {
   next = other.next;
   left = std::exchange(other.left, 0);
   nextChunkSize = other.nextChunkSize;
-  handedOut = std::exchange(other.handedOut, 0);
+  heldBytes = other.heldBytes;
   return *this;
 }
 
@@ -58,13 +67,11 @@ void* Arena::Allocate(uint64_t size) {
     const bool isLarge = needed > nextChunkSize / 4;
     if (isLarge) {
       Chunk* const own = CreateChunk(sizeof(Chunk) + needed);
-      handedOut += needed;
       return HandOut(*own, reinterpret_cast<uint8_t*>(own + 1));
     }
     BeginChunk();
   }
   left -= static_cast<size_t>(needed);
-  handedOut += needed;
   return HandOut(*current, std::exchange(next, next + needed));
 }
 

@@ -1,6 +1,7 @@
 // Memory for many small objects that are mostly made together and die together.
 #pragma once
 
+#include <boost/smart_ptr/local_shared_ptr.hpp>
 #include <cstddef>
 #include <cstdint>
 
@@ -13,12 +14,12 @@ namespace tovali_private {
 // An arena and all that it hands out stay on one thread at a time.
 class Arena {
  public:
-  Arena() = default;
+  Arena();  // throws std::bad_alloc
   Arena(const Arena&) = delete;
   Arena& operator=(const Arena&) = delete;
   ~Arena() { Retire(); }
 
-  // Takes over the other's chunk.
+  // Lets go of its own chunk and takes over the other's, which hands out nothing afterwards.
   Arena& operator=(Arena&& other) noexcept;
 
   // Has the next chunk be large enough for this many bytes, as far as chunks become so large.
@@ -27,8 +28,8 @@ class Arena {
   // Aligned for pointers. Throws std::bad_alloc.
   void* Allocate(uint64_t size);
 
-  // The bytes that it has handed out since it was made, whether they were freed or not.
-  uint64_t HandedOut() const noexcept { return handedOut; }
+  // The size of the chunks that are not given back yet.
+  uint64_t HeldBytes() const noexcept { return *heldBytes; }
 
   // Gives back what any arena has handed out.
   static void Free(void* memory) noexcept;
@@ -37,7 +38,7 @@ class Arena {
   struct Chunk;
   struct Header;
 
-  static Chunk* CreateChunk(uint64_t size);
+  Chunk* CreateChunk(uint64_t size) const;
   static void* HandOut(Chunk& chunk, uint8_t* place) noexcept;
   void BeginChunk();
   void Retire() noexcept;
@@ -46,7 +47,7 @@ class Arena {
   uint8_t* next = nullptr;
   size_t left = 0;
   size_t nextChunkSize = size_t{1} << 12;
-  uint64_t handedOut = 0;
+  boost::local_shared_ptr<uint64_t> heldBytes;  // shared with the chunks
 };
 
 }  // namespace tovali_private

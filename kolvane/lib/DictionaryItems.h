@@ -118,7 +118,7 @@ struct EntryMemory {
     entries.Expect(byteCount / 2);
   }
 
-  uint64_t HandedOut() const noexcept { return runs.HandedOut() + entries.HandedOut(); }
+  uint64_t HeldBytes() const noexcept { return runs.HeldBytes() + entries.HeldBytes(); }
 
   Arena runs;
   Arena entries;

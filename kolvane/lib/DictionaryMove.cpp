@@ -18,15 +18,15 @@ DictionaryEntry& EntryOf(HashItem& item) noexcept {
 
 }  // namespace
 
-// Each move takes time in proportion to the entries that it moves, and there is none before three
-// times as much was handed out since the last. Where memory runs out, the other entries stay.
+// A move takes time in proportion to the entries that it moves, and there is none before chunks of
+// three times their size were begun since the last. Where memory runs out, the other entries stay.
 void DictionaryTable::MoveFromMostlyDeadMemory() noexcept {
-  constexpr uint64_t kMostDead = 4;
+  constexpr uint64_t kMostHeld = 4;
   constexpr uint64_t kLittle = uint64_t{1} << 16;
-  if (memory.HandedOut() <= kMostDead * liveBytes + kLittle) return;
-  memory = EntryMemory();
-  memory.Expect(liveBytes);
+  if (memory.HeldBytes() <= kMostHeld * liveBytes + kLittle) return;
   try {
+    memory = EntryMemory();
+    memory.Expect(liveBytes);
     for (HashItem*& head : buckets) MoveChain(head);
   } catch (const std::bad_alloc&) {  // what is moved already is in its place
   }

@@ -25,8 +25,8 @@ enum class StoredLine : uint8_t { kDropped, kAdded, kReplaced };
 // Owns its entries. Not for concurrent use: even a lookup writes to the table, and values are
 // shared with plain reference counts. The memory of an entry that is replaced comes back with that
 // of the entries that were made next to it, and at the end of a text load at the latest: entries
-// move there to memory of their own, as far as there is any, when more than four times as much was
-// used as they take, and 64 KB. Pointers to entries are good until the next load.
+// move there to fresh memory, as far as there is any, when more than four times as much is held for
+// them as they take, and 64 KB. Pointers to entries are good until the next load.
 class DictionaryTable {
  public:
   using DictionaryEntry = tovali_private::DictionaryEntry;
