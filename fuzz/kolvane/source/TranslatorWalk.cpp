@@ -136,7 +136,7 @@ void TranslatorWalk::Terminate() {
 }
 
 void TranslatorWalk::Create(bool isOwner) {
-  if (depth == 0 && objects.size() == kMostObjects) {
+  while (depth == 0 && objects.size() >= kMostObjects) {
     Release(objects.front());
     objects.pop_front();
   }
