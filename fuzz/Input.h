@@ -11,9 +11,10 @@
 // The engine, or Replay.cpp, calls it with bytes that it keeps; every target defines it. Returns 0.
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size);
 
-// Where a target takes several texts, `<|>` stands between them; what has none is one piece.
+// Where a target takes several texts, it stands between them; what has none is one piece.
+inline const std::string kSeparator = "<|>";
+
 inline std::vector<std::string> Pieces(const uint8_t* data, size_t size) {
-  constexpr std::string_view kSeparator = "<|>";
   std::string_view rest(reinterpret_cast<const char*>(data), size);
   std::vector<std::string> pieces;
   for (;;) {

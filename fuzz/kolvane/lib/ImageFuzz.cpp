@@ -53,6 +53,22 @@ void RequireSameAnswers(DictionaryTable& table, const SlowTwin& twin, const Slow
   }
 }
 
+// The newest of a key comes out first; what lies in a wrong bucket stays.
+void RequireAllComeOut(DictionaryTable& table, const SlowTwin& twin) {
+  Contents others;
+  for (const auto& entry : twin.AllContents()) {
+    const auto& [bucket, key, value] = entry;
+    if (bucket != BucketOf(key)) {
+      others.push_back(entry);
+      continue;
+    }
+    const auto* const bytes = reinterpret_cast<const uint8_t*>(key.data());
+    const auto detached = table.Detach({bytes, static_cast<uint32_t>(key.size()), false});
+    Require(detached != nullptr && Text(detached->Value()) == value, "an entry comes out");
+  }
+  Require(ContentsOf(table) == others, "no entry is left that can be found");
+}
+
 }  // namespace
 
 int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
@@ -67,5 +83,7 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   defaults.MakeDefault();
   RequireSameAnswers(table, twin, &defaultTwin, questions);
   RequireSameAnswers(table, twin, &defaultTwin, Questions(defaultTwin, images));
+  RequireAllComeOut(table, twin);
+  RequireAllComeOut(defaults, defaultTwin);
   return 0;
 }

@@ -1,8 +1,6 @@
 // Strings, items, and the table with its chains and index.
 #include <gtest/gtest.h>
 
-#include <algorithm>
-#include <random>
 #include <sstream>
 
 #include "Converters.h"
@@ -100,55 +98,6 @@ TEST(DictionaryEntry, WritesItself) {
   const uint8_t bytes[] = {'H', 0, 'i'};
   DictionaryEntry::Create(gMemory, Key("/a"), bytes)->Write(odd, true, nullptr);
   EXPECT_EQ(odd.str(), std::string("/aH\0i", 5));
-}
-
-// Random inserts, detaches and images of keys that crowd two buckets, against plain lists. Sometimes
-// every chain is compared whole, but seldom, for groups that nobody looked at to pile up.
-TEST(DictionaryTable, FindsWhatAWalkOfTheChainFinds) {
-  std::vector<std::string> keys;
-  for (size_t i = 0; i < 40; ++i) {
-    keys.push_back("0_2_4_" + std::string(i % 2, 'x') + "6_" + static_cast<char>('a' + i / 2) + "_");
-  }
-  DictionaryTable table;
-  std::map<uint32_t, std::vector<std::pair<std::string, std::u16string>>> twin;
-  std::mt19937 random(3);
-  for (int round = 0; round < 8000; ++round) {
-    const std::string& key = keys[random() % keys.size()];
-    const std::u16string value(1, static_cast<char16_t>(round));
-    auto& chain = twin[BucketOf(key)];
-    const auto equal = [&](const auto& entry) { return entry.first == key; };
-    const auto first = std::find_if(chain.begin(), chain.end(), equal);
-    if (const auto choice = random() % 8; choice < 2) {
-      table.Insert(Entry(key, value));
-      chain.insert(chain.begin(), {key, value});
-    } else if (choice == 2) {
-      const std::string& second = keys[random() % keys.size()];  // perhaps in a bucket not its own
-      const auto bucket = static_cast<uint16_t>(BucketOf(key));
-      Load(table, Image1_5(0, {{bucket, {{key, Bytes(value)}, {second, Bytes(u"2")}, {key, Bytes(u"3")}}}}));
-      chain.insert(chain.begin(), {{key, value}, {second, u"2"}, {key, u"3"}});
-    } else if (choice == 3) {
-      const DictionaryEntry* const found = table.Find(Key(key));
-      ASSERT_EQ(found != nullptr, first != chain.end());
-      if (found == nullptr) continue;
-      ASSERT_EQ(Text(found->Value()), first->second);
-    } else {
-      const auto detached = table.Detach(Key(key));
-      ASSERT_EQ(detached != nullptr, first != chain.end());
-      if (detached == nullptr) continue;
-      ASSERT_EQ(Text(detached->Value()), first->second);
-      ASSERT_TRUE(detached->next == nullptr && detached->previous == nullptr && detached->hidden == nullptr);
-      chain.erase(first);
-    }
-    if (random() % 4 != 0) continue;
-    Contents expected;
-    for (const auto& [bucket, entries] : twin) {
-      for (const auto& entry : entries) expected.emplace_back(bucket, entry.first, entry.second);
-    }
-    ASSERT_EQ(ContentsOf(table), expected);
-  }
-  table.Clear();
-  EXPECT_TRUE(ContentsOf(table).empty());
-  EXPECT_EQ(table.Find(Key(keys[0])), nullptr);
 }
 
 TEST(Converters, GuardTheirBuffers) {

@@ -1,10 +1,7 @@
 // The grammar as tables of cases.
 #include <gtest/gtest.h>
 
-#include <random>
-
 #include "NamedCharacters.h"
-#include "SlowTwin.h"
 #include "Support.h"
 #include "TextSyntax.h"
 
@@ -93,16 +90,6 @@ TEST(TextSyntax, KnowsEveryName) {
   for (const NamedCharacter& named : names) {
     const std::u16string written = u"#{" + std::u16string(named.name.begin(), named.name.end()) + u"}";
     EXPECT_EQ(Units(Unescaped(written)), std::vector(named.Units().begin(), named.Units().end()));
-  }
-}
-
-TEST(TextSyntax, DecodesRandomTextsAsTheTwinDoes) {
-  constexpr char16_t kAlphabet[] = u"^\\#{}amptlQn\"x\u20AC";
-  std::mt19937 random(2);
-  for (int round = 0; round < 50000; ++round) {
-    std::u16string text;
-    for (size_t length = random() % 16; length > 0; --length) text += kAlphabet[random() % 14];
-    ASSERT_EQ(Unescaped(text), SlowTwin::Decode(text));
   }
 }
 
