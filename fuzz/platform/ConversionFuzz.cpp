@@ -1,15 +1,74 @@
-// Any bytes and any units, converted as ICU converts them.
+// Any bytes and any units, converted as ICU converts them: what ICU does otherwise is made the same
+// here.
+#include <unicode/ucnv.h>
+#include <unicode/unistr.h>
+
 #include <algorithm>
+#include <memory>
+#include <regex>
 #include <vector>
 
 #include "CodePage.h"
-#include "ICUConversion.h"
 #include "Input.h"
 
 namespace {
 
 using platform::kCodePageSystem;
 using platform::kCodePageUTF8;
+
+// What counts as one here and as several with ICU: a lead byte with a second one that does not fit
+// it, and a lead byte with all that is left where that is too little.
+std::string WithMisfitsAsOne(const std::string& text) {
+  static const std::regex misfits(
+      "\xE0[\x80-\x9F]|\xED[\xA0-\xBF]|\xF0[\x80-\x8F]|\xF4[\x90-\xBF]");
+  std::string whole = text;
+  for (size_t at = text.size() - std::min<size_t>(text.size(), 3); at < text.size(); ++at) {
+    const auto byte = static_cast<unsigned char>(text[at]);
+    const size_t length = byte < 0xC2 || byte > 0xF4 ? 1 : byte < 0xE0 ? 2 : byte < 0xF0 ? 3 : 4;
+    if (text.size() - at >= length) continue;
+    whole.resize(at);
+    whole += '\xFF';
+    break;
+  }
+  return std::regex_replace(whole, misfits, "\xFF");
+}
+
+std::u16string ICUDecodedUTF8(const std::string& text) {
+  const auto decoded = icu::UnicodeString::fromUTF8(WithMisfitsAsOne(text));
+  return {decoded.getBuffer(), static_cast<size_t>(decoded.length())};
+}
+
+std::string ICUEncodedUTF8(const std::u16string& text) {
+  std::string encoded;
+  return icu::UnicodeString(text.data(), static_cast<int32_t>(text.size())).toUTF8String(encoded);
+}
+
+// Character by character, of which none that windows-1252 has is more than a byte or a unit.
+class ICUWindows1252 {
+ public:
+  ICUWindows1252() {
+    ucnv_setSubstChars(converter.get(), "?", 1, &error);
+    ucnv_setFallback(converter.get(), false);
+  }
+
+  char16_t Decode(char byte) {
+    char16_t unit = 0;
+    ucnv_toUChars(converter.get(), &unit, 1, &byte, 1, &error);
+    return unit;
+  }
+
+  char Encode(char16_t unit) {
+    if (unit >= 0xD800 && unit < 0xE000) return '?';  // for half of a pair, too
+    char byte = 0;
+    const int32_t length = ucnv_fromUChars(converter.get(), &byte, 1, &unit, 1, &error);
+    return length == 1 ? byte : '?';  // ICU leaves out what is invisible anyway
+  }
+
+ private:
+  UErrorCode error = U_ZERO_ERROR;
+  std::unique_ptr<UConverter, decltype(&ucnv_close)> converter{ucnv_open("windows-1252", &error),
+                                                               &ucnv_close};
+};
 
 // A few buffers that are too small, each of its exact size.
 template <class Unit, class Convert>

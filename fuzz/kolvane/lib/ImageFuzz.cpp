@@ -62,8 +62,7 @@ void RequireAllComeOut(DictionaryTable& table, const SlowTwin& twin) {
       others.push_back(entry);
       continue;
     }
-    const auto* const bytes = reinterpret_cast<const uint8_t*>(key.data());
-    const auto detached = table.Detach({bytes, static_cast<uint32_t>(key.size()), false});
+    const auto detached = table.Detach(Key(key));
     Require(detached != nullptr && Text(detached->Value()) == value, "an entry comes out");
   }
   Require(ContentsOf(table) == others, "no entry is left that can be found");

@@ -47,21 +47,6 @@ void CheckEscaping(const std::u16string& text) {
   Require(holdsEscapes || Unescaped(written) == text, "Unescape undoes EscapeForText");
 }
 
-void CheckSplitting(const std::u16string& line) {
-  const auto units = Units(line);
-  const std::u16string text = TextOf(EntryText(units));
-  Require(line.find(text) != line.npos, "an entry is a part of its line");
-  const auto split = SplitKolvane(EntryText(units));
-  const bool marked = text.starts_with(u"$$$");
-  Require(split.has_value() == (marked || !text.starts_with(u"$")), "$ and $$ are no marks");
-  if (!split) return;
-  const std::u16string key = TextOf(split->key);
-  Require(key.find(u'=') == key.npos, "a key ends at the first =");
-  const bool hasValue = text.find(u'=') != text.npos;
-  const std::u16string joined = key + (hasValue ? u"=" : u"") + TextOf(split->value);
-  Require((marked ? u"$$$" : u"") + joined == text, "no more than $$$ and = is left out");
-}
-
 void CheckWriting(const std::string& key, const std::u16string& value) {
   std::vector<uint16_t> line = {'x'};
   const std::span bytes(reinterpret_cast<const uint8_t*>(key.data()), key.size());
@@ -86,7 +71,6 @@ int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   for (const std::u16string& text : {Widened(pieces.back()), UnitsFrom(pieces.back())}) {
     CheckDecoding(text);
     CheckEscaping(text);
-    CheckSplitting(text);
     CheckWriting(key, text);
   }
   return 0;

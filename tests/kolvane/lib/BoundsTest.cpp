@@ -20,12 +20,6 @@ namespace {
 using namespace tovali_private;
 using namespace std::string_literals;
 
-std::string Little(uint64_t value, size_t size) {
-  std::string bytes;
-  for (size_t i = 0; i < size; ++i) bytes += static_cast<char>(value >> (8 * i));
-  return bytes;
-}
-
 const std::string kHeader1_5 = "Kolvane Binary Format\1\5\0"s;
 const std::string kHeader1_0 = "Kolvane Binary Format\1\0\0"s;
 
@@ -61,11 +55,6 @@ std::string Binary(size_t size, bool oneGroup, int encoding, uint16_t bucket,
   return image(encoding, groups);
 }
 
-std::string EmptyGroups(size_t size) {
-  const size_t count = size / 6;
-  return kHeader1_5 + Little(count, 4) + std::string(6 * count, '\0');
-}
-
 // Records of version 1.0 whose offsets go back to the start of the data again and again.
 std::string RecordsOfTheSameEntries(size_t size) {
   const size_t count = size / 12;
@@ -84,6 +73,10 @@ struct Shape {
 const auto kNothing = [](size_t) { return std::pair(""s, ""s); };
 const auto kSameKey = [](size_t) { return std::pair("/a"s, ""s); };
 
+const auto kCrowdingKeys = [](size_t number) { return std::pair(CrowdingKey(number), ""s); };
+const auto kCrowd = static_cast<uint16_t>(BucketOf(CrowdingKey(1)));
+const std::string kSmallImage = Image1_5(0, {{580, {{"/a", ""}}}});
+
 const Shape kShapes[] = {
     {"one line", [](size_t size) { return std::string(size, 'x'); }},
     {"one line in UTF-16", [](size_t size) { return Filled("\xFF\xFE", size, "x\0"s); }},
@@ -97,8 +90,8 @@ const Shape kShapes[] = {
     {"line ends", [](size_t size) { return std::string(size, '\n'); }},
     {"line ends in UTF-16", [](size_t size) { return Filled("\xFF\xFE", size, "\x28\x20"); }},
     {"zeros", [](size_t size) { return Filled("\"$$$/a=some text here\"\n", size, "a\0"s); }},
-    {"dropped lines", [](size_t size) { return Lines(size, [](size_t) { return "$"s; }); }},
-    {"lines of a byte", [](size_t size) { return Lines(size, [](size_t i) { return std::string(1, static_cast<char>('a' + i % 26)); }); }},
+    {"dropped lines", [](size_t size) { return Filled("", size, "$\n"); }},
+    {"lines of a byte", [](size_t size) { return Filled("", size, "a\nb\nc\nd\ne\nf\ng\nh\n"); }},
     {"lines of one key, and others",
      [](size_t size) { return Lines(size, [](size_t i) { return i % 99 == 0 ? std::to_string(i) : "k"s; }); }},
     {"short lines", [](size_t size) { return Lines(size, [](size_t i) { return Little(0x10101 + i * 2, 3); }); }},
@@ -107,7 +100,7 @@ const Shape kShapes[] = {
     {"a count of lengths that is not so", [](size_t size) { return kHeader1_5 + Little(1, 4) + std::string(size, '\x7F'); }},
     {"lengths that are not so",
      [](size_t size) { return kHeader1_5 + Little(1, 4) + Little(size / 8 * 2, 4) + std::string(size, '\x7F'); }},
-    {"empty groups", EmptyGroups},
+    {"empty groups", [](size_t size) { return kHeader1_5 + Little(size / 6, 4) + std::string(size / 6 * 6, '\0'); }},
     {"empty entries", [](size_t size) { return Binary(size, true, 0, 0, kNothing); }},
     {"empty entries, 1.0", [](size_t size) { return Binary(size, true, 0, 0, kNothing, Image1_0); }},
     {"empty entries, code page", [](size_t size) { return Binary(size, true, 2, 0, kNothing); }},
@@ -116,22 +109,14 @@ const Shape kShapes[] = {
     {"groups of no bucket", [](size_t size) { return Binary(size, false, 0, 1021, kSameKey); }},
     {"groups of the wrong bucket", [](size_t size) { return Binary(size, false, 0, 0, kSameKey); }},
     {"an entry many times", [](size_t size) { return Binary(size, true, 0, 580, kSameKey); }},
-    {"keys of one bucket, each a group",
-     [](size_t size) {
-       return Binary(size, false, 0, static_cast<uint16_t>(BucketOf(CrowdingKey(1))),
-                     [](size_t i) { return std::pair(CrowdingKey(i), ""s); });
-     }},
+    {"keys of one bucket, each a group", [](size_t size) { return Binary(size, false, 0, kCrowd, kCrowdingKeys); }},
     {"malformed values", [](size_t size) { return Binary(size, true, 1, 580, [](size_t) { return std::pair("/a"s, "\xE2\x82\xE2"s); }); }},
     {"one malformed value",
      [](size_t size) { return Binary(1, true, 1, 580, [&](size_t) { return std::pair("/a"s, std::string(size, '\xFF')); }); }},
     {"one key", [](size_t size) { return Binary(1, true, 0, 0, [&](size_t) { return std::pair(std::string(size, '\xFF'), ""s); }); }},
     {"records of the same entries", RecordsOfTheSameEntries},
     {"many texts", [](size_t size) { return Filled("", size, "\"$$$/a=b\"\n\n\n\n\n\n\n\n\n\n\n\n\n\n"); }, 23},
-    {"many images",
-     [](size_t size) {
-       return Filled("", size, Image1_5(0, {{580, {{"/a", ""}}}}));
-     },
-     Image1_5(0, {{580, {{"/a", ""}}}}).size()},
+    {"many images", [](size_t size) { return Filled("", size, kSmallImage); }, kSmallImage.size()},
 };
 
 struct Cost {
@@ -153,7 +138,7 @@ Cost CostOf(const Shape& shape, size_t size, int rounds) {
         table.Load(stream);
       }
       table.LastLoad();
-      while (table.Detach({reinterpret_cast<const uint8_t*>("/a"), 2, false}) != nullptr) {
+      while (table.Detach(Key("/a")) != nullptr) {
       }
     }
     const std::chrono::duration<double> taken = std::chrono::steady_clock::now() - start;
@@ -274,17 +259,15 @@ TEST(Bounds, SizesBeyond31And32BitsAreRefused) {
 TEST(Bounds, LengthsBeyond31And32BitsAreShortReads) {
   constexpr uint32_t kLengths[] = {0,          2,          0x3FFFFFFF, 0x7FFFFFF7, 0x7FFFFFFE, 0x7FFFFFFF,
                                    0x80000000, 0xFFFFFFF7, 0xFFFFFFFB, 0xFFFFFFFC, 0xFFFFFFFE, 0xFFFFFFFF};
+  const std::vector<ImageGroup> groups = {{580, {{"/a", "x."}, {"/b", "x."}}}};
   for (const uint32_t keyLength : kLengths) {
     for (const uint32_t valueLength : kLengths) {
       if (keyLength <= 2 && valueLength <= 2) continue;
-      for (const char encoding : {'\0', '\1', '\2'}) {
-        const std::string lengths = Little(2, 4) + Little(2, 4) + Little(keyLength, 4) + Little(valueLength, 4);
-        const std::string image1_5 =
-            kHeader1_5.substr(0, 23) + encoding + Little(1, 4) + Little(4, 4) + lengths + Little(580, 2) + "/ax./bx.";
-        const std::string image1_0 = kHeader1_0.substr(0, 23) + encoding + Little(2, 2) + Little(580, 2) + Little(38, 4) + Little(0, 2) +
-                                     Little(0xFFFFFFFF, 4) + Little(2, 4) + "/a" + Little(2, 4) + "x." + Little(keyLength, 4) + "/b" +
-                                     Little(valueLength, 4) + "x.";
-        for (const std::string& image : {image1_5, image1_0}) {
+      for (const int encoding : {0, 1, 2}) {
+        const std::string key = Little(keyLength, 4), value = Little(valueLength, 4);
+        const std::string images[] = {Image1_5(encoding, groups).replace(40, 8, key + value),
+                                      Image1_0(encoding, groups).replace(50, 10, key + "/b" + value)};
+        for (const std::string& image : images) {
           DictionaryTable table;
           const AllocationMeter meter;
           Load(table, image);

@@ -1,10 +1,8 @@
 // Keys through: what a dictionary answers.
 #include <gtest/gtest.h>
 
-#include <boost/interprocess/streams/bufferstream.hpp>
 #include <fstream>
 
-#include "KolvaneDictionary.h"
 #include "OVErrException.h"
 #include "Support.h"
 
@@ -47,20 +45,11 @@ TEST(Dictionary, Translates) {
 }
 
 TEST(Dictionary, DefaultMovesAndDies) {
-  KolvaneDictionary asking;
-  const auto answer = [&] {
-    const int utf8 = 1;
-    const TranslatedString translated = asking.Translate("$$$/a=none", &utf8);
-    std::vector<uint16_t> units(translated.BufferSize());
-    translated.CopyTo(units.data(), translated.BufferSize(), true);
-    return std::u16string(units.begin(), units.end() - 1);
-  };
+  DictionaryTable asking;
+  const auto answer = [&] { return Translated(asking, "$$$/a=none"); };
   const auto made = [](const std::string& value) {
-    auto dictionary = std::make_unique<KolvaneDictionary>();
-    const std::string image = "\"$$$/a=" + value + "\"\n\n\n\n\n\n\n\n\n\n\n\n";
-    boost::interprocess::ibufferstream stream(image.data(), image.size());
-    dictionary->Load(stream);
-    EXPECT_TRUE(dictionary->LastLoad().Complete());
+    auto dictionary = std::make_unique<DictionaryTable>();
+    Load(*dictionary, "\"$$$/a=" + value + "\"\n\n\n\n\n\n\n\n\n\n\n\n");
     dictionary->MakeDefault();
     return dictionary;
   };

@@ -7,26 +7,21 @@
 
 namespace {
 
-template <class Integer>
-void Put(std::string& image, Integer value) {
-  for (size_t i = 0; i < sizeof value; ++i) {
-    image += static_cast<char>(static_cast<uint64_t>(value) >> (8 * i));
-  }
-}
-
-uint32_t Size(const std::string& text) {
-  return static_cast<uint32_t>(text.size());
-}
-
 std::string Header(char minor, int encoding) {
   return std::string("Kolvane Binary Format\x01") + minor + static_cast<char>(encoding);
 }
 
 }  // namespace
 
+std::string Little(uint64_t value, size_t size) {
+  std::string bytes;
+  for (size_t i = 0; i < size; ++i) bytes += static_cast<char>(value >> (8 * i));
+  return bytes;
+}
+
 std::string Bytes(const std::u16string& text) {
   std::string bytes;
-  for (const char16_t unit : text) Put(bytes, static_cast<uint16_t>(unit));
+  for (const char16_t unit : text) bytes += Little(unit, 2);
   return bytes;
 }
 
@@ -53,37 +48,31 @@ std::string Image1_5(int encoding, const std::vector<ImageGroup>& groups) {
   uint32_t count = 0;
   for (const ImageGroup& group : groups) {
     count += 2 * static_cast<uint32_t>(group.entries.size());
-    Put(counts, count);
-    Put(buckets, group.bucket);
+    counts += Little(count, 4);
+    buckets += Little(group.bucket, 2);
     for (const auto& [key, value] : group.entries) {
-      Put(lengths, Size(key));
-      Put(lengths, Size(value));
+      lengths += Little(key.size(), 4) + Little(value.size(), 4);
       data += key + value;
     }
   }
-  std::string image = Header(5, encoding);
-  Put(image, static_cast<uint32_t>(groups.size()));
-  return image + counts + lengths + buckets + data;
+  return Header(5, encoding) + Little(groups.size(), 4) + counts + lengths + buckets + data;
 }
 
 std::string Image1_0(int encoding, const std::vector<ImageGroup>& groups) {
-  std::string image = Header(0, encoding);
-  Put(image, static_cast<uint16_t>(groups.size() + 1));
-  const uint32_t dataAt = Size(image) + 6 * static_cast<uint32_t>(groups.size() + 1);
+  std::string image = Header(0, encoding) + Little(groups.size() + 1, 2);
+  const size_t dataAt = image.size() + 6 * (groups.size() + 1);
   std::string data;
   for (const ImageGroup& group : groups) {
-    Put(image, group.bucket);
-    Put(image, dataAt + Size(data));
+    image += Little(group.bucket, 2) + Little(dataAt + data.size(), 4);
     for (const auto& [key, value] : group.entries) {
-      Put(data, Size(key));
-      data += key;
-      Put(data, Size(value));
-      data += value;
+      data += Little(key.size(), 4) + key + Little(value.size(), 4) + value;
     }
   }
-  Put(image, uint16_t{0});
-  Put(image, dataAt + Size(data));
-  return image + data;
+  return image + Little(0, 2) + Little(dataAt + data.size(), 4) + data;
+}
+
+tovali_private::ByteRunKey Key(const std::string& key) {
+  return {reinterpret_cast<const uint8_t*>(key.data()), static_cast<uint32_t>(key.size()), false};
 }
 
 std::vector<ImageGroup> Grouped(const std::vector<std::pair<std::string, std::string>>& entries) {
@@ -95,7 +84,7 @@ std::vector<ImageGroup> Grouped(const std::vector<std::pair<std::string, std::st
 }
 
 uint32_t BucketOf(const std::string& key) {
-  return tovali_private::ByteRunKey(reinterpret_cast<const uint8_t*>(key.data()), Size(key), false).Hash(DictionaryTable::kBucketCount);
+  return Key(key).Hash(DictionaryTable::kBucketCount);
 }
 
 void Load(DictionaryTable& table, const std::string& image) {

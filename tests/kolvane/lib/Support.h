@@ -14,7 +14,8 @@
 std::string LittleEndianImage(const std::u16string& text);
 std::string BigEndianImage(const std::u16string& text);
 
-std::string Bytes(const std::u16string& text);  // in little-endian order
+std::string Little(uint64_t value, size_t size);  // its lowest bytes in little-endian order
+std::string Bytes(const std::u16string& text);    // in that order, too
 std::vector<uint16_t> Units(const std::u16string& text);
 std::u16string Text(const KolvaneString& string);
 
@@ -30,6 +31,7 @@ std::string Image1_0(int encoding, const std::vector<ImageGroup>& groups);
 // One group for each entry, in the bucket of its key.
 std::vector<ImageGroup> Grouped(const std::vector<std::pair<std::string, std::string>>& entries);
 
+tovali_private::ByteRunKey Key(const std::string& key);  // which borrows it
 uint32_t BucketOf(const std::string& key);
 
 // From a block that ends where the image ends.
