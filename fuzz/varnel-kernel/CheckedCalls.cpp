@@ -1,5 +1,17 @@
 #include "CheckedCalls.h"
 
+#include <cstring>
+
+namespace {
+
+// Throws instead of returning that it threw.
+VRKResult Returned(VRKResult result) {
+  if (kLibrariesShareRuntime && result == kVRKCallbackThrew) throw result;
+  return result;
+}
+
+}  // namespace
+
 Handle CheckedCalls::Odd() {
   const Handle once = model.ever.empty() ? 0 : model.ever[Below(65536) % model.ever.size()];
   const uint32_t how = Below(4);
@@ -16,20 +28,16 @@ Argument CheckedCalls::Pick(Kind kind, bool mayBeNull) {
     if (each.kind == kind) return {kind, each.handle, mayBeNull};
   }
   if (OneIn(mayBeNull ? 4 : 64)) return {kind, 0, mayBeNull};
-  if (OneIn(16)) return {kind, Odd(), mayBeNull};
-  Handle picked = 0;
-  uint32_t passed = Below(4);
-  for (auto each = model.ever.rbegin(); each != model.ever.rend() && passed <= 4; ++each) {
-    if (!model.Is(kind, *each)) continue;
-    picked = *each;
-    --passed;
-  }
-  return {kind, picked != 0 ? picked : Odd(), mayBeNull};
+  std::vector<Handle>& latest = model.latest[static_cast<size_t>(kind)];
+  std::erase_if(latest, [&](Handle each) { return !model.Is(kind, each); });
+  if (OneIn(16) || latest.empty()) return {kind, Odd(), mayBeNull};
+  return {kind, latest[latest.size() - 1 - Below(5) % latest.size()], mayBeNull};
 }
 
 Argument CheckedCalls::PickToken(uint32_t first, uint32_t count) {
-  if (!OneIn(32)) return {Kind::kToken, TokenOf(first + Below(count))};
-  return {Kind::kToken, OneIn(2) ? Odd() : LastToken() + 1};
+  const Handle token = TokenOf(first + Below(count));
+  if (!OneIn(32)) return {Kind::kToken, token};
+  return {Kind::kToken, OneIn(2) ? Odd() : token + 1};
 }
 
 bool CheckedCalls::IsGood(const Argument& argument) const {
@@ -38,20 +46,9 @@ bool CheckedCalls::IsGood(const Argument& argument) const {
   return model.Is(argument.kind, argument.handle);
 }
 
-std::set<VRKResult> CheckedCalls::RefusalsOf(const Call& call) const {
-  if (!model.isRunning && call.needsKernel) return {kVRKNotRunning};
-  std::set<VRKResult> codes;
-  for (const Argument& each : call.arguments) {
-    if (!IsGood(each)) codes.insert(kVRKInvalidHandle);
-  }
-  if (call.lacksPointer) codes.insert(kVRKInvalidArgument);
-  if (codes.empty() && call.begin) codes.insert(call.begin());
-  codes.erase(kVRKNoError);
-  return codes;
-}
-
 void CheckedCalls::Enter(Call& call) {
-  call.isTraced = call.operation != nullptr && model.isRunning && hook != 0 && !isInHook;
+  const bool isHosts = call.operation.starts_with("VRKHost");
+  call.isTraced = !isHosts && model.isRunning && hook != 0 && !isInHook;
   call.failAt = std::exchange(failAt, 0);
   calls.push_back(&call);
   if (!call.isTraced) Begin();
@@ -60,7 +57,14 @@ void CheckedCalls::Enter(Call& call) {
 // At the moment at which the kernel is to judge the arguments.
 void CheckedCalls::Begin() {
   Call& call = *calls.back();
-  call.codes = RefusalsOf(call);
+  const auto isGood = [&](const Argument& each) { return IsGood(each); };
+  const auto refuse = [&](VRKResult code) {
+    if (code != kVRKNoError) call.refusals.push_back(code);
+  };
+  if (!model.isRunning && call.needsKernel) return refuse(kVRKNotRunning);
+  if (!std::all_of(call.arguments.begin(), call.arguments.end(), isGood)) refuse(kVRKInvalidHandle);
+  if (call.lacksPointer) refuse(kVRKInvalidArgument);
+  if (call.refusals.empty()) refuse(call.begin());
   if (call.failAt != 0) meter.emplace(call.failAt);
 }
 
@@ -74,15 +78,16 @@ void CheckedCalls::Disarm() {
 void CheckedCalls::Leave(Call& call, VRKResult result) {
   Disarm();
   calls.pop_back();
-  const bool wasRefused = !call.codes.empty();
-  if (!wasRefused && call.finish) call.codes.insert(call.finish());
-  if (!wasRefused && call.hasFailed) call.codes.clear();
-  if (call.hasFailed) call.codes.insert(kVRKOutOfMemory);
-  if (call.codes.empty()) call.codes.insert(kVRKNoError);
-  Require(call.codes.contains(result), call.operation != nullptr ? call.operation : "VRKHost");
-  Require(call.isEntered == call.isTraced, "a call is traced");
-  Require(call.isLeft == (call.isTraced && hook != 0), "and so is its end");
-  Require(!call.isLeft || call.told == result, "with its result");
+  std::vector<VRKResult> expected = call.refusals;
+  if (expected.empty()) {
+    const VRKResult usual = call.finish();
+    if (!call.hasFailed) expected = {usual};
+  }
+  if (call.hasFailed) expected.push_back(kVRKOutOfMemory);
+  const bool isExpected = std::count(expected.begin(), expected.end(), result) != 0;
+  Require(isExpected, call.operation.c_str());
+  Require(call.heard == (call.isTraced ? 1u + (hook != 0) : 0), "a call is traced, and its end");
+  Require(call.heard < 2 || call.told == result, "with its result");
 }
 
 void CheckedCalls::Reenter() {
@@ -98,6 +103,24 @@ VRKResult CheckedCalls::Answer(VRKResult usual) {
   return OneIn(4) ? kOdd[Below(kOdd.size())] : usual;
 }
 
+VRKResult CheckedCalls::Serve(const Told& told, Kind makes, void* out) {
+  CheckedCalls& it = *current;
+  it.Disarm();
+  Call& call = *it.calls.back();
+  Require(call.next && call.refusals.empty(), "there is a reason to call");
+  const Told expected = call.next(told);
+  Require(expected.context != 0 && told.context == expected.context, "it is the callback's turn");
+  Require(told.values == expected.values, "to be given this");
+  it.Reenter();
+  const VRKResult answer = it.Answer(it.OneIn(2) ? kVRKNoError : call.answer);
+  call.answer = answer;
+  if (out == nullptr) return Returned(answer);
+  call.made = it.Pick(makes).handle;
+  std::memcpy(out, &call.made, sizeof call.made);
+  if (answer == kVRKNoError && !it.model.Is(makes, call.made)) call.answer = kVRKNoResult;
+  return Returned(answer);
+}
+
 VRKResult CheckedCalls::OnTrace(const VRKHostTraceCall* told, void* context) {
   CheckedCalls& it = *current;
   if (it.isReading) return kVRKNoError;
@@ -106,24 +129,16 @@ VRKResult CheckedCalls::OnTrace(const VRKHostTraceCall* told, void* context) {
   const auto isTraced = [](const Call* each) { return each->isTraced; };
   const auto depth = std::count_if(it.calls.begin(), it.calls.end(), isTraced) - 1;
   Require(reinterpret_cast<uintptr_t>(context) == it.hook, "the hook that is set");
-  Require(call.isTraced && call.operation == std::string{told->operation}, "hears of the call");
+  Require(call.isTraced && call.operation == told->operation, "hears of the call");
   Require(told->depth == static_cast<size_t>(depth) && !it.isInHook, "and how deep it is nested");
-  Require(call.isEntered == (told->isFinished != 0) && !call.isLeft, "before and after it runs");
-  if (told->isFinished == 0) return Returned(it.HearOfStart(call));
-  call.isLeft = true;
+  Require(call.heard++ == told->isFinished, "before and after it runs");
   call.told = told->result;
-  return Returned(it.Answer(kVRKNoError));
-}
-
-VRKResult CheckedCalls::HearOfStart(Call& call) {
-  call.isEntered = true;
-  isInHook = true;
-  Reenter();
-  isInHook = false;
-  const VRKResult answer = Answer(kVRKNoError);
-  if (answer == kVRKNoError)
-    Begin();
-  else
-    call.codes = {answer};
-  return answer;
+  if (told->isFinished != 0) return Returned(it.Answer(kVRKNoError));
+  it.isInHook = true;
+  it.Reenter();
+  it.isInHook = false;
+  const VRKResult answer = it.Answer(kVRKNoError);
+  if (answer != kVRKNoError) call.refusals = {answer};
+  if (answer == kVRKNoError) it.Begin();
+  return Returned(answer);
 }

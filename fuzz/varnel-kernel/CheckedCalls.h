@@ -5,10 +5,8 @@
 #include <array>
 #include <functional>
 #include <optional>
-#include <set>
 #include <string>
 #include <utility>
-#include <variant>
 #include <vector>
 
 #include "AllocationMeter.h"
@@ -33,6 +31,7 @@ struct Argument {
 template <class Pointer>
 struct Needed {
   Pointer pointer;
+  bool IsLacking() const { return pointer == nullptr; }
   operator Pointer() const { return pointer; }
 };
 
@@ -41,64 +40,46 @@ template <class Value>
 struct Out {
   Out(bool given, bool needed = true) : isGiven(given), isNeeded(needed) {}
 
-  static Value Untouched() {
-    if constexpr (std::is_pointer_v<Value>)
-      return reinterpret_cast<Value>(0xDEADBEEF);
-    else
-      return Value{0xDEADBEEF};
-  }
+  bool IsLacking() const { return isNeeded && !isGiven; }
+  bool IsUntouched() const { return value == Out(true).value; }
   operator Value*() { return isGiven ? &value : nullptr; }
 
-  Value value = Untouched();
+  Value value = (Value)(uintptr_t)0xDEADBEEF;
   bool isGiven;
   bool isNeeded;
 };
 
-struct Creation {
-  Argument objectClass;
-  Argument parameters;
-  uintptr_t factory = 0;
-  bool isCalled = false;
-  Handle temporary = 0;  // parameters where none are given
-  VRKResult result = kVRKNoError;
-  Handle stored = 0;
+// What a callback is given: its context, and handles, numbers and pointers in their order.
+struct Told {
+  uintptr_t context;
+  std::array<uintptr_t, 7> values;
 };
 
-struct Conversion {
-  Argument data;
-  Argument to;
-  Item source = {};
-  Registrations left = {};
-  VRKResult result = kVRKCannotCoerce;
-  Handle stored = 0;
-};
-
-struct Report {
-  uint32_t line;
-  uint32_t* onceFlag;
-  bool isDue = false;
-  uint32_t answer = 0;
-};
-
-// A call that runs: what it calls back for, and besides what its arguments tell why it is refused,
-// or what it does in the model before and after.
+// A call that runs. Besides what its arguments tell: why it is refused, or what it does in the
+// model before; which callback comes next, and what the latest answered and made; what it returns,
+// after it has done the rest in the model.
 struct Call {
-  const char* operation = nullptr;  // null for one that is not traced
-  std::function<VRKResult()> begin = {};
-  std::variant<std::monostate, Delivery*, Creation*, Conversion*, Report*> service = {};
-  std::function<VRKResult()> finish = {};
+  std::function<VRKResult()> begin = [] { return kVRKNoError; };
+  std::function<Told(const Told&)> next = {};
+  std::function<VRKResult()> finish = [] { return kVRKNoError; };
+  VRKResult answer = kVRKNoError;
+  Handle made = 0;
   bool needsKernel = true;
-
-  std::vector<Argument> arguments = {};
   bool lacksPointer = false;
-  size_t failAt = 0;               // the allocation that fails
-  std::set<VRKResult> codes = {};  // of which it returns one; 0 where there are none
-  bool isTraced = false;
-  bool isEntered = false;
-  bool isLeft = false;
+
+  // For those who check it:
+  std::string operation = {};
+  std::vector<Argument> arguments = {};
+  std::vector<VRKResult> refusals = {};  // of which it returns one, if there are any
+  size_t failAt = 0;                     // the allocation that fails
   bool hasFailed = false;
+  bool isTraced = false;
+  uint32_t heard = 0;  // how often the trace hook did
   VRKResult told = 0;
 };
+
+// An operation and its name.
+#define OPERATION(function) #function, function
 
 class CheckedCalls {
  public:
@@ -113,7 +94,6 @@ class CheckedCalls {
   // Decisions: never the rare one where the input has ended.
   uint32_t Below(uint32_t count) { return choices.Below(count); }
   bool OneIn(uint32_t count) { return Below(count) == count - 1; }
-  Handle Odd();
   Argument Pick(Kind kind, bool mayBeNull = false);
   Argument PickToken(uint32_t first, uint32_t count);
   bool IsGood(const Argument& argument) const;
@@ -121,34 +101,31 @@ class CheckedCalls {
   Out<Value> MakeOut() {
     return {!OneIn(32)};
   }
+  template <class Pointer>
+  Needed<Pointer> Mostly(Pointer pointer) {
+    return {OneIn(32) ? nullptr : pointer};
+  }
 
   // Makes the call, checks what comes of it, and returns whether it succeeded.
   template <class Function, class... Given>
-  bool Run(Call call, Function function, Given&&... given) {
+  bool Run(Call& call, const char* operation, Function function, Given&&... given) {
     (Note(call, given), ...);
+    call.operation = operation;
     Enter(call);
     const VRKResult result = function(given...);
     Leave(call, result);
     Require(result == 0 || (IsUntouched(given) && ...), "a failure stores nothing");
     return result == 0;
   }
+  template <class Function, class... Given>
+  bool Run(const char* operation, Function function, Given&&... given) {
+    Call call;
+    return Run(call, operation, function, given...);
+  }
 
-  // Within a callback.
-  template <class Served>
-  static Served& Serving() {
-    current->Disarm();
-    Call& call = *current->calls.back();
-    Served** const served = std::get_if<Served*>(&call.service);
-    Require(served != nullptr && call.codes.empty(), "there is a reason to call");
-    return **served;
-  }
-  void Reenter();
-  VRKResult Answer(VRKResult usual);
-  // Throws instead of returning that it threw.
-  static VRKResult Returned(VRKResult result) {
-    if (kLibrariesShareRuntime && result == kVRKCallbackThrew) throw result;
-    return result;
-  }
+  // A callback: checks what it was given, goes on with the walk, stores what it makes, and answers,
+  // or throws that it threw.
+  static VRKResult Serve(const Told& told, Kind makes = Kind::kToken, void* out = nullptr);
   static VRKResult VRK_CALL OnTrace(const VRKHostTraceCall* told, void* context);
 
   static inline CheckedCalls* current = nullptr;
@@ -161,32 +138,24 @@ class CheckedCalls {
   bool isReading = false;    // what the hook need not look at
 
  private:
-  template <class Other>
-  static void Note(Call&, const Other&) {}
-  static void Note(Call& call, const Argument& given) { call.arguments.push_back(given); }
-  template <class Pointer>
-  static void Note(Call& call, const Needed<Pointer>& given) {
-    call.lacksPointer |= given.pointer == nullptr;
+  template <class Given>
+  static void Note(Call& call, const Given& given) {
+    if constexpr (requires { given.mayBeNull; }) call.arguments.push_back(given);
+    if constexpr (requires { given.IsLacking(); }) call.lacksPointer |= given.IsLacking();
   }
-  template <class Value>
-  static void Note(Call& call, const Out<Value>& given) {
-    call.lacksPointer |= given.isNeeded && !given.isGiven;
-  }
-  template <class Other>
-  static bool IsUntouched(const Other&) {
+  template <class Given>
+  static bool IsUntouched(const Given& given) {
+    if constexpr (requires { given.IsUntouched(); }) return given.IsUntouched();
     return true;
   }
-  template <class Value>
-  static bool IsUntouched(const Out<Value>& out) {
-    return out.value == out.Untouched();
-  }
 
-  std::set<VRKResult> RefusalsOf(const Call& call) const;
+  Handle Odd();
   void Enter(Call& call);
   void Begin();
   void Disarm();
   void Leave(Call& call, VRKResult result);
-  VRKResult HearOfStart(Call& call);
+  void Reenter();
+  VRKResult Answer(VRKResult usual);
 
   std::optional<AllocationMeter> meter;
   bool isInHook = false;

@@ -10,18 +10,22 @@ namespace {
 void* ContextOf(uintptr_t context) {
   return reinterpret_cast<void*>(context);
 }
+template <class... Given>
+Told MakeTold(void* context, Given... given) {
+  return {uintptr_t(context), {uintptr_t(given)...}};
+}
 std::string BytesOf(Handle handle) {
   return {reinterpret_cast<const char*>(&handle), sizeof handle};
 }
 
 class Walk : private CheckedCalls {
  public:
+  // A text's first token is made with every allocation failing in turn.
   explicit Walk(Choices& decisions) : CheckedCalls(decisions) {
     Start();
-    for (uint32_t number = 0; number < kKnownTexts.size(); ++number) {
-      VRKToken token{};
-      Require(VRKTokenCreate(kKnownTexts[number], 0, &token) == kVRKNoError, "a text has a token");
-      AddToken(number, uint32_t(token));
+    for (uint32_t number = 0; number < kTexts.size(); ++number) {
+      failAt = 1;
+      for (size_t next = 2; !CreateToken(number, {kTexts[number]}, {true}); ++next) failAt = next;
     }
   }
   void Go() {
@@ -32,94 +36,85 @@ class Walk : private CheckedCalls {
  private:
   Argument PickMessage() { return PickToken(0, 3); }
   Argument PickKey() { return PickToken(1, 3); }
-  Argument PickType() { return PickToken(3, OneIn(2) ? kKnownTexts.size() - 3 : 2); }
+  Argument PickType() { return PickToken(3, OneIn(4) ? kTexts.size() - 3 : 2); }
   uintptr_t PickContext() { return 1 + Below(3); }
-  template <class Callback>
-  Needed<Callback> Mostly(Callback callback) {
-    return {OneIn(32) ? nullptr : callback};
-  }
 
   // Objects
 
   void CreateObject() {
-    Creation it{PickToken(1, 2), Pick(Kind::kDictionary, true)};
-    it.objectClass.mayBeNull = true;
-    if (OneIn(2)) it.objectClass.handle = 0;
-    const auto begin = [&] {
-      const auto factories = KernelModel::Serving(model.factories, it.objectClass, 0);
-      if (!factories.empty()) it.factory = factories.back().context;
-      return it.objectClass.handle == 0 || it.factory != 0 ? kVRKNoError : kVRKNotFound;
+    Argument objectClass = PickToken(1, 2);
+    objectClass.mayBeNull = true;
+    if (OneIn(2)) objectClass.handle = 0;
+    const Argument parameters = Pick(Kind::kDictionary, true);
+    uintptr_t factory = 0;  // its context; 0 for none
+    Handle given = parameters;
+    Call call;
+    call.begin = [&] {
+      const std::vector<Key> factories = model.Serving(Kind::kFactory, objectClass, 0);
+      if (!factories.empty()) factory = model.At(factories.back()).context;
+      return objectClass.handle == 0 || factory != 0 ? kVRKNoError : kVRKNotFound;
     };
-    const auto finish = [&] { return model.ReleaseValue(it.temporary), it.result; };
+    // Where there are no parameters a factory gets an empty dictionary, for the time being.
+    call.next = [&](const Told& told) -> Told {
+      if (given == 0) model.Add(Kind::kDictionary, given = uint32_t(told.values[1]));
+      return {std::exchange(factory, 0), {objectClass, given}};
+    };
+    call.finish = [&] {
+      if (parameters.handle == 0) model.ReleaseValue(given);
+      return call.answer;
+    };
     auto out = MakeOut<VRKObject>();
-    const Call call{"VRKObjectCreate", begin, &it, finish};
-    if (!Run(call, VRKObjectCreate, it.objectClass, it.parameters, out)) return;
-    Require(it.isCalled == (it.factory != 0), "a factory is called");
-    if (!it.isCalled) model.Add(Kind::kObject, uint32_t(out.value));
-    Require(!it.isCalled || out.value == VRKObject{it.stored}, "and makes the object");
+    if (!Run(call, OPERATION(VRKObjectCreate), objectClass, parameters, out)) return;
+    Require(factory == 0, "a factory is called");
+    Require(call.made == 0 || out.value == VRKObject{call.made}, "and makes the object");
+    if (call.made == 0) model.Add(Kind::kObject, uint32_t(out.value));
   }
   static VRKResult VRK_CALL OnCreate(VRKToken objectClass, VRKDictionary parameters, void* context,
                                      VRKObject* out) {
-    auto& creation = Serving<Creation>();
-    Require(!std::exchange(creation.isCalled, true), "one factory is called");
-    Require(ContextOf(creation.factory) == context, "the one that was registered last");
-    Require(objectClass == VRKToken{creation.objectClass}, "for the class");
-    return Returned(Self().Create(creation, uint32_t(parameters), *out));
-  }
-  // Where there are no parameters a factory gets an empty dictionary, for the time being.
-  VRKResult Create(Creation& creation, Handle parameters, VRKObject& out) {
-    const Handle given = creation.parameters;
-    Require(given == 0 || given == parameters, "with the parameters");
-    if (given == 0) model.Add(Kind::kDictionary, creation.temporary = parameters);
-    Reenter();
-    out = Pick(Kind::kObject);
-    creation.stored = uint32_t(out);
-    const VRKResult answer = Answer(kVRKNoError);
-    const bool isMade = model.Is(Kind::kObject, creation.stored);
-    creation.result = answer == kVRKNoError && !isMade ? kVRKNoResult : answer;
-    return answer;
+    return Serve(MakeTold(context, objectClass, parameters), Kind::kObject, out);
   }
 
   void DeliverMessage() {
     const Argument object = Pick(Kind::kObject), message = PickMessage();
     const Argument parameters = Pick(Kind::kDictionary, true);
     Delivery it{object, message, parameters};
-    const auto begin = [&] { return model.BeginDelivery(it), kVRKNoError; };
-    const Call call{"VRKObjectDeliverMessage", begin, &it, [&] { return model.Finish(it); }};
-    Run(call, VRKObjectDeliverMessage, object, message, parameters, 1u);
+    Call call;
+    call.answer = kVRKNotHandled;
+    call.begin = [&] { return model.BeginDelivery(it), kVRKNoError; };
+    Deliver(call, it, OPERATION(VRKObjectDeliverMessage), object, message, parameters, 1u);
   }
   void ReleaseObject(Argument object) {
     Delivery it{object};
-    const auto begin = [&] {
-      if (it.object != 0) model.BeginRelease(it);
+    Call call;
+    call.begin = [&] {
+      if (it.object != 0) model.ReleaseObject(it);
       return kVRKNoError;
     };
-    const auto finish = [&] { return it.object != 0 ? model.Finish(it) : kVRKNoError; };
-    Run({"VRKObjectRelease", begin, &it, finish}, VRKObjectRelease, object);
+    Deliver(call, it, OPERATION(VRKObjectRelease), object);
+  }
+  template <class... Given>
+  void Deliver(Call& call, Delivery& it, Given... given) {
+    call.next = [&](const Told&) -> Told {
+      const Key handler = model.Next(it, call.answer);
+      Require(handler != 0, "a handler is left");
+      call.arguments.push_back({Kind::kHandler, uint32_t(handler)});
+      return {model.At(handler).context, {it.object, it.message, it.parameters}};
+    };
+    call.finish = [&] { return model.Finish(it, call.answer); };
+    Run(call, given...);
   }
   static VRKResult VRK_CALL OnMessage(VRKObject receiver, VRKToken message,
                                       VRKDictionary parameters, void* context) {
-    auto& delivery = Serving<Delivery>();
-    const Handle handler = Self().model.Next(delivery);
-    Require(handler != 0, "a handler is left");
-    Require(ContextOf(Self().model.At(handler).context) == context, "and it is its turn");
-    Require(receiver == VRKObject{delivery.object} && message == VRKToken{delivery.message} &&
-                parameters == VRKDictionary{delivery.parameters},
-            "to get the message");
-    Self().calls.back()->arguments.push_back({Kind::kHandler, handler});
-    Self().Reenter();
-    const VRKResult answer = Self().Answer(Self().OneIn(4) ? kVRKNoError : kVRKNotHandled);
-    Self().model.HaveTold(handler, delivery, answer);
-    return Returned(answer);
+    return Serve(MakeTold(context, receiver, message, parameters));
   }
 
   void InstallHandler() {
     const Argument object = Pick(Kind::kObject);
-    const uintptr_t context = nextNumber++;
-    const auto begin = [&] { return model.At(object).isDying ? kVRKInvalidHandle : kVRKNoError; };
+    const uintptr_t context = nextContext++;
+    Call call{[&] { return model.At(object).isDying ? kVRKInvalidHandle : kVRKNoError; }};
     auto out = MakeOut<VRKMessageHandler>();
-    if (!Run({"VRKMessageHandlerInstall", begin}, VRKMessageHandlerInstall, object, 0u,
-             Mostly(OnMessage), ContextOf(context), 0u, 0u, out)) {
+    if (!Run(call, OPERATION(VRKMessageHandlerInstall), object, 0u, Mostly(OnMessage),
+             ContextOf(context), 0u, 0u, out)) {
       return;
     }
     const Argument handler{Kind::kHandler, uint32_t(out.value)};
@@ -130,139 +125,115 @@ class Walk : private CheckedCalls {
     if (!OneIn(4)) AddMessages(handler);
   }
   void AddMessages(Argument handler) {
-    Call call{"VRKMessageHandlerAddMessages"};
+    Call call;
     for (uint32_t left = Below(4); left != 0; --left) call.arguments.push_back(PickMessage());
     const std::vector<VRKToken> messages(call.arguments.begin(), call.arguments.end());
     const auto count = static_cast<uint32_t>(messages.size());
     const VRKToken* const given = OneIn(32) ? nullptr : messages.data();
     call.lacksPointer = given == nullptr && count != 0;
-    if (!Run(call, VRKMessageHandlerAddMessages, handler, given, count)) return;
+    if (!Run(call, OPERATION(VRKMessageHandlerAddMessages), handler, given, count)) return;
     for (const VRKToken each : messages) model.At(handler).messages.insert(uint32_t(each));
   }
   void RemoveHandler() {
     const Argument handler = Pick(Kind::kHandler);
     Argument object = Pick(Kind::kObject);
     if (IsGood(handler) && !OneIn(8)) object.handle = model.At(handler).object;
-    const auto begin = [&] {
-      return model.At(handler).object == object.handle ? kVRKNoError : kVRKInvalidHandle;
-    };
-    const Call call{"VRKMessageHandlerRemove", begin};
-    if (Run(call, VRKMessageHandlerRemove, handler, object)) model.EndHandler(handler);
+    const auto isIts = [&] { return model.At(handler).object == object.handle; };
+    Call call{[&] { return isIts() ? kVRKNoError : kVRKInvalidHandle; }};
+    const bool isDone = Run(call, OPERATION(VRKMessageHandlerRemove), handler, object);
+    if (isDone) model.live.erase(handler.handle);
   }
 
   // Factories and coercions
 
-  template <class... Given>
-  void Register(Registrations& all, const Registration& added, const char* operation,
-                Given... given) {
-    const auto begin = [&] {
-      const auto same = [&](const Registration& each) { return each.context == added.context; };
-      const Registrations serving = KernelModel::Serving(all, added.from, added.to);
-      const bool exists = std::any_of(serving.begin(), serving.end(), same);
+  void Register(Kind kind) {
+    const bool isFactory = kind == Kind::kFactory;
+    const Argument type = isFactory ? PickToken(1, 2) : PickType(), toType = PickType();
+    const Handle to = isFactory ? 0 : toType.handle;
+    const uintptr_t context = PickContext();
+    void* const given = ContextOf(context);
+    Call call{[&] {
+      const std::vector<Key> serving = model.Serving(kind, type, to);
+      const auto isSame = [&](Key each) { return model.At(each).context == context; };
+      const bool exists = std::any_of(serving.begin(), serving.end(), isSame);
       return exists ? kVRKAlreadyExists : kVRKNoError;
+    }};
+    const bool isDone = isFactory ? Run(call, OPERATION(VRKObjectFactoryRegister), type, 0u,
+                                        Mostly(OnCreate), given)
+                                  : Run(call, OPERATION(VRKDataCoercionHandlerInstall), type,
+                                        toType, 0u, Mostly(OnCoerce), given);
+    if (isDone) model.Register(kind, type, to, context);
+  }
+  void Unregister(Kind kind, uintptr_t context) {
+    const auto isIts = [&](const auto& each) {
+      return each.second.kind == kind && each.second.context == context;
     };
-    if (Run({operation, begin}, given..., ContextOf(added.context))) all.push_back(added);
-  }
-  template <class... Given>
-  void Unregister(Registrations& all, uintptr_t context, const char* operation, Given... given) {
-    const auto isIts = [&](const Registration& each) { return each.context == context; };
-    const auto begin = [&] {
-      return std::any_of(all.begin(), all.end(), isIts) ? kVRKNoError : kVRKNotFound;
-    };
-    if (Run({operation, begin}, given...)) std::erase_if(all, isIts);
-  }
-  void RegisterFactory() {
-    const Argument objectClass = PickToken(1, 2);
-    Register(model.factories, {objectClass, 0, PickContext(), nextNumber++},
-             "VRKObjectFactoryRegister", VRKObjectFactoryRegister, objectClass, 0u,
-             Mostly(OnCreate));
-  }
-  void UnregisterFactory(uintptr_t context) {
-    Unregister(model.factories, context, "VRKObjectFactoryUnregister", VRKObjectFactoryUnregister,
-               0u, OnCreate, ContextOf(context));
-  }
-  void InstallCoercion() {
-    const Argument from = PickType(), to = PickType();
-    Register(model.coercions, {from, to, PickContext(), nextNumber++},
-             "VRKDataCoercionHandlerInstall", VRKDataCoercionHandlerInstall, from, to, 0u,
-             Mostly(OnCoerce));
-  }
-  void RemoveCoercion(uintptr_t context) {
-    Unregister(model.coercions, context, "VRKDataCoercionHandlerRemove",
-               VRKDataCoercionHandlerRemove, OnCoerce, ContextOf(context), 0u, 0u);
+    Call call{[&] {
+      const bool exists = std::any_of(model.live.begin(), model.live.end(), isIts);
+      return exists ? kVRKNoError : kVRKNotFound;
+    }};
+    void* const given = ContextOf(context);
+    const bool isDone =
+        kind == Kind::kFactory
+            ? Run(call, OPERATION(VRKObjectFactoryUnregister), 0u, OnCreate, given)
+            : Run(call, OPERATION(VRKDataCoercionHandlerRemove), OnCoerce, given, 0u, 0u);
+    if (isDone) std::erase_if(model.live, isIts);
   }
 
   // Tokens
 
-  void CreateToken(uint32_t number) {
-    const std::string text = TextOf(number);
-    const Needed<const char*> given{OneIn(64) ? nullptr : text.c_str()};
-    auto out = MakeOut<VRKToken>();
-    if (!Run({"VRKTokenCreate"}, VRKTokenCreate, given, 0u, out)) return;
-    AddToken(number, uint32_t(out.value));
+  bool CreateToken(uint32_t number, Needed<const char*> text, Out<VRKToken> out) {
+    const bool isMade = Run(OPERATION(VRKTokenCreate), text, 0u, out);
+    if (isMade) HaveToken(number, uint32_t(out.value));
+    return isMade;
+  }
+  void CreateAnyToken() {
+    const uint32_t number = Below(kTexts.size());
+    CreateToken(number, Mostly(kTexts[number]), MakeOut<VRKToken>());
   }
   void GetTokenString() {
-    const Argument token = PickToken(0, kKnownTexts.size());
-    const char* const text = VRKTokenGetString(token);
-    if (model.isRunning) CheckTokenString(token, text);
-    Require(model.isRunning || text == nullptr, "without a kernel there are no texts");
+    const Argument token = PickToken(0, kTexts.size());
+    if (model.isRunning) return CheckTokenString(token);
+    Require(VRKTokenGetString(token) == nullptr, "without a kernel there are no texts");
   }
 
   // Data
 
-  Argument PickPayload(Kind kind) { return kind == Kind::kToken ? PickMessage() : Pick(kind); }
   void AddData(Handle handle, Handle type, const std::string& bytes) {
     Item& data = model.Add(Kind::kData, handle);
     data.type = type;
     data.bytes = bytes;
     const Kind kind = PayloadKindOf(type);
     if (kind != Kind::kList && kind != Kind::kDictionary) return;
-    std::memcpy(&data.entries.emplace_back(), bytes.data(), sizeof(Handle));
+    std::memcpy(&data.entries[0], bytes.data(), sizeof(Handle));
     model.Retain(data.entries[0]);
   }
   void CreateData() {
     const Argument type = PickType();
-    const Kind kind = IsGood(type) ? PayloadKindOf(type) : Kind::kData;
+    const Kind kind = PayloadKindOf(type);
+    const Argument named = kind == Kind::kToken ? PickMessage() : Pick(kind);
     std::string bytes(Below(40), static_cast<char>('a' + Below(26)));
-    Call call{"VRKDataCreate"};
-    if (kind != Kind::kData) {
-      const Argument named = PickPayload(kind);
-      bytes = BytesOf(named);
-      if (OneIn(16)) bytes.resize(Below(9));
-      call.lacksPointer = bytes.size() != sizeof(Handle);
-      if (!call.lacksPointer) call.arguments = {named};
-    }
+    if (kind != Kind::kData) bytes = BytesOf(named).substr(0, OneIn(16) ? Below(4) : 4);
     const void* const given = OneIn(32) ? nullptr : bytes.data();
     const auto count = static_cast<uint32_t>(bytes.size());
-    call.lacksPointer |= given == nullptr && count != 0;
+    Call call;
+    call.lacksPointer = (given == nullptr && count != 0) || (kind != Kind::kData && count != 4);
+    if (kind != Kind::kData && count == 4) call.arguments = {named};
     auto out = MakeOut<VRKData>();
-    if (!Run(call, VRKDataCreate, type, given, count, 0u, out)) return;
-    AddData(uint32_t(out.value), type, bytes);
+    const bool isMade = Run(call, OPERATION(VRKDataCreate), type, given, count, 0u, out);
+    if (isMade) AddData(uint32_t(out.value), type, bytes);
   }
   void CreateHandleData() {
-    const uint32_t which = Below(3);
-    const Handle type = TokenOf(5 + which);
-    const Argument named = PickPayload(PayloadKindOf(type));
+    const Handle type = TokenOf(5 + Below(3));
+    const Kind kind = PayloadKindOf(type);
+    const Argument named = kind == Kind::kToken ? PickMessage() : Pick(kind);
     auto out = MakeOut<VRKData>();
-    const bool isMade = which == 0   ? Run({}, VRKHostTokenDataCreate, named, out)
-                        : which == 1 ? Run({}, VRKHostListDataCreate, named, out)
-                                     : Run({}, VRKHostDictionaryDataCreate, named, out);
-    if (!isMade) return;
-    AddData(uint32_t(out.value), type, BytesOf(named));
-    if (named.kind != Kind::kToken && OneIn(2)) Release(named);
-  }
-  void GetData(Argument data) {
-    Out<const void*> bytes{!OneIn(8), false};
-    Out<uint32_t> count{!OneIn(8), false};
-    Out<VRKToken> type{!OneIn(8), false};
-    if (!Run({"VRKDataGetData"}, VRKDataGetData, data, bytes, count, type)) return;
-    const Item& item = model.At(data);
-    Require(!count.isGiven || count.value == item.bytes.size(), "data has its size");
-    Require(!type.isGiven || type.value == VRKToken{item.type}, "and its type");
-    if (!bytes.isGiven) return;
-    Require((bytes.value == nullptr) == item.bytes.empty(), "no bytes are null");
-    const auto* const kept = static_cast<const char*>(bytes.value);
-    Require(std::equal(item.bytes.begin(), item.bytes.end(), kept), "it has its bytes");
+    const bool isMade = kind == Kind::kToken ? Run(OPERATION(VRKHostTokenDataCreate), named, out)
+                        : kind == Kind::kList
+                            ? Run(OPERATION(VRKHostListDataCreate), named, out)
+                            : Run(OPERATION(VRKHostDictionaryDataCreate), named, out);
+    if (isMade) AddData(uint32_t(out.value), type, BytesOf(named));
+    if (isMade && kind != Kind::kToken && OneIn(2)) Release(named);
   }
   // The bytes of data that the kernel has made, unseen by the trace.
   std::string Read(Handle data) {
@@ -274,117 +245,84 @@ class Walk : private CheckedCalls {
     return {static_cast<const char*>(bytes), count};
   }
 
-  void CoerceData() {
-    Conversion it{Pick(Kind::kData), PickType()};
-    for (const Registration& each : model.coercions) {
-      if (IsGood(it.data) && model.At(it.data).type == each.from && OneIn(2))
-        it.to.handle = each.to;
-    }
-    auto out = MakeOut<VRKData>();
-    const Call call{"VRKDataCoerce", [&] { return Begin(it); }, &it, [&] { return Finish(it); }};
-    if (!Run(call, VRKDataCoerce, it.data, it.to, out)) return;
-    const auto coerced = uint32_t(out.value);
-    const bool isSame = it.source.type == it.to.handle;
-    Require(it.result != kVRKNoError || coerced == it.stored, "the handler's data");
-    if (it.result == kVRKNoError) return;
-    if (isSame && coerced == it.data.handle) return model.Retain(coerced);
-    AddData(coerced, it.to, isSame ? it.source.bytes : Read(coerced));
-    GetData({Kind::kData, coerced});
-  }
   // The source is held while handlers are asked.
-  VRKResult Begin(Conversion& conversion) {
-    conversion.source = model.At(conversion.data);
-    if (conversion.source.type == conversion.to.handle) return kVRKNoError;
-    conversion.left = KernelModel::Serving(model.coercions, conversion.source.type, conversion.to);
-    model.Retain(conversion.data);
-    return kVRKNoError;
+  void CoerceData() {
+    const Argument data = Pick(Kind::kData), toType = PickType();
+    Item source;
+    std::vector<Key> left;
+    Call call{[&] {
+      source = model.At(data);
+      if (source.type != toType.handle) model.Retain(data);
+      left = model.Serving(Kind::kCoercion, source.type, toType);
+      return kVRKNoError;
+    }};
+    call.answer = kVRKCannotCoerce;
+    call.next = [&](const Told&) -> Told {
+      const Key next = model.TakeCoercion(left);
+      Require(next != 0 && source.type != toType.handle, "a handler is left");
+      return {model.At(next).context, {data, source.type, toType}};
+    };
+    call.finish = [&]() -> VRKResult {
+      if (source.type == toType.handle) return kVRKNoError;
+      const bool isThere = IsGood(data);
+      model.ReleaseValue(data);
+      if (call.answer != kVRKCannotCoerce) return call.answer;
+      Require(model.TakeCoercion(left) == 0, "every handler is asked");
+      const bool areTexts = IsText(source.type) && IsText(toType);
+      return !isThere ? kVRKInvalidHandle : areTexts ? kVRKNoError : kVRKCannotCoerce;
+    };
+    auto out = MakeOut<VRKData>();
+    if (!Run(call, OPERATION(VRKDataCoerce), data, toType, out)) return;
+    const auto coerced = uint32_t(out.value);
+    const bool isSame = source.type == toType.handle;
+    if (isSame && coerced == data.handle) return model.Retain(coerced);
+    if (isSame || call.answer != kVRKNoError)
+      AddData(coerced, toType, isSame ? source.bytes : Read(coerced));
+    else
+      Require(coerced == call.made, "the handler's data");
   }
-  VRKResult Finish(Conversion& conversion) {
-    if (conversion.source.type == conversion.to.handle) return kVRKNoError;
-    const bool isThere = IsGood(conversion.data);
-    model.ReleaseValue(conversion.data);
-    if (conversion.result != kVRKCannotCoerce) return conversion.result;
-    Require(model.TakeNext(conversion.left) == 0, "every handler is asked");
-    const bool areTexts = IsText(conversion.source.type) && IsText(conversion.to);
-    return !isThere ? kVRKInvalidHandle : areTexts ? kVRKNoError : kVRKCannotCoerce;
-  }
-  static VRKResult VRK_CALL OnCoerce(VRKData source, VRKToken fromType, VRKToken toType,
-                                     void* context, VRKData* out) {
-    auto& conversion = Serving<Conversion>();
-    const uintptr_t next = Self().model.TakeNext(conversion.left);
-    Require(next != 0 && ContextOf(next) == context, "it is the handler's turn");
-    Require(source == VRKData{conversion.data} && fromType == VRKToken{conversion.source.type} &&
-                toType == VRKToken{conversion.to},
-            "to coerce the data");
-    Self().Reenter();
-    *out = Self().Pick(Kind::kData);
-    conversion.stored = uint32_t(*out);
-    const VRKResult answer = Self().Answer(Self().OneIn(2) ? kVRKNoError : kVRKCannotCoerce);
-    const bool isMade = Self().model.Is(Kind::kData, conversion.stored);
-    conversion.result = answer == kVRKNoError && !isMade ? kVRKNoResult : answer;
-    return Returned(answer);
+  static VRKResult VRK_CALL OnCoerce(VRKData source, VRKToken type, VRKToken toType, void* context,
+                                     VRKData* out) {
+    return Serve(MakeTold(context, source, type, toType), Kind::kData, out);
   }
 
   // Lists and dictionaries
 
   void CreateDictionary() {
     auto out = MakeOut<VRKDictionary>();
-    if (!Run({"VRKDictionaryCreate"}, VRKDictionaryCreate, 0u, out)) return;
+    if (!Run(OPERATION(VRKDictionaryCreate), 0u, out)) return;
     model.Add(Kind::kDictionary, uint32_t(out.value));
   }
   void CreateList() {
     auto out = MakeOut<VRKList>();
-    if (Run({}, VRKHostListCreate, out)) model.Add(Kind::kList, uint32_t(out.value));
+    if (Run(OPERATION(VRKHostListCreate), out)) model.Add(Kind::kList, uint32_t(out.value));
   }
-  void SetDictionaryEntry() {
+  void SetEntry() {
     const Argument dictionary = Pick(Kind::kDictionary), key = PickKey(), data = Pick(Kind::kData);
-    if (!Run({"VRKDictionarySetEntry"}, VRKDictionarySetEntry, dictionary, key, data)) return;
+    if (!Run(OPERATION(VRKDictionarySetEntry), dictionary, key, data)) return;
     model.Retain(data);
-    model.ReleaseValue(std::exchange(model.At(dictionary).byKey[key], data));
-  }
-  void GetDictionaryEntry(Argument dictionary, Argument key) {
-    const auto begin = [&] {
-      return model.At(dictionary).byKey.contains(key) ? kVRKNoError : kVRKNotFound;
-    };
-    auto out = MakeOut<VRKData>();
-    const Call call{"VRKDictionaryGetEntry", begin};
-    if (!Run(call, VRKDictionaryGetEntry, dictionary, key, out)) return;
-    Require(out.value == VRKData{model.At(dictionary).byKey.at(key)}, "the entry of the key");
+    model.ReleaseValue(std::exchange(model.At(dictionary).entries[key], data));
   }
   void Append() {
     const Argument list = Pick(Kind::kList), data = Pick(Kind::kData);
-    if (!Run({}, VRKHostListAppend, list, data)) return;
+    if (!Run(OPERATION(VRKHostListAppend), list, data)) return;
     model.Retain(data);
-    model.At(list).entries.push_back(data);
+    std::map<Handle, Handle>& entries = model.At(list).entries;
+    entries[uint32_t(entries.size())] = data;
     if (OneIn(2)) Release(data);
-  }
-  void GetListSize(Argument list) {
-    auto out = MakeOut<uint32_t>();
-    if (!Run({"VRKListGetSize"}, VRKListGetSize, list, out)) return;
-    Require(out.value == model.At(list).entries.size(), "a list's size");
-  }
-  void GetListEntry(Argument list, uint32_t index) {
-    const auto begin = [&] {
-      return index < model.At(list).entries.size() ? kVRKNoError : kVRKNotFound;
-    };
-    auto out = MakeOut<VRKData>();
-    if (!Run({"VRKListGetEntry", begin}, VRKListGetEntry, list, index, out)) return;
-    Require(out.value == VRKData{model.At(list).entries[index]}, "the entry at the index");
   }
   void CreateKeyList() {
     const Argument dictionary = Pick(Kind::kDictionary);
     auto out = MakeOut<VRKList>();
-    if (!Run({"VRKDictionaryCreateKeyList"}, VRKDictionaryCreateKeyList, dictionary, out)) return;
-    ReadKeys(out.value, model.At(dictionary).byKey);
-  }
-  void ReadKeys(VRKList keys, std::map<Handle, Handle> expected) {
-    std::vector<Handle>& entries = model.Add(Kind::kList, uint32_t(keys)).entries;
+    if (!Run(OPERATION(VRKDictionaryCreateKeyList), dictionary, out)) return;
+    std::map<Handle, Handle> expected = model.At(dictionary).entries;
+    std::map<Handle, Handle>& entries = model.Add(Kind::kList, uint32_t(out.value)).entries;
     const bool was = std::exchange(isReading, true);
     VRKData key{};
-    while (VRKListGetEntry(keys, static_cast<uint32_t>(entries.size()), &key) == kVRKNoError) {
-      entries.push_back(uint32_t(key));
-      const std::string bytes = Read(entries.back());
-      AddData(entries.back(), TokenOf(5), bytes);
+    for (uint32_t next = 0; VRKListGetEntry(out.value, next, &key) == kVRKNoError; ++next) {
+      entries[next] = uint32_t(key);
+      const std::string bytes = Read(uint32_t(key));
+      AddData(uint32_t(key), TokenOf(5), bytes);
       const auto isListed = [&](const auto& each) { return BytesOf(each.first) == bytes; };
       Require(std::erase_if(expected, isListed) == 1, "a key is listed, once");
     }
@@ -392,36 +330,67 @@ class Walk : private CheckedCalls {
     Require(expected.empty(), "each key is listed");
   }
 
-  template <class Function>
-  void Retain(const char* operation, Kind kind, Function retain) {
-    const Argument counted = Pick(kind, true);
-    if (Run({operation}, retain, counted) && counted.handle != 0) model.Retain(counted);
+  // What can be read of data, lists and dictionaries
+
+  void GetData(Argument data) {
+    Out<const void*> bytes{!OneIn(8), false};
+    Out<uint32_t> count{!OneIn(8), false};
+    Out<VRKToken> type{!OneIn(8), false};
+    if (!Run(OPERATION(VRKDataGetData), data, bytes, count, type)) return;
+    const Item& item = model.At(data);
+    Require(!count.isGiven || count.value == item.bytes.size(), "data has its size");
+    Require(!type.isGiven || type.value == VRKToken{item.type}, "and its type");
+    if (!bytes.isGiven) return;
+    Require((bytes.value == nullptr) == item.bytes.empty(), "no bytes are null");
+    const auto* const kept = static_cast<const char*>(bytes.value);
+    Require(std::equal(item.bytes.begin(), item.bytes.end(), kept), "it has its bytes");
   }
-  template <class Function>
-  void ReleaseValue(const char* operation, Argument value, Function release) {
-    if (Run({operation}, release, value)) model.ReleaseValue(value);
+  void GetListSize(Argument list) {
+    auto out = MakeOut<uint32_t>();
+    if (!Run(OPERATION(VRKListGetSize), list, out)) return;
+    Require(out.value == model.At(list).entries.size(), "a list's size");
   }
-  void RetainSome() {
-    Retain("VRKObjectRetain", Kind::kObject, VRKObjectRetain);
-    Retain("VRKDataRetain", Kind::kData, VRKDataRetain);
-    Retain("VRKListRetain", Kind::kList, VRKListRetain);
-    Retain("VRKDictionaryRetain", Kind::kDictionary, VRKDictionaryRetain);
+  void GetEntry(Argument value, Handle at) {
+    const auto isThere = [&] { return model.At(value).entries.contains(at); };
+    Call call{[&] { return isThere() ? kVRKNoError : kVRKNotFound; }};
+    const Argument key{Kind::kToken, at};
+    auto out = MakeOut<VRKData>();
+    const bool isDone = value.kind == Kind::kList
+                            ? Run(call, OPERATION(VRKListGetEntry), value, at, out)
+                            : Run(call, OPERATION(VRKDictionaryGetEntry), value, key, out);
+    if (isDone) Require(out.value == VRKData{model.At(value).entries.at(at)}, "its entry");
+  }
+  void Read(Argument value) {
+    if (value.kind == Kind::kData) GetData(value);
+    if (value.kind == Kind::kList) GetListSize(value);
+    if (value.kind == Kind::kDictionary) GetEntry(value, PickKey());
+    if (value.kind == Kind::kList) GetEntry(value, Below(4));
+  }
+
+  // The rest
+
+  void Retain(Argument counted) {
+    const Kind kind = counted.kind;
+    const bool isDone = kind == Kind::kObject ? Run(OPERATION(VRKObjectRetain), counted)
+                        : kind == Kind::kData ? Run(OPERATION(VRKDataRetain), counted)
+                        : kind == Kind::kList ? Run(OPERATION(VRKListRetain), counted)
+                                              : Run(OPERATION(VRKDictionaryRetain), counted);
+    if (isDone) model.Retain(counted);
   }
   void Release(Argument counted) {
     counted.mayBeNull = true;
     const Kind kind = counted.kind;
     if (kind == Kind::kObject) return ReleaseObject(counted);
-    if (kind == Kind::kData) return ReleaseValue("VRKDataRelease", counted, VRKDataRelease);
-    if (kind == Kind::kList) return ReleaseValue("VRKListRelease", counted, VRKListRelease);
-    ReleaseValue("VRKDictionaryRelease", counted, VRKDictionaryRelease);
+    const bool isDone = kind == Kind::kData   ? Run(OPERATION(VRKDataRelease), counted)
+                        : kind == Kind::kList ? Run(OPERATION(VRKListRelease), counted)
+                                              : Run(OPERATION(VRKDictionaryRelease), counted);
+    if (isDone) model.ReleaseValue(counted);
   }
-
-  // The rest
 
   void AllocateMemory() {
     const uint32_t count = Below(100);
     auto out = MakeOut<void*>();
-    if (!Run({"VRKMemoryAllocate"}, VRKMemoryAllocate, count, 0u, out)) return;
+    if (!Run(OPERATION(VRKMemoryAllocate), count, 0u, out)) return;
     Require(uintptr_t(out.value) % alignof(std::max_align_t) == 0, "a block is aligned");
     std::memset(out.value, 1, count);
     Require(model.blocks.insert(out.value).second, "and new");
@@ -430,89 +399,85 @@ class Walk : private CheckedCalls {
   void DeallocateMemory() {
     const bool isGiven = !model.blocks.empty() && !isDeallocating && !OneIn(8);
     void* const block = isGiven ? *model.blocks.begin() : nullptr;
-    Call call{"VRKMemoryDeallocate"};
+    Call call;
     call.needsKernel = false;
     const bool was = std::exchange(isDeallocating, true);
-    if (Run(call, VRKMemoryDeallocate, block)) model.blocks.erase(block);
+    if (Run(call, OPERATION(VRKMemoryDeallocate), block)) model.blocks.erase(block);
     isDeallocating = was;
   }
 
   // The kernel's own reporter is silent where the flag is set.
   void ReportError() {
-    uint32_t once = OneIn(2) ? 1 : 0;
-    Report it{Below(1000), &once};
-    const auto begin = [&] {
-      it.isDue = reporter != 0;
-      if (!it.isDue) once = 1;
+    const uint32_t line = Below(1000);
+    uint32_t once = OneIn(2) ? 1 : 0, answer = 0;
+    uintptr_t due = 0;
+    Call call;
+    call.begin = [&] {
+      due = reporter;
+      if (due == 0) once = 1;
       return kVRKNoError;
     };
-    uint32_t answer = 0;
-    Run({"VRKRuntimeError", begin, &it}, [&] {
-      const auto& codes = calls.back()->codes;
-      answer = VRKRuntimeError(2, "domain,", "expression,", 0, "file,", it.line, "function", &once);
-      return codes.empty() ? kVRKNoError : *codes.begin();
+    call.next = [&](const Told&) {
+      return MakeTold(ContextOf(std::exchange(due, 0)), 2, kTexts[0], kTexts[1], kTexts[2], line,
+                      kTexts[3], &once);
+    };
+    Run(call, "VRKRuntimeError", [&] {
+      answer = VRKRuntimeError(2, kTexts[0], kTexts[1], 0, kTexts[2], line, kTexts[3], &once);
+      return call.refusals.empty() ? kVRKNoError : call.refusals[0];
     });
-    Require(!it.isDue && answer == it.answer, "the reporter answers");
+    const bool threw = kLibrariesShareRuntime && call.answer == kVRKCallbackThrew;
+    Require(due == 0 && answer == (threw ? 0 : call.answer), "the reporter answers");
   }
   static uint32_t VRK_CALL OnError(uint32_t severity, const char* domain, const char* expression,
                                    const char* file, uint32_t line, const char* function,
                                    uint32_t* onceFlag, void* context) {
-    auto& report = Serving<Report>();
-    Require(std::exchange(report.isDue, false), "one reporter is called");
-    Require(ContextOf(Self().reporter) == context, "the one that is set");
-    Require(severity == 2 && line == report.line && onceFlag == report.onceFlag, "with the check");
-    const std::string texts = std::string{domain} + expression + file + function;
-    Require(texts == "domain,expression,file,function", "and its texts");
-    Self().Reenter();
-    const VRKResult answer = Self().Answer(kVRKNoError);
-    report.answer = kLibrariesShareRuntime && answer == kVRKCallbackThrew ? 0 : answer;
-    return Returned(answer);
+    return Serve(MakeTold(context, severity, domain, expression, file, line, function, onceFlag));
   }
 
   void SetTraceHook(uintptr_t context) {
     const VRKHostTraceHook set = context != 0 ? OnTrace : nullptr;
-    if (Run({}, VRKHostSetTraceHook, set, ContextOf(context))) hook = context;
+    if (Run(OPERATION(VRKHostSetTraceHook), set, ContextOf(context))) hook = context;
   }
   void SetReporter(uintptr_t context) {
     const VRKHostErrorReporter set = context != 0 ? OnError : nullptr;
-    if (Run({}, VRKHostSetErrorReporter, set, ContextOf(context))) reporter = context;
+    if (Run(OPERATION(VRKHostSetErrorReporter), set, ContextOf(context))) reporter = context;
   }
   void Start() {
-    Call call{nullptr, [&] { return model.isRunning ? kVRKAlreadyExists : kVRKNoError; }};
+    Call call{[&] { return model.isRunning ? kVRKAlreadyExists : kVRKNoError; }};
     call.needsKernel = false;
-    if (Run(call, VRKHostStart)) model.isRunning = true;
+    if (Run(call, OPERATION(VRKHostStart))) model.isRunning = true;
   }
   void ShutDown() {
-    const auto begin = [&] { return depth != 0 ? kVRKInUse : kVRKNoError; };
-    VRKHostLiveCounts counts = model.Counts();
-    if (!Run({nullptr, begin}, VRKHostShutDown, OneIn(4) ? nullptr : &counts)) return;
-    RequireCounts(counts);
-    model.ShutDown();
+    Call call{[&] { return depth != 0 ? kVRKInUse : kVRKNoError; }};
+    VRKHostLiveCounts counts{};
+    const bool isAsked = !OneIn(4);
+    if (!Run(call, OPERATION(VRKHostShutDown), isAsked ? &counts : nullptr)) return;
+    if (isAsked) model.CheckCounts(counts);
+    model.isRunning = false;
+    model.live.clear();
     hook = 0;
     reporter = 0;
   }
-  void RequireCounts(const VRKHostLiveCounts& counts) const {
-    const VRKHostLiveCounts expected = model.Counts();
-    Require(std::memcmp(&counts, &expected, sizeof counts) == 0, "so much is alive");
-  }
   void GetCounts() {
     VRKHostLiveCounts counts{};
-    const Needed<VRKHostLiveCounts*> given{OneIn(64) ? nullptr : &counts};
-    if (Run({}, VRKHostGetLiveCounts, given)) RequireCounts(counts);
+    if (Run(OPERATION(VRKHostGetLiveCounts), Mostly(&counts))) model.CheckCounts(counts);
   }
 
   // Steps that take what there is
 
+  Argument PickCounted(bool mayBeNull) {
+    constexpr Kind kCounted[] = {Kind::kObject, Kind::kData, Kind::kList, Kind::kDictionary};
+    return Pick(kCounted[Below(4)], mayBeNull);
+  }
+  void RegisterFactory() { Register(Kind::kFactory); }
+  void InstallCoercion() { Register(Kind::kCoercion); }
   void AddToAny() { AddMessages(Pick(Kind::kHandler)); }
-  void UnregisterAnyFactory() { UnregisterFactory(PickContext()); }
-  void RemoveAnyCoercion() { RemoveCoercion(PickContext()); }
-  void CreateAnyToken() { CreateToken(Below(kTexts)); }
-  void GetAnyData() { GetData(Pick(Kind::kData)); }
-  void GetAnyEntry() { GetDictionaryEntry(Pick(Kind::kDictionary), PickKey()); }
-  void GetAnySize() { GetListSize(Pick(Kind::kList)); }
-  void GetAnyListEntry() { GetListEntry(Pick(Kind::kList), Below(4)); }
+  void UnregisterAny() { Unregister(Kind::kFactory, PickContext()); }
+  void RemoveAny() { Unregister(Kind::kCoercion, PickContext()); }
+  void ReadAny() { Read(PickCounted(false)); }
+  void RetainAny() { Retain(PickCounted(true)); }
   void ReleaseAny() {
-    const Argument counted = Pick(kCounted[Below(4)]);
+    const Argument counted = PickCounted(true);
     Release(counted);
     if (OneIn(4)) Release(counted);
   }
@@ -521,53 +486,24 @@ class Walk : private CheckedCalls {
   void EndOrStart() { OneIn(4) ? ShutDown() : Start(); }
 
   void Step() override {
-    static constexpr void (Walk::*kSteps[])() = {&Walk::EndOrStart,
-                                                 &Walk::CreateObject,
-                                                 &Walk::CreateObject,
-                                                 &Walk::CreateObject,
-                                                 &Walk::DeliverMessage,
-                                                 &Walk::DeliverMessage,
-                                                 &Walk::DeliverMessage,
-                                                 &Walk::InstallHandler,
-                                                 &Walk::InstallHandler,
-                                                 &Walk::InstallHandler,
-                                                 &Walk::AddToAny,
-                                                 &Walk::RemoveHandler,
-                                                 &Walk::RegisterFactory,
-                                                 &Walk::UnregisterAnyFactory,
-                                                 &Walk::InstallCoercion,
-                                                 &Walk::InstallCoercion,
-                                                 &Walk::RemoveAnyCoercion,
-                                                 &Walk::CreateAnyToken,
-                                                 &Walk::GetTokenString,
-                                                 &Walk::CreateData,
-                                                 &Walk::CreateData,
-                                                 &Walk::CreateHandleData,
-                                                 &Walk::GetAnyData,
-                                                 &Walk::CoerceData,
-                                                 &Walk::CoerceData,
-                                                 &Walk::CreateDictionary,
-                                                 &Walk::SetDictionaryEntry,
-                                                 &Walk::GetAnyEntry,
-                                                 &Walk::CreateKeyList,
-                                                 &Walk::CreateList,
-                                                 &Walk::Append,
-                                                 &Walk::GetAnySize,
-                                                 &Walk::GetAnyListEntry,
-                                                 &Walk::RetainSome,
-                                                 &Walk::ReleaseAny,
-                                                 &Walk::ReleaseAny,
-                                                 &Walk::ReleaseAny,
-                                                 &Walk::AllocateMemory,
-                                                 &Walk::DeallocateMemory,
-                                                 &Walk::ReportError,
-                                                 &Walk::SetAnyHook,
-                                                 &Walk::SetAnyReporter};
+    static constexpr std::pair<uint32_t, void (Walk::*)()> kSteps[] = {
+        {1, &Walk::EndOrStart},       {3, &Walk::CreateObject},     {3, &Walk::DeliverMessage},
+        {3, &Walk::InstallHandler},   {1, &Walk::AddToAny},         {1, &Walk::RemoveHandler},
+        {1, &Walk::RegisterFactory},  {1, &Walk::UnregisterAny},    {2, &Walk::InstallCoercion},
+        {1, &Walk::RemoveAny},        {1, &Walk::CreateAnyToken},   {1, &Walk::GetTokenString},
+        {2, &Walk::CreateData},       {1, &Walk::CreateHandleData}, {2, &Walk::ReadAny},
+        {2, &Walk::CoerceData},       {1, &Walk::CreateDictionary}, {1, &Walk::SetEntry},
+        {1, &Walk::CreateKeyList},    {1, &Walk::CreateList},       {1, &Walk::Append},
+        {2, &Walk::RetainAny},        {3, &Walk::ReleaseAny},       {1, &Walk::AllocateMemory},
+        {1, &Walk::DeallocateMemory}, {1, &Walk::ReportError},      {1, &Walk::SetAnyHook},
+        {1, &Walk::SetAnyReporter},   {1, &Walk::GetCounts}};
     const bool mayBeAny = model.isRunning || OneIn(4);
     if (kLibrariesShareRuntime && OneIn(8)) failAt = 1 + Below(6);
-    (this->*kSteps[mayBeAny ? Below(std::size(kSteps)) : 0])();
+    uint32_t passed = mayBeAny ? Below(42) : 0;
+    const auto* step = kSteps;
+    while (passed >= step->first) passed -= (step++)->first;
+    (this->*step->second)();
     failAt = 0;
-    GetCounts();
   }
 
   // Everything is as the model has it, and goes.
@@ -575,35 +511,28 @@ class Walk : private CheckedCalls {
     if (!model.isRunning) Start();
     SetTraceHook(0);
     SetReporter(0);
-    for (const auto& [handle, item] : model.live) Check(handle, item);
+    for (const auto& [key, item] : model.live) {
+      const Argument value{item.kind, uint32_t(key)};
+      Read(value);
+      for (const auto& [at, entry] : item.entries) {
+        if (item.kind != Kind::kData) GetEntry(value, at);
+      }
+    }
     for (uintptr_t context = 1; context <= 3; ++context) {
-      UnregisterFactory(context);
-      RemoveCoercion(context);
+      Unregister(Kind::kFactory, context);
+      Unregister(Kind::kCoercion, context);
     }
     while (!model.blocks.empty()) DeallocateMemory();
+    const auto isCounted = [](const auto& each) { return each.second.kind != Kind::kHandler; };
     while (!model.live.empty()) {
-      const auto isCounted = [](const auto& each) { return each.second.kind != Kind::kHandler; };
       const auto next = std::find_if(model.live.begin(), model.live.end(), isCounted);
-      Release({next->second.kind, next->first});
+      Release({next->second.kind, uint32_t(next->first)});
     }
-    GetCounts();
     ShutDown();
   }
-  void Check(Handle handle, const Item& item) {
-    if (item.kind == Kind::kData) GetData({item.kind, handle});
-    if (item.kind == Kind::kList) GetListSize({item.kind, handle});
-    for (uint32_t index = 0; item.kind == Kind::kList && index < item.entries.size(); ++index) {
-      GetListEntry({item.kind, handle}, index);
-    }
-    for (uint32_t number = 1; item.kind == Kind::kDictionary && number < 4; ++number) {
-      GetDictionaryEntry({item.kind, handle}, {Kind::kToken, TokenOf(number)});
-    }
-  }
 
-  static Walk& Self() { return static_cast<Walk&>(*current); }
-  static constexpr Kind kCounted[] = {Kind::kObject, Kind::kData, Kind::kList, Kind::kDictionary};
-  uint32_t nextNumber = 1;  // of a registration
-  uintptr_t reporter = 0;   // its context; 0 for none
+  uintptr_t nextContext = 1;  // of a handler
+  uintptr_t reporter = 0;     // its context; 0 for none
   bool isDeallocating = false;
 };
 

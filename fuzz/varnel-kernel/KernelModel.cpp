@@ -1,6 +1,7 @@
 #include "KernelModel.h"
 
 #include <algorithm>
+#include <cstring>
 #include <unordered_set>
 
 #include "Input.h"
@@ -8,19 +9,24 @@
 namespace {
 
 struct Token {
-  Handle token = 0;
+  Handle handle = 0;
   const char* kept = nullptr;  // where the kernel has its text
 };
-std::map<std::string, Token> gTokens;
-std::map<Handle, std::string> gTexts;
+std::array<Token, kTexts.size()> gTokens;
 
 // Handles that were issued, in walks before too: of the latest million no two are the same.
 std::unordered_set<Handle> gEver;
 
+size_t NumberOf(Handle token) {
+  size_t number = 0;
+  while (number < gTokens.size() && gTokens[number].handle != token) ++number;
+  return number;
+}
+
 }  // namespace
 
-bool KernelModel::Is(Kind kind, Handle handle) const {
-  const auto found = live.find(handle);
+bool KernelModel::Is(Kind kind, Key key) const {
+  const auto found = live.find(key);
   return found != live.end() && found->second.kind == kind;
 }
 
@@ -28,7 +34,16 @@ Item& KernelModel::Add(Kind kind, Handle handle) {
   if (gEver.size() == 500'000) gEver.clear();
   Require(handle != 0 && gEver.insert(handle).second, "a handle is new");
   ever.push_back(handle);
+  latest[static_cast<size_t>(kind)].push_back(handle);
   return live.emplace(handle, Item{kind}).first->second;
+}
+
+void KernelModel::Register(Kind kind, Handle type, Handle toType, uintptr_t context) {
+  Item& added = live[nextNumber++];
+  added.kind = kind;
+  added.context = context;
+  added.type = type;
+  added.toType = toType;
 }
 
 void KernelModel::Retain(Handle handle) {
@@ -40,8 +55,24 @@ void KernelModel::ReleaseValue(Handle value) {
   if (found == live.end() || --found->second.count != 0) return;
   const Item dead = found->second;
   live.erase(found);
-  for (const Handle entry : dead.entries) ReleaseValue(entry);
-  for (const auto& [key, entry] : dead.byKey) ReleaseValue(entry);
+  for (const auto& [key, entry] : dead.entries) ReleaseValue(entry);
+}
+
+std::vector<Key> KernelModel::Serving(Kind kind, Handle type, Handle toType) const {
+  std::vector<Key> serving;
+  for (const auto& [key, each] : live) {
+    if (each.kind == kind && each.type == type && each.toType == toType) serving.push_back(key);
+  }
+  return serving;
+}
+
+Key KernelModel::TakeCoercion(std::vector<Key>& left) const {
+  Key taken = 0;
+  while (!left.empty() && !Is(Kind::kCoercion, taken)) {
+    taken = left.back();
+    left.pop_back();
+  }
+  return Is(Kind::kCoercion, taken) ? taken : 0;
 }
 
 // A delivery holds a reference to its object.
@@ -51,11 +82,6 @@ void KernelModel::BeginDelivery(Delivery& delivery) {
   ++object.deliveries;
   delivery.left = object.handlers;
   delivery.phase = Delivery::kMessage;
-}
-
-void KernelModel::BeginRelease(Delivery& delivery) {
-  delivery.result = kVRKNoError;
-  ReleaseObject(delivery);
 }
 
 // An object without references dies, once, and not during a delivery, whose end it awaits.
@@ -71,118 +97,82 @@ void KernelModel::ReleaseObject(Delivery& delivery) {
   delivery.parameters = 0;
 }
 
-Handle KernelModel::Next(Delivery& delivery) {
+Key KernelModel::Next(Delivery& delivery, VRKResult answer) {
+  if (delivery.message == TokenOf(0)) live.erase(delivery.told);
+  delivery.told = 0;
   if (delivery.phase == Delivery::kMessage) {
-    const Handle next = delivery.result == kVRKNotHandled ? TakeNext(delivery) : 0;
-    if (next != 0) return next;
+    delivery.result = answer;
+    if (answer == kVRKNotHandled) delivery.told = TakeHandler(delivery);
+    if (delivery.told != 0) return delivery.told;
     --live.at(delivery.object).deliveries;
     ReleaseObject(delivery);
   }
-  return delivery.phase == Delivery::kDeath ? TakeNext(delivery) : 0;
+  if (delivery.phase == Delivery::kDeath) delivery.told = TakeHandler(delivery);
+  return delivery.told;
 }
 
 // The next handler that has not ended and wants the message; that of death, once.
-Handle KernelModel::TakeNext(Delivery& delivery) {
+Key KernelModel::TakeHandler(Delivery& delivery) {
   while (!delivery.left.empty()) {
-    const Handle handle = delivery.left.back();
+    const Key key = delivery.left.back();
     delivery.left.pop_back();
-    if (!Is(Kind::kHandler, handle)) continue;
-    Item& handler = live.at(handle);
+    if (!Is(Kind::kHandler, key)) continue;
+    Item& handler = live.at(key);
     const bool isDeath = delivery.message == TokenOf(0);
     if (!handler.messages.contains(delivery.message) || (isDeath && handler.isTold)) continue;
     handler.isTold = handler.isTold || isDeath;
-    return handle;
+    return key;
   }
   return 0;
 }
 
-void KernelModel::HaveTold(Handle handler, Delivery& delivery, VRKResult answer) {
-  if (delivery.message == TokenOf(0)) EndHandler(handler);
-  if (delivery.phase == Delivery::kMessage) delivery.result = answer;
-}
-
-VRKResult KernelModel::Finish(Delivery& delivery) {
-  Require(Next(delivery) == 0, "every handler is told");
+VRKResult KernelModel::Finish(Delivery& delivery, VRKResult answer) {
+  Require(Next(delivery, answer) == 0, "every handler is told");
   if (delivery.phase == Delivery::kDeath) {
-    for (const Handle handler : live.at(delivery.object).handlers) EndHandler(handler);
+    for (const Key handler : live.at(delivery.object).handlers) live.erase(handler);
     live.erase(delivery.object);
   }
   return delivery.result;
 }
 
-Registrations KernelModel::Serving(const Registrations& all, Handle from, Handle to) {
-  Registrations serving;
-  for (const Registration& each : all) {
-    if (each.from == from && each.to == to) serving.push_back(each);
-  }
-  return serving;
-}
-
-uintptr_t KernelModel::TakeNext(Registrations& left) const {
-  while (!left.empty()) {
-    const Registration next = left.back();
-    left.pop_back();
-    const auto isNext = [&](const Registration& each) { return each.number == next.number; };
-    if (std::any_of(coercions.begin(), coercions.end(), isNext)) return next.context;
-  }
-  return 0;
-}
-
-VRKHostLiveCounts KernelModel::Counts() const {
-  uint32_t counts[6] = {};
-  for (const auto& [handle, item] : live) ++counts[static_cast<size_t>(item.kind)];
-  const auto size = [](const auto& all) { return static_cast<uint32_t>(all.size()); };
-  return {counts[0],       counts[1],    size(factories),
-          size(coercions), counts[2],    counts[3],
-          counts[4],       size(blocks), 0};
-}
-
-void KernelModel::ShutDown() {
-  isRunning = false;
-  live.clear();
-  factories.clear();
-  coercions.clear();
-}
-
-std::string TextOf(uint32_t number) {
-  if (number < kKnownTexts.size()) return kKnownTexts[number];
-  return std::string(number % 40, 'n') + std::to_string(number);
+void KernelModel::CheckCounts(const VRKHostLiveCounts& counts) const {
+  uint32_t expected[sizeof counts / sizeof(uint32_t)] = {};
+  for (const auto& [key, item] : live) ++expected[static_cast<size_t>(item.kind)];
+  expected[7] = static_cast<uint32_t>(blocks.size());
+  Require(std::memcmp(&counts, expected, sizeof counts) == 0, "so much is alive");
 }
 
 bool IsToken(Handle token) {
-  return gTexts.contains(token);
+  return token != 0 && NumberOf(token) != gTokens.size();
 }
 
-Handle TokenOf(uint32_t number) {
-  return gTokens.at(TextOf(number)).token;
+Handle TokenOf(size_t number) {
+  return gTokens[number].handle;
 }
 
-Handle LastToken() {
-  return gTexts.rbegin()->first;
+void HaveToken(size_t number, Handle token) {
+  if (TokenOf(number) == 0 && !IsToken(token))
+    gTokens[number] = {token, VRKTokenGetString(VRKToken{token})};
+  Require(token != 0 && TokenOf(number) == token, "a text has a token of its own");
+  CheckTokenString(token);
 }
 
-void AddToken(uint32_t number, Handle token) {
-  const bool isNew = gTokens.emplace(TextOf(number), Token{token}).second;
-  Require(isNew == gTexts.emplace(token, TextOf(number)).second, "a new text has a new token");
-  Require(token != 0 && TokenOf(number) == token, "and an old one its own");
-}
-
-void CheckTokenString(Handle token, const char* text) {
+void CheckTokenString(Handle token) {
+  const char* const text = VRKTokenGetString(VRKToken{token});
   Require((text != nullptr) == IsToken(token), "a token has a text");
   if (text == nullptr) return;
-  Require(text == gTexts.at(token), "its own");
-  const char*& kept = gTokens.at(text).kept;
-  Require(kept == nullptr || kept == text, "which stays where it is");
-  kept = text;
+  const size_t number = NumberOf(token);
+  Require(text == std::string(kTexts[number]), "its own");
+  Require(text == gTokens[number].kept, "which stays where it is");
 }
 
 Kind PayloadKindOf(Handle type) {
-  const std::string& name = gTexts.at(type);
-  if (name == "type:orvane.vrk.list") return Kind::kList;
-  if (name == "type:orvane.vrk.dictionary") return Kind::kDictionary;
-  return name == "type:orvane.vrk.token" ? Kind::kToken : Kind::kData;
+  const size_t number = NumberOf(type);
+  if (number == 5) return Kind::kToken;
+  if (number == 6) return Kind::kList;
+  return number == 7 ? Kind::kDictionary : Kind::kData;
 }
 
 bool IsText(Handle type) {
-  return gTexts.at(type).starts_with("type:orvane.vrk.utf");
+  return type == TokenOf(4) || NumberOf(type) > 7;
 }

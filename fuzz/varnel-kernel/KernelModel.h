@@ -11,37 +11,31 @@
 #include "VarnelKernelHost.h"
 
 using Handle = uint32_t;  // of any kind, a token, or any 32 bits
+using Key = uint64_t;     // a handle, or the number of a factory or coercion, which is larger
 
-enum class Kind { kObject, kHandler, kData, kList, kDictionary, kToken };
+// What lives, in the order of the kernel's counts, and tokens.
+enum class Kind { kObject, kHandler, kFactory, kCoercion, kData, kList, kDictionary, kToken };
 
-// What a handle stands for: something of any kind, which uses its own of these.
+// Something of any kind, which uses its own of these.
 struct Item {
   Kind kind = Kind::kData;
   uint64_t count = 1;
 
-  std::vector<Handle> handlers = {};  // an object's, in the order of installation; some have ended
+  std::vector<Key> handlers = {};  // an object's, in the order of installation; some have ended
   int deliveries = 0;
   bool isDying = false;
 
-  Handle object = 0;  // a handler's
-  uintptr_t context = 0;
+  uintptr_t context = 0;  // a handler's, factory's or coercion's
+  Handle object = 0;      // a handler's
   std::set<Handle> messages = {};
   bool isTold = false;  // of its object's death
 
-  Handle type = 0;  // of data
+  Handle type = 0;    // of data; what a factory serves, or a coercion coerces
+  Handle toType = 0;  // what a coercion coerces into
   std::string bytes = {};
-  std::vector<Handle> entries = {};     // a list's; of data, the one that its payload names
-  std::map<Handle, Handle> byKey = {};  // a dictionary's
+  // A list's by index, a dictionary's by key; of data, the value that its payload names.
+  std::map<Handle, Handle> entries = {};
 };
-
-// A factory of a class (`from`), or a coercion. No two have the same number.
-struct Registration {
-  Handle from;
-  Handle to;
-  uintptr_t context;
-  uint32_t number;
-};
-using Registrations = std::vector<Registration>;
 
 // A message on its way through an object's handlers, or the news of the object's death, which may
 // follow.
@@ -51,69 +45,64 @@ struct Delivery {
   Handle object;
   Handle message = 0;
   Handle parameters = 0;
-  VRKResult result = kVRKNotHandled;
+  VRKResult result = kVRKNoError;
   Phase phase = kOver;
-  std::vector<Handle> left = {};  // the next one last
+  std::vector<Key> left = {};  // the next one last
+  Key told = 0;                // the latest
 };
 
 class KernelModel {
  public:
-  bool Is(Kind kind, Handle handle) const;
+  bool Is(Kind kind, Key key) const;
   Item& Add(Kind kind, Handle handle);
-  Item& At(Handle handle) { return live.at(handle); }
+  Item& At(Key key) { return live.at(key); }
+  void Register(Kind kind, Handle type, Handle toType, uintptr_t context);
   void Retain(Handle handle);
   void ReleaseValue(Handle value);
-  void EndHandler(Handle handler) { live.erase(handler); }
 
-  // What delivers a message, or releases an object, begins, tells who is Next as long as somebody
-  // is, and finishes with its result.
+  // Those that serve the type, or pair of types, the first to be asked last.
+  std::vector<Key> Serving(Kind kind, Handle type, Handle toType) const;
+  // The next coercion that is installed still; 0 for none.
+  Key TakeCoercion(std::vector<Key>& left) const;
+
+  // What delivers a message, or releases an object, begins, learns of each answer who is Next as
+  // long as somebody is, and finishes with its result.
   void BeginDelivery(Delivery& delivery);
-  void BeginRelease(Delivery& delivery);
-  Handle Next(Delivery& delivery);
-  void HaveTold(Handle handler, Delivery& delivery, VRKResult answer);
-  VRKResult Finish(Delivery& delivery);
+  void ReleaseObject(Delivery& delivery);
+  Key Next(Delivery& delivery, VRKResult answer);
+  VRKResult Finish(Delivery& delivery, VRKResult answer);
 
-  // Those that serve the pair, the first to be asked last.
-  static Registrations Serving(const Registrations& all, Handle from, Handle to);
-  // The context of the next coercion that is installed still; 0 for none.
-  uintptr_t TakeNext(Registrations& left) const;
-
-  VRKHostLiveCounts Counts() const;
-  void ShutDown();
+  void CheckCounts(const VRKHostLiveCounts& counts) const;
 
   bool isRunning = false;
-  std::map<Handle, Item> live;
-  std::vector<Handle> ever;  // what was ever issued
-  Registrations factories;
-  Registrations coercions;
+  std::map<Key, Item> live;
+  std::vector<Handle> ever;                   // what was ever issued
+  std::array<std::vector<Handle>, 7> latest;  // of each kind, perhaps dead
   std::set<void*> blocks;
+  uint64_t nextNumber = uint64_t{1} << 32;
 
  private:
-  Handle TakeNext(Delivery& delivery);
-  void ReleaseObject(Delivery& delivery);
+  Key TakeHandler(Delivery& delivery);
 };
 
-// Tokens last as long as the process. First come texts that every walk knows: messages, keys and
-// classes, types, all that the kernel makes itself among them. The others are there to be new.
-inline constexpr std::array kKnownTexts = {"message:orvane.vrk.object-died",
-                                           "one",
-                                           "a text that is too long to stand within a string",
-                                           "",
-                                           "type:orvane.vrk.utf8",
-                                           "type:orvane.vrk.token",
-                                           "type:orvane.vrk.list",
-                                           "type:orvane.vrk.dictionary",
-                                           "type:orvane.vrk.utf16",
-                                           "type:orvane.vrk.utf16le",
-                                           "type:orvane.vrk.utf16be"};
-inline constexpr uint32_t kTexts = 500;
+// Tokens last as long as the process. These texts are all that there are: messages, keys and
+// classes, types, all that the kernel makes itself among them.
+inline constexpr std::array kTexts = {"message:orvane.vrk.object-died",
+                                      "one",
+                                      "a text that is too long to stand within a string",
+                                      "",
+                                      "type:orvane.vrk.utf8",
+                                      "type:orvane.vrk.token",
+                                      "type:orvane.vrk.list",
+                                      "type:orvane.vrk.dictionary",
+                                      "type:orvane.vrk.utf16",
+                                      "type:orvane.vrk.utf16le",
+                                      "type:orvane.vrk.utf16be"};
 
-std::string TextOf(uint32_t number);
 bool IsToken(Handle token);
-Handle TokenOf(uint32_t number);
-Handle LastToken();
-void AddToken(uint32_t number, Handle token);
-void CheckTokenString(Handle token, const char* text);
+Handle TokenOf(size_t number);  // of a text; 0 where it has none yet
+void HaveToken(size_t number, Handle token);
+void CheckTokenString(Handle token);
 
 // What data of a type has as its payload: a handle of this kind, or text.
 Kind PayloadKindOf(Handle type);  // kData where it names no handle
