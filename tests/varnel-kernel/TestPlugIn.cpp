@@ -14,10 +14,6 @@ namespace {
 
 std::string gTold;
 
-bool IsToldTo(const std::string& what) {
-  return gTold == what;
-}
-
 VRKToken Token(const char* text) {
   VRKToken token{};
   VRKTokenCreate(text, 1, &token);
@@ -46,11 +42,11 @@ EXPORTED VRKResult VRK_CALL TestInitialize(uint32_t) {
   VRKObject kept{};
   VRKObjectFactoryRegister(Token("class:test.plug-in"), 0, Make, nullptr);
   VRKResult result = VRKObjectCreate(Token("class:test.plug-in"), VRKDictionary{}, &kept);
-  if (!IsToldTo("factory")) VRKObjectFactoryUnregister(0, Make, nullptr);
-  if (IsToldTo("coercion")) {
+  if (gTold != "factory") VRKObjectFactoryUnregister(0, Make, nullptr);
+  if (gTold == "coercion") {
     VRKDataCoercionHandlerInstall(Token("type:test.a"), Token("type:test.b"), 0, Coerce, nullptr);
   }
-  if (IsToldTo("handler")) {
+  if (gTold == "handler") {
     VRKObject everlasting{};
     VRKMessageHandler registration{};
     VRKObjectCreate(VRKToken{}, VRKDictionary{}, &everlasting);
