@@ -1,5 +1,6 @@
 """What the tests of the kolvane command share. The command is their first argument."""
 
+import functools
 import os
 import pathlib
 import struct
@@ -10,6 +11,14 @@ import unittest
 
 KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
 PAD = b"\n" * 30  # no file is too short for its lines
+
+
+def utf16(text):
+    return ("\ufeff" + text + PAD.decode()).encode("utf-16-le", "surrogatepass")
+
+
+def bucket(key):
+    return functools.reduce(lambda hashed, byte: (32 * hashed + byte) % 1021, key, 0)
 
 
 def image(groups, encoding=0, minor=5):
@@ -46,9 +55,10 @@ class CommandTest(unittest.TestCase):
 
     def run_kolvane(self, *arguments, stdin=b"", **options):
         """Returns the status, standard output and standard error."""
-        done = subprocess.run([*KOLVANE, *map(str, arguments)], input=stdin, cwd=self.folder, timeout=60, stderr=subprocess.PIPE,
-                              stdout=options.pop("stdout", subprocess.PIPE), **options)
-        return done.returncode, done.stdout or b"", done.stderr.decode()
+        given = {"input" if isinstance(stdin, bytes) else "stdin": stdin}
+        chosen = {"cwd": self.folder, "timeout": 60, "stdout": subprocess.PIPE, "stderr": subprocess.PIPE, **given, **options}
+        done = subprocess.run([*KOLVANE, *map(str, arguments)], **chosen)
+        return done.returncode, done.stdout or b"", (done.stderr or b"").decode()
 
     def file(self, content, name="d.txt"):
         self.folder.joinpath(name).write_bytes(content)

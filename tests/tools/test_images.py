@@ -1,4 +1,4 @@
-"""Runs compile, dump and convert, and every command on files that fail: test_images.py COMMAND SAMPLES ISO-CODES."""
+"""Runs compile, dump and convert: test_images.py COMMAND SAMPLES."""
 
 import json
 import os
@@ -6,10 +6,9 @@ import pathlib
 import sys
 import unittest
 
-from command import KOLVANE, PAD, CommandTest
+from command import KOLVANE, PAD, CommandTest, bucket, image
 
 SAMPLES = pathlib.Path(sys.argv.pop(1)).resolve()
-ISO_CODES = pathlib.Path(sys.argv.pop(1)).resolve()
 
 
 class Images(CommandTest):
@@ -21,19 +20,15 @@ class Images(CommandTest):
     def bytes_of(self, name):
         return self.folder.joinpath(name).read_bytes()
 
-    def test_compile_dump_compile(self):
-        for path in [*SAMPLES.glob("*.txt"), *SAMPLES.glob("*.bin"), *ISO_CODES.glob("*iso_3166-1.txt")]:
-            for options in [["--format", "1.0", "--values", "utf-8"], ["--format", "1.5"]]:
-                with self.subTest(path.name, options=options):
-                    self.good("compile", path, "-o", "one", *options)
-                    for source, how in [("one", []), ("one", ["--utf-16"]), (path, ["--sort"])]:
-                        self.file(name="text", content=self.good("dump", source, *how))
-                        self.good("compile", "text", "-o", "two", *options)
-                        self.assertEqual(self.bytes_of("one"), self.bytes_of("two"))
-                    keys = b"".join(b"$$$" + entry["key"].encode() + b"=?\0"
-                                    for entry in json.loads(self.good("dump", "--json", path))["entries"])
-                    self.assertEqual(self.good("translate", "--nul", "--dictionary", "one", stdin=keys),
-                                     self.good("translate", "--nul", "--dictionary", path, stdin=keys))
+    def test_real_dictionaries_stay_the_same(self):
+        for path in [*SAMPLES.glob("*.txt"), SAMPLES / "it.bin"]:
+            with self.subTest(path.name):
+                self.good("compile", path, "-o", "one")
+                self.good("compile", "-", "-o", "two", stdin=self.good("dump", "--sort", path))
+                self.assertEqual(self.bytes_of("one"), self.bytes_of("two"))
+                keys = b"".join(b"$$$" + entry["key"].encode() + b"=?\0" for entry in json.loads(self.good("dump", "--json", path))["entries"])
+                self.assertEqual(self.good("translate", "--nul", "--dictionary", "one", stdin=keys),
+                                 self.good("translate", "--nul", "--dictionary", path, stdin=keys))
 
     def test_dump_keeps_the_order_of_the_file(self):
         self.file(name="both", content=b'"/k=two"\n"/b=second"\n"/a=first"\n"/k=last"' + PAD)
@@ -83,11 +78,7 @@ class Images(CommandTest):
         values = ['"', "^#{", "\\", "a\0", "#{amp}", "\u2028", "\ud800", "\t\r\n\b", "plain"]
         keys = [f"/{i}".encode() for i in range(len(values))]
         data = [value.encode("utf-16-le", "surrogatepass") for value in values]
-        lengths = b"".join(len(part).to_bytes(4, "little") for pair in zip(keys, data) for part in pair)
-        buckets = b"".join((47 * 32 + key[1]).__mod__(1021).to_bytes(2, "little") for key in keys)
-        counts = b"".join((2 * i + 2).to_bytes(4, "little") for i in range(len(keys)))
-        self.file(name="image", content=b"Kolvane Binary Format\1\5\0" + len(keys).to_bytes(4, "little") + counts + lengths + buckets
-                  + b"".join(key + value for key, value in zip(keys, data)))
+        self.file(name="image", content=image([(bucket(key), [(key, value)]) for key, value in zip(keys, data)]))
         status, output, errors = self.run_kolvane("dump", "image")
         self.assertEqual(status, 1)
         self.assertEqual(output.decode(), '"$$$/0=\\""\n"$$$/1=^^#{"\n"$$$/2=\\\\\n"$$$/7=\\t\\r\\n\\b"\n"$$$/8=plain"\n')
@@ -122,39 +113,6 @@ class Images(CommandTest):
             self.assertEqual((status, output), (2, b""))
             self.assertIn(message, errors)
             self.assertFalse(self.folder.joinpath("out").exists())
-
-    # How each command is called on a file, in a way that prints something.
-    COMMANDS = [["compile", "-o", "-"], ["dump"], ["convert", "-o", "-", "--to", "utf-8"], ["check", "-W", "--fail-on=info"],
-                ["stats"], ["translate", "a=b", "--dictionary"]]
-
-    def test_files_that_cannot_be_read(self):
-        self.folder.joinpath("folder").mkdir()
-        for command in self.COMMANDS:
-            for name, reason in [("missing", "No such file or directory"), ("folder", "Is a directory|Permission denied")]:
-                status, output, errors = self.run_kolvane(*command, name)
-                self.assertEqual(status, 2, command)
-                self.assertRegex(errors, f"^kolvane: {name}: ({reason})\n")
-
-    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
-    def test_output_that_cannot_be_written(self):
-        self.file(name="in", content=b'"/a=b"\n"/a=\xe9^x"' + PAD)
-        for command in self.COMMANDS:
-            with open("/dev/full", "wb") as full:
-                status, _, errors = self.run_kolvane(*command, "in", stdout=full)
-            self.assertEqual(status, 2, command)
-            self.assertIn("kolvane: cannot write to standard output: No space left on device\n", errors)
-            if len(KOLVANE) > 1:  # the emulator does not tell of a closed pipe while it is not full
-                continue
-            reading, writing = os.pipe()
-            os.close(reading)
-            with os.fdopen(writing, "wb") as closed:
-                status, _, errors = self.run_kolvane(*command, "in", stdout=closed, restore_signals=False)
-            self.assertEqual((status, "write" in errors), (2, False), command)
-        self.file(name="large", content=b'"/a=' + b"x" * 100000)
-        for source, name in [("in", "/dev/full"), ("large", "/dev/full"), ("in", "no-folder/out")]:
-            status, output, errors = self.run_kolvane("compile", source, "-o", name)
-            self.assertEqual((status, output), (2, b""))
-            self.assertRegex(errors, f"^kolvane: {name}: .+\n$")
 
 
 if __name__ == "__main__":

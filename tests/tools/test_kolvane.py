@@ -1,69 +1,43 @@
 """Runs the kolvane command as its users do: test_kolvane.py COMMAND SAMPLES STUBBORN-PLUG-IN KERNEL."""
 
-import contextlib
+import itertools
 import os
 import pathlib
 import signal
 import subprocess
 import sys
-import tempfile
 import unittest
 
-KOLVANE = [*os.environ.get("EMULATOR", "").split(), sys.argv.pop(1)]
+from command import KOLVANE, PAD, CommandTest, bucket, image
+
 SAMPLES = pathlib.Path(sys.argv.pop(1))
 STUBBORN = pathlib.Path(sys.argv.pop(1))
 KERNEL = sys.argv.pop(1)
 CANCEL = "$$$/Dialog/Cancel=Cancel"
 
 
-def run(*arguments, stdin=b"", **options):
-    """Returns the status, standard output and standard error."""
-    done = subprocess.run([*KOLVANE, *map(str, arguments)], input=stdin, stderr=subprocess.PIPE,
-                          stdout=options.pop("stdout", subprocess.PIPE), timeout=60, **options)
-    return done.returncode, (done.stdout or b"").decode(), done.stderr.decode()
-
-
-def translate(*arguments, **options):
-    return run("translate", *arguments, **options)
-
-
-class Translate(unittest.TestCase):
-    def setUp(self):
-        self.folder = tempfile.TemporaryDirectory()
-        self.addCleanup(self.folder.cleanup)
-
-    def file(self, content, name="d.txt"):
-        path = pathlib.Path(self.folder.name, name)
-        path.write_bytes(content)
-        return path
-
-    def test_samples_in_every_form(self):
-        for name, cancel in {"de.txt": "Abbrechen", "fr.txt": "Annuler", "ja.txt": "キャンセル", "es.txt": "Cancelar",
-                             "pl.txt": "Anuluj", "it.txt": "Annulla", "it.bin": "Annulla"}.items():
-            with self.subTest(name):
-                self.assertEqual(translate("--dictionary", SAMPLES / name, CANCEL), (0, cancel + "\n", ""))
+class Translate(CommandTest):
+    def translate(self, *arguments, **options):
+        status, output, errors = self.run_kolvane("translate", *arguments, **options)
+        return status, output.decode(), errors
 
     def test_dictionaries_before_defaults_before_default_text(self):
         first = self.file(b'"$$$/a=first"\n"$$$/b=first"\n', "1")
-        second = self.file(b'"$$$/b=second"\n\n\n\n\n\n\n\n\n', "2")
+        second = self.file(b'"$$$/b=second"\n' + PAD, "2")
         fallback = self.file(b'"$$$/b=fallback"\n"$$$/c=fallback"\n', "3")
         keys = [f"$$$/{name}=text" for name in "abcd"]
-        self.assertEqual(translate("--dictionary", first, "--default-dictionary", fallback, "--dictionary", second, *keys),
+        self.assertEqual(self.translate("--dictionary", first, "--default-dictionary", fallback, "--dictionary", second, *keys),
                          (0, "first\nsecond\nfallback\ntext\n", ""))
 
-    def test_keys_are_taken_as_they_are(self):
-        keys = ["[a,b]=x", "[]", "{}", "", "/a=ä€𝄞", "-", "a=two\nlines"]
-        self.assertEqual(translate(*keys)[1], "x\n\n\n\nä€𝄞\n\ntwo\nlines\n")
-        self.assertEqual(translate("--nul", "a=1", "--", "--b=2", "--")[1], "1\0" + "2\0" + "\0")
-
-    def test_keys_on_standard_input(self):
-        long = b"x" * 300000
-        for options, stdin, expected in [([], b"", ""), ([], b"a=1\n\nb=2", "1\n\n2\n"), ([], b"a=1\r\nb=2\n", "1\n2\n"),
-                                         ([], b"a=1\0b=2\n", "1\n2\n"), (["--nul"], b"a=1\r\0", "1\r\0"),
-                                         ([], b"a=" + long, long.decode() + "\n"),
-                                         (["--nul"], b"a=1\n\0\0b=2", "1\n\0\0" + "2\0")]:
-            self.assertEqual(translate(*options, stdin=stdin), (0, expected, ""))
-        self.assertEqual(translate("a=1", stdin=b"b=2\n")[1], "1\n")
+    def test_keys(self):
+        long = "x" * 300000
+        for arguments, stdin, expected in [
+                (["[a,b]=x", "[]", "{}", "", "/a=ä€𝄞", "-", "a=two\nlines"], b"b=2\n", "x\n\n\n\nä€𝄞\n\ntwo\nlines\n"),
+                (["--nul", "a=1", "--", "--b=2", "--"], b"", "1\0" + "2\0" + "\0"),
+                ([], b"", ""), ([], b"a=1\n\nb=2", "1\n\n2\n"), ([], b"a=1\r\nb=2\n", "1\n2\n"), ([], b"a=1\0b=2\n", "1\n2\n"),
+                (["--nul"], b"a=1\r\0", "1\r\0"), ([], f"a={long}".encode(), long + "\n"), (["--nul"], b"a=1\n\0\0b=2", "1\n\0\0" + "2\0"),
+                (["--dictionary", "-", "$$$/a=b"], b'"$$$/a=from standard input"\n', "from standard input\n")]:
+            self.assertEqual(self.translate(*arguments, stdin=stdin), (0, expected, ""))
 
     def test_answers_come_while_the_input_stays_open(self):
         with subprocess.Popen([*KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE) as process:
@@ -72,19 +46,30 @@ class Translate(unittest.TestCase):
                 process.stdin.flush()
                 self.assertEqual(process.stdout.readline(), b"%d\n" % number)
 
+    def test_input_without_keys(self):
+        nothing, folder = open(os.devnull, "rb"), os.open(self.folder, os.O_RDONLY)
+        self.addCleanup(nothing.close)
+        self.addCleanup(os.close, folder)
+        self.assertEqual(self.translate(stdin=nothing), (0, "", ""))
+        self.assertEqual(self.translate(stdin=folder), (2, "", "kolvane: cannot read standard input\n"))
+        if not hasattr(os, "openpty"):
+            return
+        for end in (ends := os.openpty()):
+            self.addCleanup(os.close, end)
+        status, _, errors = self.translate(stdin=ends[1])
+        self.assertEqual(status, 2)
+        self.assertIn("try 'kolvane translate --help'", errors)
+
     def test_encodings(self):
-        utf8 = self.file('"$$$/a=Żółć"\n"$$$/b=x"\n'.encode())
-        marked = self.file('\ufeff"$$$/a=Żółć"\n'.encode(), "marked")
-        legacy = self.file('"$$$/a=Größe"\n"$$$/b=x"\n'.encode("cp1252"), "legacy")
-        binary = self.file(bytes.fromhex("4b6f6c76616e652042696e61727920466f726d6174010501"
-                                         "01000000020000000200000002000000440200002f61c3a4")
-                           .replace(b"\x44\x02\0\0", b"\x44\x02"), "binary")
-        for file, how, expected in [(utf8, "auto", "Żółć"), (utf8, "image", "Å»Ã³Å‚Ä‡"), (utf8, "utf-8", "Żółć"),
-                                    (marked, "auto", "Żółć"), (marked, "utf-8", "Żółć"), (legacy, "auto", "Größe"),
-                                    (legacy, "utf-8", "Gr\ufffd\ufffde"), (binary, "auto", "ä")]:
-            with self.subTest(file=file, how=how):
-                self.assertEqual(translate("--encoding", how, "--dictionary", file, "$$$/a=none"),
-                                 (0, expected + "\n", ""))
+        text = '"$$$/a={}"\n"$$$/b=x"\n'
+        utf8 = text.format("Żółć").encode()
+        legacy = text.format("Größe").encode("cp1252")
+        binary = image([(bucket(b"/a"), [(b"/a", "ä".encode())])], 1)
+        for content, how, expected in [(utf8, "auto", "Żółć"), (utf8, "image", "Å»Ã³Å‚Ä‡"), (utf8, "utf-8", "Żółć"),
+                                       (b"\xef\xbb\xbf" + utf8, "auto", "Żółć"), (b"\xef\xbb\xbf" + utf8, "utf-8", "Żółć"),
+                                       (legacy, "auto", "Größe"), (legacy, "utf-8", "Gr\ufffd\ufffde"), (binary, "auto", "ä")]:
+            with self.subTest(content, how=how):
+                self.assertEqual(self.translate("--encoding", how, "--dictionary", self.file(content), "$$$/a=none"), (0, expected + "\n", ""))
 
     def test_warns_of_what_a_translator_forgives(self):
         binary = (SAMPLES / "it.bin").read_bytes()
@@ -103,81 +88,19 @@ class Translate(unittest.TestCase):
         ]:
             with self.subTest(warning):
                 path = self.file(content)
-                status, output, errors = translate("--dictionary", path, "$$$/x=still works")
+                status, output, errors = self.translate("--dictionary", path, "$$$/x=still works")
                 self.assertEqual((status, output), (0, "still works\n"))
                 self.assertTrue(errors.startswith(f"kolvane: {path}: warning: {warning}"), errors)
                 self.assertEqual(errors.count("\n"), 1)
 
-    def test_unreadable_files(self):
-        missing = pathlib.Path(self.folder.name, "no\nsuch")
-        status, output, errors = translate("--dictionary", missing, "--default-dictionary", self.folder.name, "a=b")
-        self.assertEqual((status, output), (2, ""))
-        self.assertRegex(errors, r"no\\x0Asuch: (No such file or directory|Invalid argument)\n")
-        self.assertRegex(errors, rf"{self.folder.name}: (Is a directory|Permission denied)\n")
-        self.assertEqual(translate("--dictionary", "-", "$$$/a=b", stdin=b'"$$$/a=from standard input"\n')[1],
-                         "from standard input\n")
-
     def test_names_beyond_ascii(self):
         dictionary = self.file('\ufeff"$$$/size=日本𝄞"\n// fills the image up\n'.encode("utf-16-le"), "Wörter-日本.txt")
-        self.assertEqual(translate("--dictionary", dictionary, "$$$/size=x", "$$$/none=größe"),
-                         (0, "日本𝄞\ngröße\n", ""))
-        self.assertIn("kein Wörterbuch-日本: No such file", translate("--dictionary", "kein Wörterbuch-日本", "x")[2])
-
-    def test_unreadable_keys(self):
-        folder = os.open(self.folder.name, os.O_RDONLY)
-        self.addCleanup(os.close, folder)
-        done = subprocess.run([*KOLVANE, "translate"], stdin=folder, capture_output=True, timeout=60)
-        self.assertEqual((done.returncode, done.stderr), (2, b"kolvane: cannot read standard input\n"))
-
-    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
-    def test_messages_that_cannot_be_written(self):
-        with open("/dev/full", "wb") as full:
-            for arguments, status, output in [(["bogus"], 2, b""), (["translate", "--dictionary", "/dev/null", "a=b"], 0, b"b\n")]:
-                done = subprocess.run([*KOLVANE, *arguments], stdout=subprocess.PIPE, stderr=full, timeout=60)
-                self.assertEqual((done.returncode, done.stdout), (status, output))
-
-    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
-    def test_output_that_cannot_be_written(self):
-        with open("/dev/full", "wb") as full:
-            for arguments in [["translate", "a=b"], ["--help"], ["--version"], ["translate", "--help"]]:
-                status, _, errors = run(*arguments, stdout=full)
-                self.assertEqual(status, 2)
-                self.assertIn("cannot write to standard output: No space left on device", errors)
-
-    def test_closed_pipe_is_quiet(self):
-        for ignored in (False, True):
-            disposition = signal.SIG_IGN if ignored else signal.SIG_DFL
-            with subprocess.Popen([*KOLVANE, "translate"], stdin=subprocess.PIPE, stdout=subprocess.PIPE,
-                                  stderr=subprocess.PIPE, restore_signals=False,
-                                  preexec_fn=lambda: signal.signal(signal.SIGPIPE, disposition)) as process:
-                process.stdout.close()
-                with contextlib.suppress(BrokenPipeError), process.stdin as keys:
-                    keys.write(b"a=b\n" * 100000)
-                self.assertEqual(process.stderr.read(), b"")
-                self.assertEqual(process.wait(), 2 if ignored or len(KOLVANE) > 1 else -signal.SIGPIPE)
-
-    def test_help_and_wrong_use(self):
-        for arguments in [["--help"], ["help"], ["translate", "--help"], ["help", "translate"], ["--version"]]:
-            status, output, errors = run(*arguments)
-            self.assertEqual((status, errors), (0, ""), arguments)
-        self.assertEqual(run("help", "translate"), run("translate", "--help"))
-        self.assertRegex(run("--version")[1], r"^kolvane \d+\.\d+\.\d+\n.*1\.0 and 1\.5")
-        for arguments, hint in [([], "kolvane"), (["bogus"], "kolvane"), (["help", "bogus"], "kolvane"),
-                                (["translate", "--bogus", "x"], "kolvane translate"),
-                                (["translate", "x", "-n"], "kolvane translate"),
-                                (["translate", "--encoding", "x", "y"], "kolvane translate"),
-                                (["translate", "--encoding", "a\nb\u009b", "y"], "kolvane translate"),
-                                (["translate", "--dictionary"], "kolvane translate"),
-                                (["translate", "--dictionary=", "x"], "kolvane translate"),
-                                (["translate", "--dictionary", "-"], "kolvane translate"),
-                                (["translate", "--dictionary", "-", "--dictionary", "-", "x"], "kolvane translate")]:
-            status, output, errors = run(*arguments)
-            self.assertEqual((status, output), (2, ""), arguments)
-            self.assertRegex(errors, rf"^kolvane: [^\x00-\x1f\x7f-\x9f]*\ntry '{hint} --help'\n$")
+        self.assertEqual(self.translate("--dictionary", dictionary, "$$$/size=x", "$$$/none=größe"), (0, "日本𝄞\ngröße\n", ""))
+        self.assertIn("kein Wörterbuch-日本: No such file", self.translate("--dictionary", "kein Wörterbuch-日本", "x")[2])
 
     def test_plug_ins(self):
-        (copy := self.file(STUBBORN.read_bytes(), "copy.so")).chmod(0o755)
-        self.assertEqual(translate("--plugin", "copy.so", CANCEL, CANCEL, cwd=copy.parent), (0, "no\nno\n", ""))
+        self.folder.joinpath(self.file(STUBBORN.read_bytes(), "copy.so")).chmod(0o755)
+        self.assertEqual(self.translate("--plugin", "copy.so", CANCEL, CANCEL), (0, "no\nno\n", ""))
         broken = self.file(b"short", "a-long-name-" * 9)
         for step, message, answer in [("15 initialize", "the plug-in cannot be initialised", ""),
                                       ("77 create", "cannot create a translator", ""),
@@ -188,7 +111,7 @@ class Translate(unittest.TestCase):
                                       ("6 unload", "the plug-in cannot be unloaded", "no\n")]:
             with self.subTest(step):
                 dictionaries = ["--dictionary", broken] * 2 if "set" in step else []
-                done = translate("--plugin", STUBBORN, *dictionaries, "k\t=v", env={**os.environ, "STUBBORN": step})
+                done = self.translate("--plugin", STUBBORN, *dictionaries, "k\t=v", env={**os.environ, "STUBBORN": step})
                 result = step.split()[0]
                 name = {"15": " (kResultInvariantViolation)", "6": " (kVRKInUse)"}.get(result, "")
                 line = f"kolvane: {message}: result {result}{name}\n"
@@ -196,15 +119,15 @@ class Translate(unittest.TestCase):
         for plug_in, shown, reason in [(SAMPLES / "de.txt", SAMPLES / "de.txt", ".+"), ("none.so", "none.so", ".+"),
                                        ("a\nb.so", r"a\\x0Ab.so", "[^\n]+"), ("", "", r"result 2 \(kVRKInvalidArgument\)"),
                                        (KERNEL, KERNEL, "it has no entry point VRKKolvanesInitialize")]:
-            status, output, errors = translate("--plugin", plug_in, "x=y")
+            status, output, errors = self.translate("--plugin", plug_in, "x=y")
             self.assertEqual((status, output), (2, ""))
             self.assertRegex(errors, rf"\Akolvane: cannot load the plug-in {shown}: {reason}\n\Z")
 
     def test_trace(self):
-        plain = translate("--dictionary", SAMPLES / "de.txt", CANCEL)
-        status, output, trace = translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)
+        plain = self.translate("--dictionary", SAMPLES / "de.txt", CANCEL)
+        status, output, trace = self.translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)
         self.assertEqual((status, output), plain[:2])
-        self.assertEqual(trace, translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)[2])
+        self.assertEqual(trace, self.translate("--trace", "--dictionary", SAMPLES / "de.txt", CANCEL)[2])
         for line in [r'VRKObjectFactoryRegister\("class:[\w.-]+string-translator", 0, \*, \*\)',
                      r'VRKObjectCreate\("class:[\w.-]+string-translator", null\) {',
                      r'  VRKObjectCreate\(null, dictionary 0x\w+\) -> object 0x\w+',
@@ -221,26 +144,82 @@ class Translate(unittest.TestCase):
         self.assertNotRegex(trace, r"Re(tain|lease)\(null")
         long = "x" * 57
         for key, shown in [(f"k={long}é", rf'"k={long}\.\.\."'), (f"é={long}", f'"é={long}"')]:
-            self.assertRegex(translate("--trace", key)[2], rf"VRKDataCreate.* {shown}")
-        failing = translate("--trace", "--plugin", STUBBORN, CANCEL,
+            self.assertRegex(self.translate("--trace", key)[2], rf"VRKDataCreate.* {shown}")
+        failing = self.translate("--trace", "--plugin", STUBBORN, CANCEL,
                             env={**os.environ, "STUBBORN": "15 translate-string"})[2]
         self.assertIn("\n} -> result 15 (kResultInvariantViolation)\n", failing)
         self.assertNotIn("VRKObjectFactoryUnregister", failing)
 
-    def test_nothing_to_read(self):
-        done = subprocess.run([*KOLVANE, "translate"], stdin=subprocess.DEVNULL, capture_output=True, timeout=60)
-        self.assertEqual((done.returncode, done.stdout, done.stderr), (0, b"", b""))
 
-    def test_terminal_without_keys(self):
-        try:
-            ours, terminal = os.openpty()
-        except (AttributeError, OSError):
-            self.skipTest("no terminals")
-        done = subprocess.run([*KOLVANE, "translate"], stdin=terminal, capture_output=True, timeout=10)
-        os.close(ours)
-        os.close(terminal)
-        self.assertEqual(done.returncode, 2)
-        self.assertIn(b"try 'kolvane translate --help'", done.stderr)
+class EveryCommand(CommandTest):
+    # What each is called with before a file, in a way that prints something.
+    CALLS = [["translate", "--dictionary"], ["check", "-W", "--fail-on=info"], ["compile", "-o", "-"], ["dump"],
+             ["convert", "-o", "-", "--to", "utf-8"], ["stats"]]
+
+    def test_files_that_cannot_be_read(self):
+        self.folder.joinpath("folder").mkdir()
+        for call in self.CALLS:
+            for name, reason in [("folder", "folder: (Is a directory|Permission denied)"), ("no\nsuch", r"no\\x0Asuch: (No such file.*|Invalid argument)")]:
+                status, _, errors = self.run_kolvane(*call, name)
+                self.assertEqual(status, 2, call)
+                self.assertRegex(errors, f"^kolvane: {reason}\n")
+
+    @unittest.skipUnless(os.path.exists("/dev/full"), "no full device")
+    def test_what_cannot_be_written(self):
+        self.file(b'"/a=b"\n"/a=\xe9^x"' + PAD, "in")
+        self.file(b'"/a=' + b"x" * 100000, "large")
+        calls = [[*call, "in"] for call in [*self.CALLS, *(["check", f"--format={form}"] for form in ["json", "sarif", "github"])]]
+        with open("/dev/full", "wb") as full:
+            for call in [*calls, ["--help"], ["--version"], ["translate", "--help"]]:
+                status, _, errors = self.run_kolvane(*call, stdin=b"a=b\n", stdout=full)
+                self.assertEqual(status, 2, call)
+                self.assertIn("kolvane: cannot write to standard output: No space left on device\n", errors)
+            for call, expected in [(["bogus"], (2, b"", "")), (["translate", "--dictionary", "/dev/null", "a=b"], (0, b"b\n", ""))]:
+                self.assertEqual(self.run_kolvane(*call, stderr=full), expected)
+        for source, name in [("in", "/dev/full"), ("large", "/dev/full"), ("in", "no-folder/out")]:
+            status, output, errors = self.run_kolvane("compile", source, "-o", name)
+            self.assertEqual((status, output), (2, b""))
+            self.assertRegex(errors, f"^kolvane: {name}: .+\n$")
+
+    def test_closed_pipe_is_quiet(self):
+        self.file(b'"/a=\xe9^x"\n' * 20000)
+        emulated = len(KOLVANE) > 1  # it does not tell of a closed pipe while that is not full
+        for call, isIgnored in itertools.product(self.CALLS[:2] if emulated else self.CALLS, (False, True)):
+            reading, writing = os.pipe()
+            os.close(reading)
+            with os.fdopen(writing, "wb") as closed:
+                done = self.run_kolvane(*call, "d.txt", stdin=b"a=b\n" * 100000, stdout=closed, restore_signals=not isIgnored)
+            self.assertEqual(done, (2 if isIgnored or emulated else -signal.SIGPIPE, b"", ""), call)
+
+    def test_help(self):
+        for arguments in [["--help"], ["help"], ["translate", "--help"], ["help", "translate"], ["--version"], ["check", "--help"]]:
+            status, _, errors = self.run_kolvane(*arguments)
+            self.assertEqual((status, errors), (0, ""), arguments)
+        self.assertEqual(self.run_kolvane("help", "translate"), self.run_kolvane("translate", "--help"))
+        self.assertIn(b"Examples:\n  kolvane check ", self.run_kolvane("check", "--help")[1])
+        self.assertRegex(self.run_kolvane("--version")[1], rb"^kolvane \d+\.\d+\.\d+\n.*1\.0 and 1\.5")
+
+    def test_wrong_use(self):
+        self.file(b'"/a=b"' + PAD, "r")
+        for command, wrong in {
+                "": [[], ["bogus"], ["help", "bogus"]],
+                "translate": [["--bogus", "x"], ["x", "-n"], ["--encoding", "x", "y"], ["--encoding", "a\nb\u009b", "y"], ["--dictionary"],
+                              ["--dictionary=", "x"], ["--dictionary", "-"], ["--dictionary", "-", "--dictionary", "-", "x"]],
+                "check: no file is named": [[]],
+                "check: unknown rule 'dropped-lime'": [["--disable=dropped-lime", "x"]],
+                "check: standard input": [["-", "-"], ["--baseline=-", "--reference=-", "x"]],
+                "check: --format": [["--format=xml", "x"]],
+                "check: --color": [["--color=sometimes", "x"]],
+                "check: --fail-on": [["--fail-on=fatal", "x"]],
+                "stats": [["--fail-under", "5", "r"], ["--reference", "r", "--fail-under", "100.1", "r", "r"], [], ["--reference", "r", "r"],
+                          ["--reference", "-", "-"], ["--format", "xml", "r"], ["--reference", "r", "--fail-under", "nan", "r"],
+                          ["--reference", "", "r", "-", "-"]]}.items():
+            name = command.partition(":")[0]
+            for arguments in wrong:
+                status, output, errors = self.run_kolvane(*filter(None, [name]), *arguments)
+                self.assertEqual((status, output), (2, b""), arguments)
+                hint = f"kolvane {name}".strip()
+                self.assertRegex(errors, rf"\Akolvane: {command}[^\x00-\x1f\x7f-\x9f]*\ntry '{hint} --help'\n\Z")
 
 
 if __name__ == "__main__":

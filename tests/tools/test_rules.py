@@ -1,13 +1,10 @@
-"""One bad dictionary for each rule of `kolvane check`, and what is said of it: test_rules.py COMMAND."""
+"""Bad dictionaries for each rule of `kolvane check`, and what is said of them: test_rules.py COMMAND."""
 
+import json
+import random
 import unittest
 
-from command import PAD, CommandTest, image
-
-
-def utf16(text):
-    return ("\ufeff" + text + PAD.decode()).encode("utf-16-le", "surrogatepass")
-
+from command import PAD, CommandTest, bucket, image, utf16
 
 HI = "Hi".encode("utf-16-le")
 ONE = image([(580, [(b"/a", HI)])])
@@ -71,23 +68,81 @@ CASES = [
       "entry 3, byte 76: warning: '/a' hides behind another entry of its key", "entry 2, byte 70: note: this one is found"]),
     ("missing-key", utf16('"$$$/a=b"'), ["warning: key '/b' is missing", "3:1: note: the reference is here"], "/a=x\n/b=y"),
     ("extra-key", utf16('"$$$/a=b"\n"$$$/b=c"'), ["2:2: warning: the reference has no key '/b'"], "/a=x"),
+    ("line-breaks", utf16('"$$$/a=b\\nc"'),
+     ["1:2: warning: the translation has 1 line break, the reference has 0", "2:2: note: the reference is here"], '"$$$/a=x"'),
     ("accelerator-clash", utf16('"$$$/m/a=&Datei"\n"$$$/m/b=&drucken"\n"$$$/n/a=&Da"\n"$$$/m/c=&Aus"\n"$$$/m/d=&An"'),
      ["2:2: warning: '/m/b' has the same accelerator as '/m/a'", "1:2: note: the other one is here"],
      "/m/a=&File\n/m/b=&Print\n/n/a=&Di\n/m/c=&Out\n/m/d=&Other"),
 ]
 
-# What a translation has beside its reference; places and notes are the same for all.
-TRANSLATIONS = [
-    ("empty-translation", "Open", "", "warning"),
-    ("placeholder-missing", "{0} of {1}", "von {0}", "error"),
-    ("placeholder-extra", "Done", "%d fertig", "error"),
-    ("placeholder-type", "%d files", "%s Dateien", "error"),
-    ("placeholder-style", "%1$d of %2$d", "%1$d von %d", "error"),
-    ("accelerator-missing", "&File", "Datei", "warning"),
-    ("accelerator-extra", "File", "&Datei", "warning"),
-    ("line-breaks", "One\\nTwo", "Eins zwei", "warning"),
-    ("edge-space", "Name: ", "Name:", "warning"),
-    ("untranslated", "Cancel", "Cancel", "info"),
+# Reference, translation, and what is told of them.
+COMPARISONS = [
+    # Placeholders that are on both sides, in another order or form.
+    ("%s has %d", "%s hat %i"),
+    ("%s has %d", "%2$d hat %1$s"),
+    ("%1$s, %2$x", "%s: %-#8X"),
+    ("%1$s, %2$d", "%2$d: %1$s %1$s"),
+    ("%*.*f of %+e", "%2$*1$d", "placeholder-missing: placeholders %*.*f, %+e are missing from the translation"),
+    ("%lld %zu %hhd", "%I64d %Iu %-4hhi"),
+    ("%Lf %lf %hs %ws", "%La %g %hs %ls"),
+    ("{0} of {1:N2}, {{2}}", "{{x}}: {1}{0}{1,5}"),
+    ("{n, plural, one {# {x}} other {#}}", "{n, plural, few {# {z}}}"),
+    # One finding for all of a kind.
+    ("{0}", "nichts", "placeholder-missing: placeholder {0} is missing from the translation"),
+    ("{1} %1$s {0} %2$s %2$s {1}", "{0} %1$s", "placeholder-missing: placeholders {1}, %2$s are missing from the translation"),
+    ("{file_name.0-a}", "{Datei:x} %d", "placeholder-missing: placeholder {file_name.0-a} is missing from the translation",
+     "placeholder-extra: placeholders {Datei}, %d are not in the reference"),
+    ("%*d", "%s", "placeholder-missing: placeholder %*d is missing from the translation", "placeholder-type: argument 1 is %s instead of %*d"),
+    # Types.
+    ("%s: %d", "%d: %s", "placeholder-type: argument 1 is %d instead of %s, argument 2 is %s instead of %d"),
+    ("%d", "%lld", "placeholder-type: argument 1 is %lld instead of %d"),
+    ("%d %p", "%u %n", "placeholder-type: argument 1 is %u instead of %d, argument 2 is %n instead of %p"),
+    ("%c %s %f", "%lc %S %Lf",
+     "placeholder-type: argument 1 is %lc instead of %c, argument 2 is %S instead of %s, argument 3 is %Lf instead of %f"),
+    ("%1$d", "%1$d %1$s %1$s", "placeholder-type: argument 1 is %1$s instead of %1$d"),
+    ("%1$d (0x%1$x)", "0x%1$x"),
+    # Styles.
+    ("%s %s", "%1$s %s", "placeholder-style: numbered %1$s and unnumbered %s stand in one text"),
+    ("%1$*2$d {0}", "%1$*d", "placeholder-missing: placeholder {0} is missing from the translation",
+     "placeholder-style: numbered %1$*d and unnumbered %1$*d stand in one text"),
+    ("%1$s %s", "%d"),
+    # Text that looks like placeholders.
+    ("100% complete", "100 % fertig"),
+    ("50% off", "50%-os kedvezmény"),
+    ("50%% off, invalid %-encoding", "50%-os"),
+    ("half", "50%"),
+    ("half", "%"),
+    ("half", "%0$d %10000$d %99999999999999999999$d %5.k %"),
+    ("half", "%%d {} { 0} {-} {.a} {a b} {a: b} {é} } {a, {"),
+    ("{{{0}}} {a, {b}", "{{{0}}}", "placeholder-missing: placeholder {b} is missing from the translation"),
+    # Accelerators.
+    ("&File", "&Datei"),
+    ("&File", "ファイル(&F)"),
+    ("&File", "Datei & && &\u00A0x &amp; &#38; '&' «&» (&) &\u0001 &",
+     "accelerator-missing: the translation has no accelerator, the reference has accelerator &F"),
+    ("Search && replace", "&Ersetzen", "accelerator-extra: the translation has accelerator &E, the reference has no accelerator"),
+    ("&File", "&D&atei &\U00010400",
+     "accelerator-extra: the translation has accelerators &D, &a, &\U00010400, the reference has accelerator &F"),
+    ("&? &{0}", "? {0}", "accelerator-missing: the translation has no accelerator, the reference has accelerators &?, &{"),
+    ("/?a=1&b=2&c=3", "/?a=1&b=4&c=5"),
+    ("&File", "&\ud800"),
+    # Space and words.
+    ("a\r\nb\rc\u2028d\ne", "a\nb\nc\n\rd"),
+    ("a\n", "b", "line-breaks: the translation has 0 line breaks, the reference has 1"),
+    ("a\n\n", "b\r\n", "line-breaks: the translation has 1 line break, the reference has 2"),
+    ("Name: ", "Nom\u00A0:", "edge-space: white space at the end is missing from the translation"),
+    ("Name: ", "Nom\u00A0:\u00A0"),
+    ("Name: ", "名前："),
+    ("Name: ", "\U00020000"),
+    ("Name:", "\tName: ", "edge-space: white space at the start is not in the reference",
+     "edge-space: white space at the end is not in the reference"),
+    ("Name: \n", "Nom:\n"),
+    ("x", "", "empty-translation: the translation is empty"),
+    ("", " &x %d\n"),
+    ("OK", "OK", "untranslated: the translation is the same as the reference"),
+    ("%d%% {name} 1.0 ", "%d%% {name} 1.0 "),
+    ("{name} Ж", "{name} Ж", "untranslated: the translation is the same as the reference"),
+    ("\ud800\udc00\udc00", "\udc00\ud800"),
 ]
 
 
@@ -108,15 +163,42 @@ class Rules(CommandTest):
                 self.assertEqual(lines, named)
                 self.assertEqual(status, int("error: " in expected[0]))
 
-    def test_each_rule_beside_a_reference(self):
-        for rule, reference, translation, severity in TRANSLATIONS:
-            with self.subTest(rule):
-                self.file(name="d", content=utf16(f'"$$$/a={translation}"'))
-                self.file(name="r", content=utf16(f'"$$$/a={reference}"'))
-                status, lines = self.check("d", "--reference", "r")
-                self.assertRegex(lines[0], rf"^d:1:2: {severity}: .* \[{rule}\]$")
-                self.assertEqual(lines[1:], ["r:1:2: note: the reference is here"])
-                self.assertEqual(status, int(severity == "error"))
+    def compare(self, pairs):
+        """Returns what is found of each reference and translation, all of which are in one dictionary."""
+        for side, name in enumerate("rd"):
+            entries = [(f"/{number}/".encode(), pair[side].encode("utf-16-le", "surrogatepass")) for number, pair in enumerate(pairs)]
+            self.file(name=name, content=image([(bucket(key), [(key, value)]) for key, value in entries]))
+        output = self.run_kolvane("check", "--format=json", "--info", "--disable=malformed-input", "--disable=accelerator-clash",
+                                  "--reference", "r", "d", timeout=10)[1]
+        found = [[] for _ in pairs]
+        for finding in json.loads(output)["findings"]:
+            found[int(finding["key"].strip("/"))].append(finding)
+        return found
+
+    def test_comparisons(self):
+        severities = {"untranslated": "info", **dict.fromkeys(["missing", "extra", "type", "style"], "error")}
+        for (reference, translation, *expected), found in zip(COMPARISONS, self.compare(COMPARISONS), strict=True):
+            with self.subTest(reference=reference, translation=translation):
+                self.assertEqual([f"{finding['rule']}: {finding['message']}" for finding in found], expected)
+                for finding in found:
+                    rule = finding["rule"].removeprefix("placeholder-")
+                    self.assertEqual(finding["severity"], severities.get(rule, "warning"))
+
+    # In far less time than it takes to look through the rest of a text for each start of a placeholder.
+    def test_copies_have_no_differences(self):
+        chance = random.Random(1)
+        texts = ["".join(chance.choices(["%1$s", *"%$*.1dsl{}0:, &;#a\n\ud800\udc00"], k=chance.randrange(1, 16))) for _ in range(10000)]
+        texts += [part * (300000 // len(part)) for part in ["{a,", "%*", "%1$s", "{", "&a;", "%9", "{a"]]
+        rules = {finding["rule"] for found in self.compare([(text, text) for text in texts]) for finding in found}
+        self.assertEqual(rules, {"untranslated", "placeholder-style"})
+
+    def test_accelerators_that_clash(self):
+        pairs = [("Save &As", "&a"), ("열기(&O)...", "&o"), ("&Файл", "&ф"), ("&Öffnen", "&ö"), ("&7", "&7"), ("&A; B", "&A"),
+                 ("AT&&T", "&T"), ("&a&b", "&a"), ("&{0}", "&{0}"), ("&%d", "&%d")]  # from here on they do not
+        self.file(name="d", content=utf16("".join(f'"/{i}/a={one}"\n"/{i}/b={other}"\n' for i, (one, other) in enumerate(pairs))))
+        self.file(name="r", content=utf16("".join(f'"/{i}/a=&x"\n"/{i}/b=&y"\n' for i in range(len(pairs)))))
+        clashes = [line for line in self.check("d", "--reference", "r")[1] if "[accelerator-clash]" in line]
+        self.assertEqual([line.split("'")[1] for line in clashes], [f"/{i}/b" for i in range(6)])
 
     def test_across_files(self):
         for name in "ab":
@@ -135,7 +217,8 @@ class Rules(CommandTest):
 
     def test_every_rule_has_its_dictionary(self):
         listed = [line.split()[0] for line in self.check("--list-rules")[1]]
-        self.assertEqual(sorted(listed), sorted({case[0] for case in CASES + TRANSLATIONS} | {"duplicate-across-files"}))
+        told = {text.partition(":")[0] for case in COMPARISONS for text in case[2:]}
+        self.assertEqual(sorted(listed), sorted({case[0] for case in CASES} | told | {"duplicate-across-files"}))
 
     def test_nothing_to_find(self):
         self.file(name="d", content=utf16('"$$$/a=^[Open^] \\"it\\" #{nbsp}100%"\r\n\r\n$$$/b=x=y\n  "/c=C:\\\\'))

@@ -124,12 +124,6 @@ class Stats(CommandTest):
             self.assertEqual(self.stats("--reference", reference, "--fail-under", percent, path)[0], status, percent)
         self.assertIn(f"{path}: 66.6 % is translated, less than 67 %",
                       self.stats("--reference", reference, path, reference, "--fail-under=67")[2])
-        for wrong in [["--fail-under", "5", path], ["--reference", path, "--fail-under", "100.1", path, path], [],
-                      ["--reference", reference, reference], ["--reference", "-", "-"], ["--format", "xml", path],
-                      ["--reference", reference, "--fail-under", "nan", path], ["--reference", "", path, "-", "-"]]:
-            status, output, errors = self.stats(*wrong)
-            self.assertEqual((status, output), (2, ""), wrong)
-            self.assertIn("try 'kolvane stats --help'", errors)
 
     def test_files_that_are_not_as_they_should_be(self):
         path, reference = self.file(text(a="x")), self.file(text(b="y"), "r.txt")
