@@ -8,7 +8,7 @@ import sys
 import unicodedata
 import unittest
 
-from command import KOLVANE, PAD, CommandTest
+from command import KOLVANE, CommandTest, utf16
 
 SAMPLES = pathlib.Path(sys.argv.pop(1)).absolute()
 DROPPED = '"$/dropped=x"\n'
@@ -33,7 +33,7 @@ def fingerprint(*parts):
 
 class Check(CommandTest):
     def file(self, content, name="d.txt"):
-        return super().file(content if isinstance(content, bytes) else ("\ufeff" + content + PAD.decode()).encode("utf-16-le"), name)
+        return super().file(content if isinstance(content, bytes) else utf16(content), name)
 
     def check(self, *arguments, environment=None, **options):
         """Returns the status, standard output and standard error."""
@@ -51,10 +51,7 @@ class Check(CommandTest):
         name = self.file(DROPPED + TWICE)
         status, output, errors = self.check("--no-snippet", name)
         self.assertEqual((status, errors), (1, "kolvane: 2 errors, 0 warnings in 1 file\n"))
-        place = r"(?m)^d\.txt:{}:\d+: {}$"
-        for line, text in [(1, r"error: .* \[dropped-line\]"), (3, r"error: .* \[duplicate-key\]"), (2, "note: .*")]:
-            self.assertRegex(output, place.format(line, text))
-        self.assertEqual(output.count("\n"), 3)
+        self.assertRegex(output, r"\Ad.txt:1:\d+: error: .* \[dropped-line\]\nd.txt:3:\d+: error: .* \[duplicate-key\]\nd.txt:2:\d+: note: .*\n\Z")
         self.assertEqual(self.check("-q", self.file('"$$$/a=b"\n')), (0, "", ""))
 
     def test_mark_stands_under_its_column(self):
@@ -66,11 +63,6 @@ class Check(CommandTest):
                 self.assertEqual(line, f'  "$$$/escape={before}^q日"')
                 self.assertTrue(mark.endswith("^") and mark.isascii())
                 self.assertEqual(room(mark[:-1]), room(line[:2 + finding["column"] - 1]))
-
-    def test_columns_of_malformed_bytes(self):
-        name = self.file(b'\xef\xbb\xbf"$$$/a=na\xefve"\n' + 30 * b"\n" + b'"$$$/b=na\xef\xbf"\r"$$$/c=\xc3\xa9\xff"')
-        found = [(finding["line"], finding["column"]) for finding in self.findings("--encoding=utf-8", name)]
-        self.assertEqual(found, [(1, 10), (32, 10), (33, 9)])
 
     def test_long_line_is_cut_around_the_place(self):
         name = self.file('"$$$/escape=' + "日" * 50000 + "^q" + "x" * 50000 + '"\n')
@@ -190,7 +182,6 @@ class Check(CommandTest):
         self.assertEqual((status, errors), (0, ""))
         for line in output.splitlines():
             self.assertRegex(line, r"^[a-z0-9-]+ +(error|warning|info) +\S.*$")
-            self.assertEqual(self.check("--disable", line.split()[0], "--list-rules")[0], 0)
 
 
 if __name__ == "__main__":

@@ -106,10 +106,12 @@ COMPARISONS = [
     ("%1$*2$d {0}", "%1$*d", "placeholder-missing: placeholder {0} is missing from the translation",
      "placeholder-style: numbered %1$*d and unnumbered %1$*d stand in one text"),
     ("%1$s %s", "%d"),
+    ("%1$*2$d", "%1$d", "placeholder-missing: placeholder %1$*2$d is missing from the translation"),
     # Text that looks like placeholders.
     ("100% complete", "100 % fertig"),
     ("50% off", "50%-os kedvezmény"),
     ("50%% off, invalid %-encoding", "50%-os"),
+    ("50%% of 5%", "%d", "placeholder-extra: placeholder %d is not in the reference"),
     ("half", "50%"),
     ("half", "%"),
     ("half", "%0$d %10000$d %99999999999999999999$d %5.k %"),
@@ -210,6 +212,10 @@ class Rules(CommandTest):
         for content in [b'\n"$$$/a=\xe9b"\0"$$$/c=^x"', '\ufeff\n"$$$/a=😀b"\0"$$$/c=^x"'.encode("utf-16-be")]:
             self.file(name="d", content=content)
             self.assertEqual([line.split(" ")[0] for line in self.check("d")[1]], ["d:2:11:", "d:2:19:"])
+
+    def test_columns_of_malformed_bytes(self):
+        self.file(name="d", content=b'\xef\xbb\xbf"$$$/a=na\xefve"\n' + PAD + b'"$$$/b=na\xef\xbf"\r"$$$/c=\xc3\xa9\xff"')
+        self.assertEqual([line.split(" ")[0] for line in self.check("--encoding=utf-8", "d")[1]], ["d:1:10:", "d:32:10:", "d:33:9:"])
 
     def test_another_encoding_than_the_files(self):
         self.file(name="d", content=utf16('"$$$/a=b"'))
