@@ -5,20 +5,12 @@
 #include <malloc.h>
 #include <unistd.h>
 
-#include <array>
 #include <cstdio>
-#include <cstring>
 #include <fstream>
-#include <string>
-#include <vector>
 
-#include "Data.h"
-#include "Input.h"
 #include "PlugInRun.h"
-#include "Tokens.h"
 #include "TranslatorWalk.h"
 #include "VRKStringTranslatorClient.h"
-#include "VRKTranslationImage.h"
 
 namespace {
 
@@ -28,54 +20,28 @@ constexpr uint64_t kReloadEvery = 2000;
 constexpr size_t kMostGrowth = size_t{64} << 10;
 constexpr size_t kMostResidentGrowth = size_t{4} << 20;  // pages that the allocator keeps vary
 
-struct Memory {
-  static Memory InUse() {
-    const auto heap = mallinfo2();
-    size_t total = 0, resident = 0;
-    std::ifstream("/proc/self/statm") >> total >> resident;
-    return {heap.uordblks + heap.hblkhd, resident * static_cast<size_t>(sysconf(_SC_PAGESIZE))};
-  }
-
-  size_t allocated;
-  size_t resident;
-};
-
 // A translator that some of its keys are loaded into again and again, as text.
 class Resident {
  public:
-  explicit Resident(Choices& decisions) : choices(decisions), values(kKeys) { Reload(kKeys); }
+  explicit Resident(Choices& decisions) : choices(decisions), values(kKeys, "default") {}
 
-  void Reload() { Reload(choices.Below(kKeys)); }
+  void Reload() {
+    std::string text = "// some of them\n";
+    for (uint32_t i = choices.Below(kKeys); i > 0; --i) {
+      const uint32_t key = choices.Below(kKeys);
+      values[key] = "value " + std::to_string(choices.Below(65536));
+      text += "\"$$$/key" + std::to_string(key) + "=" + values[key] + "\"\n";
+    }
+    Load(*translator, AsUTF16(text));
+    for (int i = 0; i < 10; ++i) {
+      const uint32_t key = choices.Below(kKeys);
+      const std::string answer = Translated(*translator, "$$$/key" + std::to_string(key) + "=default");
+      Require(answer.c_str() == values[key], "what stays answers, too");
+    }
+  }
 
  private:
   static constexpr uint32_t kKeys = 1000;
-
-  void Reload(uint32_t count) {
-    std::string text = "\xFF\xFE";
-    for (uint32_t i = 0; i < count; ++i) {
-      const uint32_t key = count == kKeys ? i : choices.Below(kKeys);
-      values[key] = "value " + std::to_string(choices.Below(65536));
-      text += Widened("\"$$$/key" + std::to_string(key) + "=" + values[key] + "\"\n");
-    }
-    const auto byteCount = static_cast<uint32_t>(text.size());
-    const auto image = Varnel::PackTranslationImage(text.data(), byteCount);
-    translator->SetTranslations(image.units.get(), image.unitCount);
-    for (int i = 0; i < 10; ++i) Ask(choices.Below(kKeys));
-  }
-
-  void Ask(uint32_t key) {
-    const std::string text = "$$$/key" + std::to_string(key) + "=default";
-    std::vector<uint16_t> units;
-    translator->TranslateString(text.data(), static_cast<uint32_t>(text.size()), units);
-    units.pop_back();
-    Require(std::string(units.begin(), units.end()) == values[key], "what stays answers, too");
-  }
-
-  static std::string Widened(const std::string& text) {
-    std::string bytes;
-    for (const char character : text) bytes += {character, '\0'};
-    return bytes;
-  }
 
   Choices& choices;
   std::vector<std::string> values;
@@ -96,14 +62,21 @@ void WalkTo(uint64_t count, TranslatorWalk& walk, Resident& resident) {
   walk.Rest();
 }
 
-void Compare(const Memory& now, Memory& most, uint32_t rest) {
-  std::fprintf(stderr, "%u: %zu bytes allocated, %zu resident\n", rest, now.allocated, now.resident);
+// Compares the memory in use with the most that there was while it warmed up.
+void CompareMemory(uint32_t rest) {
+  static size_t most = 0, mostResident = 0;
+  const auto heap = mallinfo2();
+  const size_t allocated = heap.uordblks + heap.hblkhd;
+  size_t pages = 0, residentPages = 0;
+  std::ifstream("/proc/self/statm") >> pages >> residentPages;
+  const size_t resident = residentPages * static_cast<size_t>(sysconf(_SC_PAGESIZE));
+  std::fprintf(stderr, "%u: %zu bytes allocated, %zu resident\n", rest, allocated, resident);
   if (rest < kWarmUp) {
-    most = {std::max(most.allocated, now.allocated), std::max(most.resident, now.resident)};
-    return;
+    most = std::max(most, allocated);
+    mostResident = std::max(mostResident, resident);
   }
-  Require(now.allocated <= most.allocated + kMostGrowth, "memory does not grow");
-  Require(now.resident <= most.resident + kMostResidentGrowth, "nor does the process");
+  Require(allocated <= most + kMostGrowth, "memory does not grow");
+  Require(resident <= mostResident + kMostResidentGrowth, "nor does the process");
 }
 
 void Soak(uint64_t count) {
@@ -114,12 +87,11 @@ void Soak(uint64_t count) {
   TranslatorWalk walk(choices, run.Handle());
   walk.Rest();
   const VRKHostLiveCounts atRest = LiveCounts();
-  Memory most{};
   for (uint32_t rest = 0; rest < kRests; ++rest) {
     WalkTo(count * (rest + 1) / kRests, walk, resident);
     const VRKHostLiveCounts now = LiveCounts();
     Require(std::memcmp(&now, &atRest, sizeof now) == 0, "nothing is left over");
-    Compare(Memory::InUse(), most, rest);
+    CompareMemory(rest);
   }
   for (const auto& [result, number] : walk.Results()) {
     std::fprintf(stderr, "result %u: %llu\n", result, static_cast<unsigned long long>(number));
