@@ -23,6 +23,8 @@ TEST(WriterTest, LaysImagesOut) {
   const std::vector<ImageGroup> found = {{580, {{"/a", Bytes(u"Hié")}}}}, none = {{0, {}}};
   const std::vector<ImageGroup> hidden = {{7, {{"/a", Bytes(u"misfiled")}}},
                                           {580, {{"/a", Bytes(u"Hié") + "?"}, {"/a", Bytes(u"hidden")}}}};
+  const std::pair<std::string, std::string> one = {"0A2_4_6_8_", ""}, other = {"0B2_4_6_8_", ""};  // of a bucket
+  const auto bucket = static_cast<uint16_t>(BucketOf(one.first));
   struct {
     std::vector<ImageGroup> loaded;
     TextEncoding values;
@@ -32,6 +34,7 @@ TEST(WriterTest, LaysImagesOut) {
       {{}, TextEncoding::kUTF16LE, none, 0},
       {found, TextEncoding::kUTF16LE, found, 0},
       {hidden, TextEncoding::kUTF16LE, found, 0},
+      {{{bucket, {other, one}}}, TextEncoding::kUTF16LE, {{bucket, {one, other}}}, 0},
       {found, TextEncoding::kUTF8, {{580, {{"/a", "Hi\xC3\xA9"}}}}, 1},
       {found, TextEncoding::kCodePage, {{580, {{"/a", "Hi\xE9"}}}}, 2},
   };
