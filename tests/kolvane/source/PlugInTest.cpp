@@ -1,39 +1,34 @@
+// The built plug-in, in a kernel, as a host sees it.
 #include "PlugInTest.h"
 
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <map>
-#include <set>
 #include <sstream>
 
 #include "DictionaryTable.h"
 #include "DictionaryWriter.h"
 #include "Exceptions.h"
-#include "VRKTranslationImage.h"
+#include "Messages.h"
+#include "VRKStringTranslatorClient.h"
+#include "VRKStringTranslatorProtocol.h"
 
 namespace {
 
 using namespace std::string_literals;
-using Translator = boost::shared_ptr<Varnel::StringTranslatorInterface>;
+using namespace Varnel;
+using Translator = boost::shared_ptr<StringTranslatorInterface>;
 
-// Two factories, a coercion of three pairs, and the first translator's object with its handler.
-constexpr char kStarted[] = "objects 1 handlers 1 factories 2 coercions 3 blocks 4 ";
+class PlugInTest : public KernelTest {
+ protected:
+  PlugInTest() { EXPECT_EQ(VRKHostPlugInLoad(PLUG_IN, "VRKKolvanes", &plugIn), 0u) << VRKHostLoadError(); }
+  ~PlugInTest() override { EXPECT_EQ(VRKHostPlugInUnload(plugIn), 0u); }
 
-TEST_F(PlugInTest, GoesThroughItsStates) {
-  const EntryPoints entry;
-  EXPECT_EQ(entry.version(), 0x00010000u);
-  EXPECT_EQ(entry.initialize(1), 13u);
-  EXPECT_EQ(Alive(), "");
-  for (const char* const alive : {kStarted, "objects 2 handlers 2 factories 2 coercions 3 blocks 5 "}) {
-    EXPECT_EQ(VRKHostPlugInInitialize(plugIn), 0u);
-    EXPECT_EQ(Alive(), alive);
-    EXPECT_EQ(entry.terminate(1), 13u);
-    EXPECT_EQ(VRKHostPlugInUnload(plugIn), kVRKInUse);
-    EXPECT_EQ(Coerced("$$$/k=default"), "default");
-  }
-  for (int round = 0; round < 2; ++round) {
-    EXPECT_EQ(VRKHostPlugInTerminate(plugIn), 0u);
-    EXPECT_EQ(Alive(), "");
-  }
+  VRKPlugIn plugIn{};
+};
+
+// A key's translation by the plug-in's coercion.
+std::string Coerced(const std::string& key) {
+  return GetUTF8(DataOf(kTypeLocaleIndependentUTF8, key));
 }
 
 // Notes what is registered, installed, sent, released and ended, in order, and what tokens are made of
@@ -87,11 +82,15 @@ class Notes {
 };
 
 TEST_F(PlugInTest, StartsUpAndShutsDownInOrder) {
+  const EntryPoints entry;
+  EXPECT_EQ(entry.version(), 0x00010000u);
   Notes notes;
   const std::string object = "hear object-died\n", release = "release\n";
   const std::string messages = "hear make-default set-translations translate-string\n";
   const std::string messageTokens = "token make-default\ntoken set-translations\ntoken translate-string\n";
   for (int round = 0; round < 2; ++round) {
+    EXPECT_EQ(entry.initialize(1), 13u);
+    EXPECT_EQ(notes.Take(), "");
     VRKHostPlugInInitialize(plugIn);
     EXPECT_EQ(notes.Take(), "register string-translator\n" + object + messageTokens + messages + release + release + release +
                                 "send make-default\nregister default\n" + release +
@@ -103,6 +102,8 @@ TEST_F(PlugInTest, StartsUpAndShutsDownInOrder) {
                                 "send make-default\nregister default\nunregister default\n" + release +
                                 "coerce locale-independent-utf8 to utf8\ncoerce locale-independent-utf8 to utf16le\n"
                                 "coerce locale-independent-utf8 to utf16be\nremove earlier coercion\n");
+    EXPECT_EQ(entry.terminate(1), 13u);
+    EXPECT_EQ(notes.Take(), "");
     VRKHostPlugInTerminate(plugIn);
     EXPECT_EQ(notes.Take(), "remove coercion\nunregister string-translator\nunregister default\n" + messageTokens);
   }
@@ -127,11 +128,6 @@ TEST_F(PlugInTest, UnregistersItsClassesWhenItIsUnloaded) {
   EXPECT_EQ(VRKHostPlugInLoad(PLUG_IN, "VRKKolvanes", &plugIn), 0u);
 }
 
-void Load(Varnel::StringTranslatorInterface& translator, const std::string& bytes) {
-  const auto image = Varnel::PackTranslationImage(bytes.data(), static_cast<uint32_t>(bytes.size()));
-  translator.SetTranslations(image.units.get(), image.unitCount);
-}
-
 std::string BinaryImage(const std::string& text) {
   DictionaryTable table;
   boost::interprocess::ibufferstream in(text.data(), text.size());
@@ -151,33 +147,30 @@ class Translators {
     if (phase.run != &Translators::StartUp) Prepare();
   }
 
-  void StartUp() { Varnel::ThrowIfFailed(VRKHostPlugInInitialize(*plugIn)); }
+  void StartUp() { ThrowIfFailed(VRKHostPlugInInitialize(*plugIn)); }
   void StartUpAgain() { StartUp(); }
   void LoadText() { ExpectLoaded("\"$$$/text=loaded\"\n// some more\n", "$$$/text=default"); }
   void LoadBinary() { ExpectLoaded(binary, "$$$/binary=default"); }
   void LoadBytes() {
     first->SetTranslations("\"$$$/bytes=loaded\"\n// more\n", 27);
-    EXPECT_EQ(By(first, "$$$/bytes=default"), "loaded");
+    EXPECT_EQ(Translated(*first, "$$$/bytes=default"), "loaded\0"s);
   }
-  void Translate() { EXPECT_EQ(By(first, "$$$/k=default"), "first"); }
+  void Translate() { EXPECT_EQ(Translated(*first, "$$$/k=default"), "first\0"s); }
   void TranslateKey() {
-    Varnel::DictionaryRef parameters;
-    parameters.Create();
-    parameters.SetEntry(Varnel::MakeToken(Varnel::kParameterTranslationKey),
-                        Varnel::MakeData(Varnel::kTypeLocaleIndependentUTF8, "$$$/k=", 6));
-    Varnel::DeliverMessage(secondObject.Get(), Varnel::MakeToken(Varnel::kMessageTranslateString), parameters, false);
-    EXPECT_EQ(Varnel::GetUTF8(parameters.GetEntry(Varnel::MakeToken(Varnel::kParameterMessageResult))), "second's first\0"s);
+    const DictionaryRef parameters = With(kParameterTranslationKey, DataOf(kTypeLocaleIndependentUTF8, "$$$/k="));
+    ThrowIfFailed(Send(secondObject.Get(), kMessageTranslateString, parameters));
+    EXPECT_EQ(GetUTF8(parameters.GetEntry(MakeToken(kParameterMessageResult))), "second's first\0"s);
   }
   void Coerce() {
-    EXPECT_EQ(Coerced("$$$/k=default"), "first");
+    EXPECT_EQ(Coerced("$$$/k=default"), "first\0"s);
     std::vector<uint16_t> units;
-    Varnel::GetUTF16LE(Varnel::MakeData(Varnel::kTypeLocaleIndependentUTF8, "$$$/k=", 6), units);
+    GetUTF16LE(DataOf(kTypeLocaleIndependentUTF8, "$$$/k="), units);
     EXPECT_EQ(units.size(), 6u);
   }
-  void CreateOfDefault() { ofDefault.Create(Varnel::MakeToken(Varnel::kClassDefaultStringTranslator), {}); }
-  void MakeDefault() { Varnel::DeliverMessage(secondObject.Get(), Varnel::MakeToken(Varnel::kMessageMakeDefault), {}, false); }
+  void CreateOfDefault() { ofDefault.Create(MakeToken(kClassDefaultStringTranslator), {}); }
+  void MakeDefault() { ThrowIfFailed(Send(secondObject.Get(), kMessageMakeDefault)); }
   void Die() { secondObject.Reset(); }
-  void ShutDown() { Varnel::ThrowIfFailed(VRKHostPlugInTerminate(*plugIn)); }
+  void ShutDown() { ThrowIfFailed(VRKHostPlugInTerminate(*plugIn)); }
 
   // What was translated before still is, and all can be done again.
   void Check(const Phase<Translators>& phase) {
@@ -185,7 +178,8 @@ class Translators {
     if (Alive().find("coercions 3") != std::string::npos) {
       const bool startsUp = phase.run == &Translators::StartUp || phase.run == &Translators::StartUpAgain;
       const std::string changed = startsUp ? "default" : phase.run == &Translators::MakeDefault ? "second" : "first";
-      EXPECT_TRUE((std::set{"first"s, changed}).contains(Coerced("$$$/k=default")));
+      const std::string answer = Coerced("$$$/k=default").c_str();
+      EXPECT_TRUE(answer == "first" || answer == changed) << answer;
     }
     EXPECT_EQ(CodeOf([&] { (this->*phase.run)(); }), 0u);
     Prepare();
@@ -202,25 +196,21 @@ class Translators {
  private:
   void Prepare() {
     StartUp();
-    first = Varnel::CreateStringTranslator();
+    first = CreateStringTranslator();
     Load(*first, "\"$$$/k=first\"\n// and more\n");
     first->MakeDefault();
-    secondObject.Create(Varnel::MakeToken(Varnel::kClassStringTranslator), {});
-    Varnel::StringTranslatorClient second;
+    secondObject.Create(MakeToken(kClassStringTranslator), {});
+    StringTranslatorClient second;
     second.SetObject(secondObject);
     Load(second, "\"$$$/k=second\"\n\"$$$first=second's first\"\n");
   }
-  static std::string By(const Translator& translator, const std::string& key) {
-    const std::vector<uint16_t> units = TranslatedBy(*translator, key);
-    return {units.begin(), units.end()};
-  }
   void ExpectLoaded(const std::string& image, const std::string& key) {
     Load(*first, image);
-    EXPECT_EQ(By(first, key), "loaded");
+    EXPECT_EQ(Translated(*first, key), "loaded\0"s);
   }
 
   Translator first;
-  Varnel::ObjectRef secondObject, ofDefault;
+  ObjectRef secondObject, ofDefault;
   std::string binary = BinaryImage("\"$$$/binary=loaded\"\n// and more\n");
 };
 
@@ -233,7 +223,7 @@ TEST_F(PlugInTest, SurvivesEveryFault) {
        Hears::kAll,
        50,
        15,
-       kStarted,
+       "objects 1 handlers 1 factories 2 coercions 3 blocks 4 ",  // the first translator's object, and its handler
        {"", "objects 1 handlers 1 blocks 1 ", "objects 1 handlers 1 factories 2 blocks 3 "}},
       {"start-up again",
        &T::StartUpAgain,

@@ -4,6 +4,7 @@
 #include <cstddef>
 
 #include "PlugInTest.h"
+#include "VRKStringTranslatorClient.h"
 
 namespace {
 
