@@ -95,18 +95,13 @@ class Handler : public Varnel::MessageHandler {
   using Function = std::function<bool(VRKObject, VRKToken, const Varnel::DictionaryRef&)>;
 
   explicit Handler(Function handle, VRKObject attachTo = {}, bool deletesItself = false)
-      : MessageHandler(attachTo, deletesItself), function(std::move(handle)) {
-    ++alive;
-  }
-  ~Handler() override { --alive; }
+      : MessageHandler(attachTo, deletesItself), function(std::move(handle)) {}
 
   bool HandleMessage(VRKObject receiver, VRKToken message, const Varnel::DictionaryRef& parameters) override {
     return function(receiver, message, parameters);
   }
   VRKObject Object() const { return object; }
   bool IsRegistered() const { return registration != VRKMessageHandler{}; }
-
-  static inline int alive = 0;
 
  private:
   Function function;
