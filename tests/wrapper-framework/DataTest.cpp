@@ -135,39 +135,21 @@ TEST_F(DataTest, IsCheckedWhenItIsRead) {
 
 TEST_F(DataTest, ReportsKeysOfAnotherSizeAndGoesOn) {
   Report report;
+  report.answer = 0xFFFFFF00;  // only the low byte asks for a break
   VRKHostSetErrorReporter(&Report::Note, &report);
-  struct {
-    uint32_t count, reports;
-    uint32_t value;
-  } const cases[] = {{4, 0, 0x04030201}, {5, 1, 0x04030201}, {3, 1, 0x00030201}, {0, 1, 0}};
+  const struct { uint32_t count, reports, value; } cases[] = {{4, 0, 0x04030201}, {5, 1, 0x04030201}, {3, 1, 0x00030201}, {0, 1, 0}};
+  const auto extract = [](uint32_t count) { return Varnel::ExtractData<uint32_t>(MakeData("type:test", "\1\2\3\4\5", count)); };
   for (const auto& each : cases) {
     report.count = 0;
-    const DataRef data = MakeData("type:test", "\1\2\3\4\5", each.count);
-    EXPECT_EQ(Varnel::ExtractData<uint32_t>(data), each.value) << each.count;
+    EXPECT_EQ(extract(each.count), each.value);
     EXPECT_EQ(report.count, each.reports) << each.count;
   }
   EXPECT_EQ(report.text,
             "2|varnel.wrapper-framework|sizeof(T) == dataSize|wrapper-framework/source/Data.h|51|"
             "`anonymous-namespace'::ExtractData");
   EXPECT_EQ(CodeOf([] { Varnel::ExtractData<uint32_t>(DataRef()); }), VRKResult{kVRKInvalidHandle});
-}
-
-TEST_F(DataTest, ReportsUntilTheKernelHasHadEnough) {
-  Report report;
-  VRKHostSetErrorReporter(&Report::Note, &report);
-  static Varnel::CheckSite site{"domain", "false", "file", 7, "function"};
-  int evaluations = 0;
-  const auto check = [&](bool holds) { Varnel::ReportedCheck(site, [&] { return ++evaluations, holds; }); };
-  report.answer = 0xFFFFFF00;  // only the low byte asks for a break
-  for (const uint32_t reports : {0u, 1u, 2u, 2u}) {
-    report.flagToSet = report.count;
-    check(reports == 0);
-    EXPECT_EQ(report.count, reports);
-  }
-  EXPECT_EQ(evaluations, 3);
-  site.onceFlag = 0;
   report.answer = 1;
-  EXPECT_EQ(BreaksOf([&] { check(false); }), 1);
+  EXPECT_EQ(BreaksOf([&] { extract(3); }), 1);
 }
 
 TEST_F(DataTest, BecomesValues) {
