@@ -36,7 +36,7 @@ class Walk : private CheckedCalls {
  private:
   Argument PickMessage() { return PickToken(0, 3); }
   Argument PickKey() { return PickToken(1, 3); }
-  Argument PickType() { return PickToken(3, OneIn(4) ? kTexts.size() - 3 : 2); }
+  Argument PickType() { return PickToken(3, OneIn(2) ? kTexts.size() - 3 : 2); }
   uintptr_t PickContext() { return 1 + Below(3); }
 
   // Objects
@@ -213,27 +213,22 @@ class Walk : private CheckedCalls {
     const Kind kind = PayloadKindOf(type);
     const Argument named = kind == Kind::kToken ? PickMessage() : Pick(kind);
     std::string bytes(Below(40), static_cast<char>('a' + Below(26)));
-    if (kind != Kind::kData) bytes = BytesOf(named).substr(0, OneIn(16) ? Below(4) : 4);
+    if (kind != Kind::kData) bytes = BytesOf(named);
+    if (kind != Kind::kData && OneIn(16)) bytes.resize(Below(9));
+    const bool isNamed = kind != Kind::kData && bytes.size() == sizeof(Handle);
     const void* const given = OneIn(32) ? nullptr : bytes.data();
     const auto count = static_cast<uint32_t>(bytes.size());
+    auto out = MakeOut<VRKData>();
     Call call;
-    call.lacksPointer = (given == nullptr && count != 0) || (kind != Kind::kData && count != 4);
-    if (kind != Kind::kData && count == 4) call.arguments = {named};
-    auto out = MakeOut<VRKData>();
-    const bool isMade = Run(call, OPERATION(VRKDataCreate), type, given, count, 0u, out);
+    call.lacksPointer = (given == nullptr && count != 0) || (kind != Kind::kData && !isNamed);
+    if (isNamed) call.arguments = {named};
+    const bool isMade =
+        !isNamed || OneIn(2)   ? Run(call, OPERATION(VRKDataCreate), type, given, count, 0u, out)
+        : kind == Kind::kToken ? Run(OPERATION(VRKHostTokenDataCreate), named, out)
+        : kind == Kind::kList  ? Run(OPERATION(VRKHostListDataCreate), named, out)
+                               : Run(OPERATION(VRKHostDictionaryDataCreate), named, out);
     if (isMade) AddData(uint32_t(out.value), type, bytes);
-  }
-  void CreateHandleData() {
-    const Handle type = TokenOf(5 + Below(3));
-    const Kind kind = PayloadKindOf(type);
-    const Argument named = kind == Kind::kToken ? PickMessage() : Pick(kind);
-    auto out = MakeOut<VRKData>();
-    const bool isMade = kind == Kind::kToken ? Run(OPERATION(VRKHostTokenDataCreate), named, out)
-                        : kind == Kind::kList
-                            ? Run(OPERATION(VRKHostListDataCreate), named, out)
-                            : Run(OPERATION(VRKHostDictionaryDataCreate), named, out);
-    if (isMade) AddData(uint32_t(out.value), type, BytesOf(named));
-    if (isMade && kind != Kind::kToken && OneIn(2)) Release(named);
+    if (isMade && isNamed && kind != Kind::kToken && OneIn(2)) Release(named);
   }
   // The bytes of data that the kernel has made, unseen by the trace.
   std::string Read(Handle data) {
@@ -345,11 +340,6 @@ class Walk : private CheckedCalls {
     const auto* const kept = static_cast<const char*>(bytes.value);
     Require(std::equal(item.bytes.begin(), item.bytes.end(), kept), "it has its bytes");
   }
-  void GetListSize(Argument list) {
-    auto out = MakeOut<uint32_t>();
-    if (!Run(OPERATION(VRKListGetSize), list, out)) return;
-    Require(out.value == model.At(list).entries.size(), "a list's size");
-  }
   void GetEntry(Argument value, Handle at) {
     const auto isThere = [&] { return model.At(value).entries.contains(at); };
     Call call{[&] { return isThere() ? kVRKNoError : kVRKNotFound; }};
@@ -362,9 +352,12 @@ class Walk : private CheckedCalls {
   }
   void Read(Argument value) {
     if (value.kind == Kind::kData) GetData(value);
-    if (value.kind == Kind::kList) GetListSize(value);
     if (value.kind == Kind::kDictionary) GetEntry(value, PickKey());
-    if (value.kind == Kind::kList) GetEntry(value, Below(4));
+    if (value.kind != Kind::kList) return;
+    GetEntry(value, Below(4));
+    auto size = MakeOut<uint32_t>();
+    const bool isDone = Run(OPERATION(VRKListGetSize), value, size);
+    if (isDone) Require(size.value == model.At(value).entries.size(), "its size");
   }
 
   // The rest
@@ -487,16 +480,16 @@ class Walk : private CheckedCalls {
 
   void Step() override {
     static constexpr std::pair<uint32_t, void (Walk::*)()> kSteps[] = {
-        {1, &Walk::EndOrStart},       {3, &Walk::CreateObject},     {3, &Walk::DeliverMessage},
-        {3, &Walk::InstallHandler},   {1, &Walk::AddToAny},         {1, &Walk::RemoveHandler},
-        {1, &Walk::RegisterFactory},  {1, &Walk::UnregisterAny},    {2, &Walk::InstallCoercion},
-        {1, &Walk::RemoveAny},        {1, &Walk::CreateAnyToken},   {1, &Walk::GetTokenString},
-        {2, &Walk::CreateData},       {1, &Walk::CreateHandleData}, {2, &Walk::ReadAny},
-        {2, &Walk::CoerceData},       {1, &Walk::CreateDictionary}, {1, &Walk::SetEntry},
-        {1, &Walk::CreateKeyList},    {1, &Walk::CreateList},       {1, &Walk::Append},
-        {2, &Walk::RetainAny},        {3, &Walk::ReleaseAny},       {1, &Walk::AllocateMemory},
-        {1, &Walk::DeallocateMemory}, {1, &Walk::ReportError},      {1, &Walk::SetAnyHook},
-        {1, &Walk::SetAnyReporter},   {1, &Walk::GetCounts}};
+        {1, &Walk::EndOrStart},       {3, &Walk::CreateObject},   {3, &Walk::DeliverMessage},
+        {3, &Walk::InstallHandler},   {1, &Walk::AddToAny},       {1, &Walk::RemoveHandler},
+        {1, &Walk::RegisterFactory},  {1, &Walk::UnregisterAny},  {2, &Walk::InstallCoercion},
+        {1, &Walk::RemoveAny},        {1, &Walk::CreateAnyToken}, {1, &Walk::GetTokenString},
+        {3, &Walk::CreateData},       {2, &Walk::ReadAny},        {2, &Walk::CoerceData},
+        {1, &Walk::CreateDictionary}, {1, &Walk::SetEntry},       {1, &Walk::CreateKeyList},
+        {1, &Walk::CreateList},       {1, &Walk::Append},         {2, &Walk::RetainAny},
+        {3, &Walk::ReleaseAny},       {1, &Walk::AllocateMemory}, {1, &Walk::DeallocateMemory},
+        {1, &Walk::ReportError},      {1, &Walk::SetAnyHook},     {1, &Walk::SetAnyReporter},
+        {1, &Walk::GetCounts}};
     const bool mayBeAny = model.isRunning || OneIn(4);
     if (kLibrariesShareRuntime && OneIn(8)) failAt = 1 + Below(6);
     uint32_t passed = mayBeAny ? Below(42) : 0;
