@@ -67,12 +67,15 @@ class Install(unittest.TestCase):
     def translate(self, dictionary):
         return self.must(*KOLVANE, "translate", "--dictionary", dictionary, CANCEL, cwd=self.prefix)
 
+    def flags(self, name):
+        folder = next(self.prefix.rglob("pkgconfig"))
+        return self.must("pkg-config", "--cflags", "--libs", name, env={**os.environ, "PKG_CONFIG_PATH": folder}).split()
+
     def test_nothing_leads_back(self):
         for path in self.prefix.rglob("*"):
             self.assertFalse(path.is_symlink(), path)
-            if path.is_file():
-                for trace in (SOURCE, self.folder):
-                    self.assertNotIn(os.fsencode(trace), path.read_bytes(), path)
+            for trace in (SOURCE, self.folder) if path.is_file() else ():
+                self.assertNotIn(os.fsencode(trace), path.read_bytes(), path)
 
     @unittest.skipIf(OPTIONS, "no manual page on Windows")
     def test_manual_and_completions_know_every_option(self):
@@ -114,43 +117,35 @@ class Install(unittest.TestCase):
     def test_hosts(self):
         build, _ = self.configure(SOURCE / "examples/host")
         self.must("cmake", "--build", build)
-        flags = {name: self.must("pkg-config", "--cflags", "--libs", name, env={
-            **os.environ, "PKG_CONFIG_PATH": next(self.prefix.rglob("pkgconfig"))}).split()
-            for name in ("varnel-kernel", "kolvane")}
         search = f"-Wl,-rpath,{next(self.prefix.rglob('libVarnelKernel.so')).parent}"
-        self.must("gcc", SOURCE / "examples/host/host.c", "-o", build / "c", *flags["varnel-kernel"], search)
-        self.must("g++", "-std=c++20", SOURCE / "examples/host/host.cpp", "-o", build / "cpp", *flags["kolvane"], search)
+        self.must("gcc", SOURCE / "examples/host/host.c", "-o", build / "c", *self.flags("varnel-kernel"), search)
+        self.must("g++", "-std=c++20", SOURCE / "examples/host/host.cpp", "-o", build / "cpp", *self.flags("kolvane"), search)
         for host in ("host", "host-c", "c", "cpp"):
             self.assertEqual(run(build / host, "libVRKKolvanes.so", SOURCE / "examples/dictionaries/de.txt", CANCEL),
                              (0, "message: Abbrechen\ncoercion: Abbrechen\n"))
 
     @unittest.skipIf(OPTIONS, "compilers of this machine")
     def test_the_dictionary_library_alone(self):
-        flags = self.must("pkg-config", "--cflags", "--libs", "kolvane-dictionary", env={
-            **os.environ, "PKG_CONFIG_PATH": next(self.prefix.rglob("pkgconfig"))}).split()
         program = self.folder / "alone"
         program.with_suffix(".cpp").write_text('#include <KolvaneDictionary.h>\nint main() { return KolvaneDictionary()'
                                                '.Translate("$$$/a=seven c", nullptr).BufferSize(); }\n')
-        self.must("g++", "-std=c++20", program.with_suffix(".cpp"), "-o", program, *flags)
+        self.must("g++", "-std=c++20", program.with_suffix(".cpp"), "-o", program, *self.flags("kolvane-dictionary"))
         self.assertEqual(run(program), (8, ""))
 
     def test_calls_that_are_refused(self):
         (self.folder / "plain.txt").touch()
-        for arguments, reason in [("", r"<target> SOURCES"), ("FROMAT 1.0 SOURCES de.txt", "<target> SOURCES"),
+        for arguments, reason in [("", "<target> SOURCES"), ("FROMAT 1.0 SOURCES de.txt", "<target> SOURCES"),
                                   ("SOURCES de.txt OUTPUT ${CMAKE_SOURCE_DIR}/d.bin", "not in the build folder"),
                                   ("SOURCES de.txt OUTPUT ../d.bin", "not in the build folder"),
                                   ("SOURCES ${CMAKE_BINARY_DIR}/a OUTPUT a", "one of the SOURCES")]:
-            with self.subTest(arguments):
-                _, output = self.configure(self.project(f"kolvane_add_dictionary(d {arguments})"), expected=1)
-                self.assertIn(reason, " ".join(output.split()))
+            _, output = self.configure(self.project(f"kolvane_add_dictionary(d {arguments})"), expected=1)
+            self.assertIn(reason, " ".join(output.split()), arguments)
 
     def test_options_reach_the_command(self):
-        source = self.project("kolvane_add_dictionary(d SOURCES de.txt de.txt OUTPUT sub/d.bin FORMAT 1.0 VALUES utf-8"
-                              " ENCODING utf-8)")
+        source = self.project("kolvane_add_dictionary(d SOURCES de.txt de.txt OUTPUT sub/d.bin FORMAT 1.0 VALUES utf-8 ENCODING utf-8)")
         build, _ = self.configure(source)
-        output = self.must("cmake", "--build", build, "--verbose")
-        self.assertIn(f"compile {source}/de.txt {source}/de.txt -o {build}/sub/d.bin --format 1.0 --values utf-8"
-                      " --encoding utf-8", output)
+        self.assertIn(f"compile {source}/de.txt {source}/de.txt -o {build}/sub/d.bin --format 1.0 --values utf-8 --encoding utf-8",
+                      self.must("cmake", "--build", build, "--verbose"))
         self.assertEqual(self.translate(build / "sub/d.bin"), "Abbrechen\n")
 
     @unittest.skipIf(OPTIONS, "pretends to be a cross build")
@@ -176,13 +171,9 @@ class Install(unittest.TestCase):
         files = {name.removeprefix("./usr/"): mode for mode, _, _, _, _, name in listed if mode[0] != "d"}
         installed = {str(path.relative_to(self.prefix)) for path in self.prefix.rglob("*") if path.is_file()}
         self.assertEqual(set(files), installed)
-        for name in ("share/man/man1/kolvane.1.gz", "share/bash-completion/completions/kolvane",
-                     "include/kolvane/kernel/VarnelKernel.h", "lib/cmake/Kolvane/KolvaneConfig.cmake"):
-            self.assertIn(name, files)
         self.assertEqual({mode for mode, *_ in listed}, {"drwxr-xr-x", "-rw-r--r--", "-rwxr-xr-x"})
         self.assertEqual([name for name, mode in files.items() if "x" in mode], ["bin/kolvane"])
-        depends = self.must("dpkg-deb", "-f", package, "Depends")
-        self.assertRegex(depends, r"libc6 .*libfmt9 .*libstdc\+\+6")
+        self.assertRegex(self.must("dpkg-deb", "-f", package, "Depends"), r"libc6 .*libfmt9 .*libstdc\+\+6")
 
 
 if __name__ == "__main__":

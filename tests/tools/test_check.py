@@ -116,20 +116,17 @@ class Check(CommandTest):
         for more in [], ["none"]:
             log = json.loads(self.check("--format=sarif", "./" + text, binary, *more)[1])
             [run] = log["runs"]
-            self.assertEqual((log["version"], run["columnKind"]), ("2.1.0", "unicodeCodePoints"))
-            self.assertEqual(sorted(run["newlineSequences"]), ["\n", "\r", "\r\n", "\u2028", "\u2029"])
             [invocation] = run["invocations"]
-            self.assertEqual(invocation["executionSuccessful"], not more)
-            self.assertEqual(len(invocation["toolExecutionNotifications"]), len(more))
-        rules = run["tool"]["driver"]["rules"]
+            self.assertEqual((invocation["executionSuccessful"], len(invocation["toolExecutionNotifications"])), (not more, len(more)))
+        self.assertEqual((log["version"], run["columnKind"]), ("2.1.0", "unicodeCodePoints"))
+        self.assertEqual(sorted(run["newlineSequences"]), ["\n", "\r", "\r\n", "\u2028", "\u2029"])
         for result in run["results"]:
-            self.assertEqual(rules[result["ruleIndex"]]["id"], result["ruleId"])
-            self.assertEqual(rules[result["ruleIndex"]]["defaultConfiguration"]["level"], result["level"])
+            rule = run["tool"]["driver"]["rules"][result["ruleIndex"]]
+            self.assertEqual((rule["id"], rule["defaultConfiguration"]["level"]), (result["ruleId"], result["level"]))
             self.assertRegex(list(result["partialFingerprints"].values())[0], "^[0-9a-f]{16}$")
             self.assertRegex(result["message"]["text"], r"^([^{}]|{{|}})+$")
         places = [result["locations"][0]["physicalLocation"] for result in run["results"]]
-        self.assertEqual(places[0]["artifactLocation"]["uri"], "%C3%A4%20b%23%7B0%7D.txt")
-        self.assertEqual(places[0]["region"]["startLine"], 2)
+        self.assertEqual((places[0]["artifactLocation"]["uri"], places[0]["region"]["startLine"]), ("%C3%A4%20b%23%7B0%7D.txt", 2))
         self.assertGreater(places[-1]["region"]["byteOffset"], 20)
         self.assertEqual(run["results"][0]["relatedLocations"][0]["physicalLocation"]["region"]["startLine"], 1)
 

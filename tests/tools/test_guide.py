@@ -7,7 +7,7 @@ import subprocess
 import sys
 import unittest
 
-from command import KOLVANE, CommandTest
+from command import KOLVANE, CommandTest, utf16
 
 GUIDE = pathlib.Path(sys.argv.pop(1)).read_text(encoding="utf-8")
 BLOCKS = re.findall(r"^```(\w+)(?: file=(\S+))?\n(.*?)^```$", GUIDE, re.M | re.S)
@@ -53,20 +53,15 @@ class Guide(CommandTest):
             examples = [code(cell) for cell in cells[:-1]]
             if not any(examples):
                 continue
+            reference = []
             if len(examples) == 2:  # of reference and translation
-                self.write("r", [f'"/a={"".join(examples[0])}"'])
-                self.write("d", [f'"/a={"".join(examples[1])}"'])
+                reference = ["--reference", self.file(utf16(f'"/a={"".join(examples[0])}"'), "r")]
+                self.file(utf16(f'"/a={"".join(examples[1])}"'), "d")
             else:
-                self.write("r", [])
-                self.write("d", examples[0] if rule == "mark-in-key" else ["", *examples[0]])
-            reference = ["--reference", "r"] if len(examples) == 2 else []
+                self.file(utf16("\n".join(examples[0] if rule == "mark-in-key" else ["", *examples[0]])), "d")
             found = self.output_of("check", "--no-snippet", "--info", "d", *reference)
             self.assertIn(f"[{rule}]", found)
             self.assertEqual(found.count("["), 1, found)
-
-    def write(self, name, lines):
-        text = "\ufeff" + "\n".join(lines) + "\n" * 30
-        self.folder.joinpath(name).write_bytes(text.encode("utf-16-le"))
 
 
 if __name__ == "__main__":

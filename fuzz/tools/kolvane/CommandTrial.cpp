@@ -1,9 +1,11 @@
+// Any bytes as the files of `kolvane check`, `compile`, `convert`, `dump` and `stats`.
 #include "CommandTrial.h"
 
 #include <algorithm>
 #include <array>
 #include <fstream>
 #include <iterator>
+#include <map>
 #include <random>
 
 #include "CheckCommand.h"
@@ -21,16 +23,11 @@ namespace {
 
 namespace fs = std::filesystem;
 
-struct Command {
-  std::string_view name;
-  ExitStatus (*run)(int argc, const char* const* argv);
-};
-
-constexpr Command kCommands[] = {{"check", RunCheck},
-                                 {"compile", RunCompile},
-                                 {"convert", RunConvert},
-                                 {"dump", RunDump},
-                                 {"stats", RunStats}};
+const std::map<std::string, decltype(&RunCheck)> kCommands = {{"check", RunCheck},
+                                                              {"compile", RunCompile},
+                                                              {"convert", RunConvert},
+                                                              {"dump", RunDump},
+                                                              {"stats", RunStats}};
 
 std::string gOutput, gSaid;
 
@@ -69,11 +66,11 @@ Words operator+(Words words, const Words& more) {
 CommandRun RunCommand(const Words& words) {
   std::vector<const char*> argv(words.size());
   std::ranges::transform(words, argv.begin(), &std::string::c_str);
-  const auto* const command = std::ranges::find(kCommands, words.front(), &Command::name);
   gOutput.clear();
   gSaid.clear();
-  const ExitStatus status = Guard(
-      words.front(), [&] { return command->run(static_cast<int>(argv.size()), argv.data()); });
+  const ExitStatus status = Guard(words.front(), [&] {
+    return kCommands.at(words.front())(static_cast<int>(argv.size()), argv.data());
+  });
   Require(status != ExitStatus::kNotDone || !gSaid.empty(), "who refuses says why");
   return {status, std::move(gOutput), std::move(gSaid)};
 }
@@ -82,12 +79,9 @@ Trial::Trial(const uint8_t* choice, size_t choiceCount, const std::vector<std::s
     : choices(choice, choiceCount),
       folder(fs::temp_directory_path() /
              ("kolvane-fuzz-" + std::to_string(std::random_device()()))) {
-  constexpr std::array kEncodings = {FileEncoding::kAuto, FileEncoding::kImage,
-                                     FileEncoding::kUTF8};
-  constexpr std::array kWords = {"auto", "image", "utf-8"};
-  const uint32_t number = choices.Below(kEncodings.size());
-  encoding = kEncodings[number];
-  encodingOption = {"--encoding", kWords[number]};
+  encodingOption = {"--encoding", Pick({"auto", "image", "utf-8"})};
+  if (encodingOption.back() == "image") encoding = FileEncoding::kImage;
+  if (encodingOption.back() == "utf-8") encoding = FileEncoding::kUTF8;
   isOutputThere = choices.OneIn(2);
   fs::create_directory(folder);
   for (const std::string& bytes : contents) {
@@ -133,4 +127,14 @@ Loaded::Loaded(const Words& files, FileEncoding encoding) {
     isTooShort = isTooShort || status.damage == LoadDamage::kTooShort;
   }
   answers = AnswersOf(table);
+}
+
+// The first bytes choose the command and its options; then come files.
+int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
+  constexpr size_t kChoices = 6;
+  constexpr std::array kTries = {TryCheck, TryCompile, TryConvert, TryDump, TryStats};
+  const size_t head = std::min(size, kChoices);
+  Trial trial(data, head, Pieces(data + head, size - head));
+  kTries[trial.choices.Below(kTries.size())](trial);
+  return 0;
 }

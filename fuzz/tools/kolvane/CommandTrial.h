@@ -47,7 +47,7 @@ class Trial {
   std::string Write(std::string_view name, std::string_view bytes) const;
 
   Choices choices;
-  FileEncoding encoding;
+  FileEncoding encoding = FileEncoding::kAuto;
   Words encodingOption;
   Words files;
 

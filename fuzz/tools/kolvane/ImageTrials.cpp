@@ -3,49 +3,42 @@
 #include <nlohmann/json.hpp>
 
 #include "CommandTrial.h"
-#include "DictionaryFile.h"
 #include "DictionaryReader.h"
-#include "DictionaryWriter.h"
 #include "Input.h"
 #include "Text.h"
 
 namespace {
 
 using JSON = nlohmann::json;
-using Entries = std::vector<const tovali_private::DictionaryEntry*>;
 
-// The name of what `compile` makes of the file, which is whole.
-std::string Compiled(const Trial& trial) {
-  const auto image = trial.Written(Words{"compile", trial.files.front()} + trial.encodingOption);
-  Require(image.has_value(), "what is whole compiles");
-  return trial.Write("compiled", *image);
-}
-
-void RequireSame(const JSON& object, const tovali_private::DictionaryEntry& entry) {
-  const auto key = object.contains("key")
-                       ? object["key"].get<std::string>()
-                       : std::string(AsText(object["keyBytes"].get<std::vector<uint8_t>>()));
-  const auto value = object.contains("value")
-                         ? ToUTF16(object["value"].get_ref<const std::string&>())
-                         : object["valueUnits"].get<std::vector<uint16_t>>();
-  Require(key == AsText(entry.Bytes()), "JSON has the keys");
-  Require(std::ranges::equal(value, entry.Value().Units()), "JSON has the values");
+Answers AnswersIn(const JSON& entries) {
+  Answers answers;
+  for (const JSON& entry : entries) {
+    const auto key = entry.contains("key")
+                         ? entry["key"].get<std::string>()
+                         : std::string(AsText(entry["keyBytes"].get<std::vector<uint8_t>>()));
+    const auto value = entry.contains("value")
+                           ? ToUTF16(entry["value"].get_ref<const std::string&>())
+                           : entry["valueUnits"].get<std::vector<uint16_t>>();
+    answers[key] = {value.begin(), value.end()};
+  }
+  return answers;
 }
 
 void TryDumpAsJSON(Trial& trial) {
-  const Words options =
-      trial.choices.OneIn(2) ? Words{"dump", "--json"} : Words{"dump", "--json", "--sort"};
+  const bool isSorted = !trial.choices.OneIn(2);
+  const Words options = isSorted ? Words{"dump", "--json", "--sort"} : Words{"dump", "--json"};
   const CommandRun run = trial.Run(options + Words{trial.files.front()});
-  Loaded input({trial.files.front()}, trial.encoding);
-  Entries entries =
-      EntriesInFileOrder(input.table, ReadImageFile(trial.files.front(), trial.encoding));
-  if (options.size() == 3) std::ranges::sort(entries, tovali_private::KeyComesBefore);
-  const JSON objects = JSON::parse(run.output)["entries"];
-  Require(objects.size() == input.answers.size(), "JSON has each entry");
-  for (size_t i = 0; i < entries.size(); ++i) RequireSame(objects[i], *entries[i]);
+  const Loaded input({trial.files.front()}, trial.encoding);
+  const JSON entries = JSON::parse(run.output)["entries"];
+  Require(entries.size() == input.answers.size(), "JSON has each entry once");
+  Require(AnswersIn(entries) == input.answers, "JSON has what a translator finds");
   Require((run.status == ExitStatus::kDone) == input.isWhole, "the status tells of damage");
-  if (!input.isWhole || options.size() != 3) return;
-  Require(RunCommand(options + Words{Compiled(trial)}).output == run.output, "an image tells all");
+  if (!input.isWhole || !isSorted) return;
+  const auto image = trial.Written(Words{"compile", trial.files.front()} + trial.encodingOption);
+  Require(image.has_value(), "what is whole compiles");
+  const Words copy = {trial.Write("compiled", *image)};
+  Require(RunCommand(options + copy).output == run.output, "an image tells all");
 }
 
 void TryDumpAsText(Trial& trial) {
