@@ -75,12 +75,12 @@ class Check(CommandTest):
     def test_colours(self):
         name = self.file(DROPPED)
         plain = self.check(name)[1]
-        for options, environment, coloured in [([], {}, False), ([], {"CLICOLOR_FORCE": "1"}, True), ([], {"CLICOLOR_FORCE": "0"}, False),
-                                               ([], {"CLICOLOR_FORCE": "1", "NO_COLOR": "1"}, False),
-                                               ([], {"CLICOLOR_FORCE": "1", "NO_COLOR": ""}, True),
-                                               (["--color=always"], {"NO_COLOR": "1"}, True), (["--color=never"], {"CLICOLOR_FORCE": "1"}, False)]:
-            with self.subTest(options=options, **environment):
-                output = self.check(*options, name, environment=environment)[1]
+        for choice, environment, coloured in [("auto", {}, False), ("auto", {"CLICOLOR_FORCE": "1"}, True), ("auto", {"CLICOLOR_FORCE": "0"}, False),
+                                              ("auto", {"CLICOLOR_FORCE": "1", "NO_COLOR": "1"}, False),
+                                              ("auto", {"CLICOLOR_FORCE": "1", "NO_COLOR": ""}, True),
+                                              ("always", {"NO_COLOR": "1"}, True), ("never", {"CLICOLOR_FORCE": "1"}, False)]:
+            with self.subTest(choice, **environment):
+                output = self.check(f"--color={choice}", name, environment=environment)[1]
                 self.assertEqual("\x1b[" in output, coloured)
                 self.assertEqual(re.sub("\x1b\\[[0-9;]*m", "", output), plain)
 
