@@ -82,7 +82,7 @@ TEST(Load, TellsHowItWent) {
   ASSERT_EQ(one15, "Kolvane Binary Format\1\5\0\1\0\0\0\2\0\0\0\2\0\0\0\4\0\0\0\x44\2/aH\0i\0"s);
   ASSERT_EQ(one10, "Kolvane Binary Format\1\0\0\2\0\x44\2\x26\0\0\0\0\0\x34\0\0\0\2\0\0\0/a\4\0\0\0H\0i\0"s);
   const std::vector<ImageGroup> misplaced = {{580, {{"/a", "x"}, {"/ccc", "x"}, {"/d", "x"}}}};  // the last two, that is
-  const std::string misplaced15 = Image1_5(0, misplaced), misplaced10 = Image1_0(0, misplaced);
+  const std::string misplaced15 = Image1_5(0, misplaced), misplaced10 = Image1_0(9, misplaced);
   const std::string line = "\"$$$/a=a line of text\"\n";
   struct {
     std::string image;
@@ -119,9 +119,11 @@ TEST(Load, TellsHowItWent) {
       {damaged(two15, 52, "\xFD\3").substr(0, two15.size() - 1), ImageFormat::kBinary1_5, TextEncoding::kUTF8, 0, 0, 0,
        LoadDamage::kShortRead, two15.size() - 1},
       {misplaced15, ImageFormat::kBinary1_5, TextEncoding::kUTF16LE, 3, 0, 0, LoadDamage::kWrongBucket, misplaced15.size() - 8},
-      {misplaced10, ImageFormat::kBinary1_0, TextEncoding::kUTF16LE, 3, 0, 0, LoadDamage::kWrongBucket, misplaced10.size() - 20},
+      {misplaced10, ImageFormat::kBinary1_0, TextEncoding::kCodePage, 3, 0, 0, LoadDamage::kWrongBucket, misplaced10.size() - 20},
       {LittleEndianImage(u"\"$$$/abcdef=b\"\n") + "x", ImageFormat::kText, TextEncoding::kUTF16LE, 2, 0, 0, LoadDamage::kHalfUnit, 32},
       {damaged(two10, 34, "\x2D"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 2, 0, 0, LoadDamage::kBadOffset, 34},
+      {damaged(damaged(two10, 34, "\x2D"), 26, "\xFD\3"), ImageFormat::kBinary1_0, TextEncoding::kCodePage, 1, 0, 0, LoadDamage::kBadBucket,
+       26},
   };
   for (const auto& each : cases) {
     SCOPED_TRACE(&each - cases);
