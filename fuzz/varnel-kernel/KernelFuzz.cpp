@@ -20,12 +20,10 @@ std::string BytesOf(Handle handle) {
 
 class Walk : private CheckedCalls {
  public:
-  // A text's first token is made with every allocation failing in turn.
   explicit Walk(Choices& decisions) : CheckedCalls(decisions) {
     Start();
     for (uint32_t number = 0; number < kTexts.size(); ++number) {
-      failAt = 1;
-      for (size_t next = 2; !CreateToken(number, {kTexts[number]}, {true}); ++next) failAt = next;
+      Require(CreateToken(number, {kTexts[number]}, {true}), "a text has a token");
     }
   }
   void Go() {
@@ -209,7 +207,7 @@ class Walk : private CheckedCalls {
     model.Retain(data.entries[0]);
   }
   void CreateData() {
-    const Argument type = PickType();
+    const Argument type = OneIn(2) ? PickToken(5, 3) : PickType();
     const Kind kind = PayloadKindOf(type);
     const Argument named = kind == Kind::kToken ? PickMessage() : Pick(kind);
     std::string bytes(Below(40), static_cast<char>('a' + Below(26)));
@@ -363,6 +361,7 @@ class Walk : private CheckedCalls {
   // The rest
 
   void Retain(Argument counted) {
+    counted.mayBeNull = true;
     const Kind kind = counted.kind;
     const bool isDone = kind == Kind::kObject ? Run(OPERATION(VRKObjectRetain), counted)
                         : kind == Kind::kData ? Run(OPERATION(VRKDataRetain), counted)
@@ -458,19 +457,19 @@ class Walk : private CheckedCalls {
 
   // Steps that take what there is
 
-  Argument PickCounted(bool mayBeNull) {
+  Argument PickCounted() {
     constexpr Kind kCounted[] = {Kind::kObject, Kind::kData, Kind::kList, Kind::kDictionary};
-    return Pick(kCounted[Below(4)], mayBeNull);
+    return Pick(kCounted[Below(4)]);
   }
   void RegisterFactory() { Register(Kind::kFactory); }
   void InstallCoercion() { Register(Kind::kCoercion); }
   void AddToAny() { AddMessages(Pick(Kind::kHandler)); }
   void UnregisterAny() { Unregister(Kind::kFactory, PickContext()); }
   void RemoveAny() { Unregister(Kind::kCoercion, PickContext()); }
-  void ReadAny() { Read(PickCounted(false)); }
-  void RetainAny() { Retain(PickCounted(true)); }
+  void ReadAny() { Read(PickCounted()); }
+  void RetainAny() { Retain(PickCounted()); }
   void ReleaseAny() {
-    const Argument counted = PickCounted(true);
+    const Argument counted = PickCounted();
     Release(counted);
     if (OneIn(4)) Release(counted);
   }
