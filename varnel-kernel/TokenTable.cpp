@@ -1,16 +1,6 @@
 #include "TokenTable.h"
 
-#define XXH_INLINE_ALL
-#include <xxhash.h>
-
-#include "ProcessSeed.h"
-
 namespace varnel_kernel {
-
-size_t TokenTable::Hash::operator()(std::string_view text) const noexcept {
-  static const uint64_t seed = platform::ProcessSeed();
-  return static_cast<size_t>(XXH3_64bits_withSeed(text.data(), text.size(), seed));
-}
 
 VRKToken TokenTable::TokenOf(std::string_view text) {
   if (const auto found = tokens.find(text); found != tokens.end()) return found->second;

@@ -2,12 +2,11 @@
 #pragma once
 
 #include <boost/unordered/unordered_flat_map.hpp>
-#include <cstddef>
-#include <cstdint>
 #include <deque>
 #include <string>
 #include <string_view>
 
+#include "SeededHash.h"
 #include "VarnelKernel.h"
 
 namespace varnel_kernel {
@@ -25,14 +24,8 @@ class TokenTable {
   const char* TextOf(VRKToken token) const noexcept;
 
  private:
-  // Tokens are asked for by their texts over and over again.
-  struct Hash {
-    using is_avalanching = void;
-    size_t operator()(std::string_view text) const noexcept;
-  };
-
   std::deque<std::string> texts;  // that of token n at n - 1
-  boost::unordered_flat_map<std::string_view, VRKToken, Hash> tokens;
+  boost::unordered_flat_map<std::string_view, VRKToken, platform::SeededHash> tokens;
 };
 
 }  // namespace varnel_kernel

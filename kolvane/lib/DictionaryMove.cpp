@@ -32,7 +32,6 @@ void DictionaryTable::MoveFromMostlyDeadMemory() noexcept {
   }
 }
 
-// Meanwhile the run of each entry that is being replaced names the entry that replaces it.
 void DictionaryTable::MoveChain(HashItem*& head) {
   std::vector<std::unique_ptr<DictionaryEntry>> copies;
   for (HashItem* item = head; item != nullptr; item = item->next) {
@@ -41,8 +40,13 @@ void DictionaryTable::MoveChain(HashItem*& head) {
   auto copy = copies.begin();
   for (HashItem* item = head; item != nullptr; item = item->next) {
     index.Replace(EntryOf(*item).Run(), (*copy)->Run());
-    EntryOf(*item).Run().entry = (copy++)->get();
+    EntryOf(*item).Run().entry = (copy++)->release();
   }
+  ReplaceByMoved(head);
+}
+
+// The run of each entry names the one that takes its place.
+void DictionaryTable::ReplaceByMoved(HashItem*& head) noexcept {
   HashItem* last = nullptr;
   for (HashItem* item = std::exchange(head, nullptr); item != nullptr;) {
     const std::unique_ptr<HashItem> replaced(item);
@@ -54,5 +58,4 @@ void DictionaryTable::MoveChain(HashItem*& head) {
     last = moved;
     item = item->next;
   }
-  for (auto& moved : copies) static_cast<void>(moved.release());
 }

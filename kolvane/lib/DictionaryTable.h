@@ -107,6 +107,7 @@ class DictionaryTable {
   void Unlink(tovali_private::HashItem& item) noexcept;
   void MoveFromMostlyDeadMemory() noexcept;
   void MoveChain(tovali_private::HashItem*& head);
+  static void ReplaceByMoved(tovali_private::HashItem*& head) noexcept;
   void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
 
   tovali_private::EntryMemory memory;

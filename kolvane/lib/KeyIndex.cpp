@@ -1,8 +1,5 @@
 #include "KeyIndex.h"
 
-#define XXH_INLINE_ALL
-#include <xxhash.h>
-
 #include <algorithm>
 #include <cstring>
 #include <limits>
@@ -11,7 +8,7 @@
 #include <utility>
 
 #include "Memory.h"
-#include "ProcessSeed.h"
+#include "SeededHash.h"
 
 namespace tovali_private {
 namespace {
@@ -96,7 +93,8 @@ void KeyIndex::Clear() noexcept {
 }
 
 uint32_t KeyIndex::HashOf(std::span<const uint8_t> key) const noexcept {
-  return static_cast<uint32_t>(XXH3_64bits_withSeed(key.data(), key.size(), seed));
+  const platform::SeededHash hash{seed};
+  return static_cast<uint32_t>(hash({reinterpret_cast<const char*>(key.data()), key.size()}));
 }
 
 // The slot of the run with this key, or else the empty one where it would go.

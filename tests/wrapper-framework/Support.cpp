@@ -93,7 +93,7 @@ VRKResult CodeOf(const std::function<void()>& body) {
 std::set<VRKResult> ResultsOf(const std::string& failed, bool lasts, Hears hears) {
   if (failed.empty() || hears == Hears::kNothing) return {0};
   const VRKResult code = failed == "VRKMemoryAllocate" ? Varnel::kResultOutOfMemory : CallTrace::kFailure;
-  if (!CallTrace::GivesUp(failed) && hears == Hears::kAll) return {code};
+  if (!GivesUp(failed) && hears == Hears::kAll) return {code};
   std::set<VRKResult> results = {0};
   if (failed.ends_with("Release") || failed == "VRKMessageHandlerRemove" || hears == Hears::kSome) results.insert(code);
   if (lasts) results.insert({CallTrace::kLaterFailure, Varnel::kResultOutOfMemory});

@@ -13,6 +13,7 @@
 #include "FaultSweep.h"
 #include "MessageHandler.h"
 #include "ObjectFactory.h"
+#include "Operations.h"
 #include "ResultCodes.h"
 #include "Runtime.h"
 #include "VarnelKernelHost.h"
@@ -51,12 +52,6 @@ class CallTrace {
   // the ends of registrations: a kernel that goes on calling what is gone cannot be survived.
   void FailNext(std::string operation) { failNext = std::move(operation); }
   void Fail(Fault& newFault) { fault = &newFault; }
-
-  // Whether an operation ends a registration, or gives up what the caller has.
-  static bool EndsRegistration(const std::string& operation) { return operation.ends_with("Remove") || operation.ends_with("Unregister"); }
-  static bool GivesUp(const std::string& operation) {
-    return operation.ends_with("Release") || operation.ends_with("Deallocate") || EndsRegistration(operation);
-  }
 
   // The operation that was made to fail first, or empty.
   const std::string& Failed() const { return failed; }

@@ -7,6 +7,7 @@
 #include "Choices.h"
 #include "DataCoercion.h"
 #include "Messages.h"
+#include "Operations.h"
 #include "PlugInRun.h"
 #include "VRKStringTranslatorProtocol.h"
 
@@ -18,12 +19,6 @@ constexpr int kMostNesting = 3;
 constexpr size_t kMostObjects = 20;
 constexpr VRKResult kFailure = 4242;
 constexpr char kTypeWalk[] = "type:walk";
-
-// What makes a holder's destructor fail would keep alive what the holder was to give up.
-bool GivesUp(std::string_view operation) {
-  return operation.ends_with("Release") || operation.ends_with("Deallocate") ||
-         operation.ends_with("Remove") || operation.ends_with("Unregister");
-}
 
 class Interference {
  public:

@@ -31,5 +31,5 @@ class Definitions {
 
  private:
   std::vector<Definition> definitions;
-  std::unordered_map<std::string, size_t, tovali_private::SeededHash> places;
+  std::unordered_map<std::string, size_t, platform::SeededHash> places;
 };

@@ -76,7 +76,7 @@ void SortByPlace(std::vector<Finding>& findings) {
 
 // What keeps a file, or a part of it, from being read for what it is.
 bool IsUnread(const Finding& finding) {
-  if (finding.rule == &rules::kMalformedInput) return finding.place.line == 0;
+  if (finding.rule == &rules::kMalformedInput) return finding.place.line == 0;  // of all of it
   constexpr const Rule* kRules[] = {&rules::kTooShort, &rules::kUTF16WithoutMark,
                                     &rules::kTruncatedImage, &rules::kDamagedImage,
                                     &rules::kUnsupportedVersion};

@@ -164,7 +164,7 @@ class ImageCheck {
   StoredImage image;
   LoadStatus status;
   Definitions definitions;
-  std::unordered_map<std::string, const StoredGroup*, tovali_private::SeededHash> definingGroups;
+  std::unordered_map<std::string, const StoredGroup*, platform::SeededHash> definingGroups;
   size_t number = 0;
 };
 

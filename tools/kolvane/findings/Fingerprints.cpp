@@ -30,7 +30,7 @@ std::string Identity(const Finding& finding) {
 
 std::vector<std::string> Fingerprints(std::span<const Finding> findings) {
   std::vector<std::string> fingerprints;
-  std::unordered_map<std::string, size_t, tovali_private::SeededHash> counts;
+  std::unordered_map<std::string, size_t, platform::SeededHash> counts;
   for (const Finding& finding : findings) {
     const std::string identity = Identity(finding);
     const size_t before = counts[identity]++;

@@ -1,4 +1,4 @@
-#include "ProcessSeed.h"
+#include "SeededHash.h"
 
 #include <chrono>
 #include <exception>
