@@ -1,5 +1,8 @@
 #include "SeededHash.h"
 
+#define XXH_INLINE_ALL
+#include <xxhash.h>
+
 #include <chrono>
 #include <exception>
 #include <random>
@@ -23,6 +26,10 @@ uint64_t RandomSeed() noexcept {
 uint64_t ProcessSeed() noexcept {
   static const uint64_t seed = RandomSeed();
   return seed;
+}
+
+size_t SeededHash::operator()(std::string_view text) const noexcept {
+  return static_cast<size_t>(XXH3_64bits_withSeed(text.data(), text.size(), seed));
 }
 
 }  // namespace platform

@@ -2,9 +2,6 @@
 // same in all of them, texts that collide are easy to make.
 #pragma once
 
-#define XXH_INLINE_ALL
-#include <xxhash.h>
-
 #include <cstddef>
 #include <cstdint>
 #include <string_view>
@@ -19,9 +16,7 @@ uint64_t ProcessSeed() noexcept;
 struct SeededHash {
   using is_avalanching = void;
 
-  size_t operator()(std::string_view text) const noexcept {
-    return static_cast<size_t>(XXH3_64bits_withSeed(text.data(), text.size(), seed));
-  }
+  size_t operator()(std::string_view text) const noexcept;
 
   uint64_t seed = ProcessSeed();
 };
