@@ -187,6 +187,14 @@ TEST_F(DataTest, BecomesTheFirstTypeThatTheKernelKnowsAWayTo) {
   EXPECT_EQ(calls, expected);
 }
 
+TEST_F(DataTest, IsHeldUntilAllOfItIsConverted) {
+  for (const DataRef& source : {Wrapped(List({Text("x")})), Wrapped(Dictionary({{"key", Text("x")}}))}) {
+    CallTrace trace;
+    AsValue(source);
+    EXPECT_EQ(trace.Take().back(), Call("VRKDataRelease", source.Get()));
+  }
+}
+
 // What hosts have for their threads by default, or less.
 void RunOnSmallStack(std::function<void()> body) {
   pthread_attr_t attributes;

@@ -289,10 +289,21 @@ TEST(Load, KeepsLittleMemoryOfWhatItReplaced) {
   EXPECT_EQ(meter.LiveBlocks(), 0);
 }
 
+TEST(Load, KeepsABinaryImageOnlyUntilItsEntriesAreMade) {
+  const std::string image = Image1_5(0, Grouped({{"/a", std::string(1 << 20, 'x')}}));
+  const AllocationMeter meter;
+  DictionaryTable table;
+  for (int round = 1; round <= 3; ++round) {
+    Load(table, image);
+    Translated(table, "$$$/a=none");
+    EXPECT_LT(meter.LiveBytes(), round * (5 << 18));
+  }
+}
+
 // Entries that hide others or lie in a wrong bucket, before a load that has all move.
 TEST(Load, MovesEntriesAsFarAsThereIsMemory) {
   const std::string binary =
-      Image1_5(0, {{580, {{"/a", Bytes(u"1")}, {"/a", Bytes(u"2")}, {"/b", Bytes(u"3")}, {"/a", ""}, {"/a", Bytes(u"5")}}}});
+      Image1_5(0, {{580, {{"/a", Bytes(u"1")}, {"/a", Bytes(u"2")}, {"/b", Bytes(u"3")}, {"/a", ""}, {"/a", Bytes(u"5") + '!'}}}});
   std::string text = "\"$$$/a=6\"\n";
   for (int i = 0; i < 20; ++i) text += "\"$$$/k=" + std::string(4000, static_cast<char>('a' + i)) + "\"\n";
   SlowTwin twin;
@@ -317,6 +328,7 @@ TEST(Load, MovesEntriesAsFarAsThereIsMemory) {
       const auto detached = table.Detach(Key("/a"));
       ASSERT_NE(detached, nullptr);
       ASSERT_EQ(Text(detached->Value()), value);
+      ASSERT_EQ(detached->Value().ByteLength() % 2, *value == u'5' ? 1u : 0u);
     }
     uint16_t units[2];
     kept.CopyTo(units, 2, true);
