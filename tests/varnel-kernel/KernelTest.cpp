@@ -6,6 +6,8 @@
 #include <string>
 #include <vector>
 
+#include "AllocationMeter.h"
+#include "Runtime.h"
 #include "SharedLibrary.h"
 #include "VarnelKernelHost.h"
 
@@ -108,6 +110,25 @@ TEST_F(Kernel, CoercesTextEveryWay) {
     VRKDataRelease(coerced);
     VRKDataRelease(source);
   }
+}
+
+// Tokens count up, so that one without a text is known.
+TEST_F(Kernel, KeepsNoTextThatGotNoToken) {
+  auto next = static_cast<uint32_t>(Token("text:0"));
+  uint32_t failures = 0;
+  for (int i = 1; i < 200; ++i) {
+    const std::string text = "text:" + std::to_string(i);
+    VRKToken token{};
+    ++next;
+    for (size_t fault = 1; token == VRKToken{}; ++fault) {
+      const AllocationMeter meter(fault);
+      if (VRKTokenCreate(text.c_str(), 0, &token) == 0) continue;
+      EXPECT_EQ(VRKTokenGetString(VRKToken{next}), nullptr);
+      ++failures;
+    }
+    EXPECT_EQ(token, VRKToken{next});
+  }
+  EXPECT_EQ(failures > 3, kLibrariesShareRuntime);
 }
 
 TEST_F(Kernel, TracesCallsWithTheirArguments) {
