@@ -138,6 +138,8 @@ class Check(CommandTest):
             start = re.escape("::" + start.format("a%2Cb%25.txt")).replace(r"\#", r"\d+")
             self.assertRegex(line, f"^{start}([^%]|%25|%0A)+$")
         self.assertRegex(lines[0], r"%0Aa,b%25\.txt:1:\d+: note: ")
+        same = self.file('"$$$/a=same words"\n', "same")
+        self.assertRegex(self.check("--format=github", "--info", "--reference", same, same)[1], "^::notice file=same,line=1,")
 
     def test_baseline_silences_exactly(self):
         name = self.file(DROPPED + TWICE + ESCAPE)
