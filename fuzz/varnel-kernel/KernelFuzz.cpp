@@ -489,9 +489,14 @@ class Walk : private CheckedCalls {
         {3, &Walk::ReleaseAny},       {1, &Walk::AllocateMemory}, {1, &Walk::DeallocateMemory},
         {1, &Walk::ReportError},      {1, &Walk::SetAnyHook},     {1, &Walk::SetAnyReporter},
         {1, &Walk::GetCounts}};
+    static constexpr uint32_t kWeights = [] {
+      uint32_t sum = 0;
+      for (const auto& step : kSteps) sum += step.first;
+      return sum;
+    }();
     const bool mayBeAny = model.isRunning || OneIn(4);
     if (kLibrariesShareRuntime && OneIn(8)) failAt = 1 + Below(6);
-    uint32_t passed = mayBeAny ? Below(42) : 0;
+    uint32_t passed = mayBeAny ? Below(kWeights) : 0;
     const auto* step = kSteps;
     while (passed >= step->first) passed -= (step++)->first;
     (this->*step->second)();
