@@ -66,6 +66,8 @@ length of the answers is.
 * **Peak memory** is in bytes an entry, on top of what the process took before. The image that Kolvane
   loads is the host's and is not counted; the files that others map are.
 * Subjects take turns round by round, and the fastest round of each counts: {rounds} rounds at least.
+* 100,000 keys and their translations are about what the last cache holds. Where other machines share it,
+  figures there differ by up to a factor of two from one set or run to the next.
 """
 
 
