@@ -41,14 +41,9 @@ struct MessageHandler::RunningCall {
     return outermost;
   }
 
-  void Forget() noexcept {
-    handler = nullptr;
-    deletesHandler = false;
-  }
-
   static inline RunningCall* innermost = nullptr;
 
-  MessageHandler* handler;
+  MessageHandler* handler;  // null once it is gone
   RunningCall* outer;
   bool deletesHandler = false;
 };
@@ -61,7 +56,9 @@ MessageHandler::MessageHandler(VRKObject attachTo, bool deletesItself)
 
 MessageHandler::~MessageHandler() {
   const Farewell farewell(this);
-  while (RunningCall* const call = RunningCall::OutermostOf(this)) call->Forget();
+  while (RunningCall* const call = RunningCall::OutermostOf(this)) {
+    call->handler = nullptr;
+  }
   if (registration != VRKMessageHandler{}) VRKMessageHandlerRemove(registration, object);
 }
 

@@ -182,6 +182,18 @@ TEST_F(MessagingTest, CreationIsUpToTheCreator) {
   EXPECT_EQ(CodeOf([] { NewObject(); }), 77u);
 }
 
+TEST_F(MessagingTest, FactoriesMayGoWhileParametersAreConverted) {
+  const orvane::name_t name("class:test");
+  auto other = std::make_unique<StringTranslatorFactory>([this](auto&) { return translator; }, name);
+  Coercion coercion([&](auto&&...) { return other.reset(), false; });
+  coercion.Install(MakeToken(kTypeUTF8), MakeToken(kTypeDouble));
+  ObjectRef object;
+  object.Create(MakeToken(name), With("parameter:test", DataOf(kTypeUTF8, "x")).Get());
+  EXPECT_EQ(other, nullptr);
+  EXPECT_EQ(Send(object.Get(), kMessageMakeDefault), 0u);
+  EXPECT_EQ(translator->heard, "default");
+}
+
 TEST(TranslationImage, HoldsEveryByte) {
   const Units expected[] = {{}, {0x0001}, {0x0201}, {0x0201, 0x00FF}, {0x0201, 0x04FF}, {0x0201, 0x04FF, 0x0005}};
   for (uint32_t count = 0; count < std::size(expected); ++count) {
