@@ -131,6 +131,19 @@ TEST_F(Kernel, KeepsNoTextThatGotNoToken) {
   EXPECT_EQ(failures > 3, kLibrariesShareRuntime);
 }
 
+TEST_F(Kernel, RunsOutOfHandlesAndHasThemAgain) {
+  const VRKToken type = Token("type:test");
+  for (int round = 0; round < 2; ++round) {
+    std::vector<VRKData> live(1);
+    VRKResult result = 0;
+    while ((result = VRKDataCreate(type, "", 0, 0, &live.back())) == 0) live.emplace_back();
+    live.pop_back();
+    EXPECT_EQ(result, VRKResult{kVRKOutOfMemory});
+    EXPECT_GE(live.size(), 4'194'303u - 1024);
+    for (const VRKData each : live) ASSERT_EQ(VRKDataRelease(each), 0u);
+  }
+}
+
 TEST_F(Kernel, TracesCallsWithTheirArguments) {
   std::vector<std::string> calls;
   OnTrace hook = [&](const VRKHostTraceCall& call) {
