@@ -13,15 +13,21 @@
 //   small (what it then holds is not defined), kErrorInvalidParameter when a rule above is broken
 //   or the size does not fit an int.
 //
-// Damaged text never fails. In UTF-8 one U+FFFD stands for a byte that begins nothing; for a lead
-// byte with the bytes after it, as far as they could continue it (E2 82 in E2 82 41), and with a
-// second byte of 80 to BF that does not fit it (E0 80, ED A0; what follows is on its own); and for
-// a lead byte with all that is left of the text, where that is too little for it. An unpaired
-// surrogate becomes EF BF BD in UTF-8. The bytes 81, 8D, 8F, 90 and 9D of windows-1252, which it
-// leaves undefined, stand for the C1 control of their value.
+// Ill-formed text never fails. In UTF-8 one U+FFFD replaces each of these:
 //
-// One thing is the system's own: a unit that windows-1252 lacks becomes '?', but on Windows, for
-// some, a look-alike, such as A for U+0100.
+// * a byte that cannot begin a sequence;
+// * a lead byte with the bytes after it that could continue it (E2 82 in E2 82 41);
+// * a lead byte with a second byte of 80 to BF that it forbids (E0 80, and ED A0 in ED A0 80).
+//
+// Every well-formed sequence is converted. An unpaired surrogate becomes EF BF BD in UTF-8. The
+// bytes 81, 8D, 8F, 90 and 9D of windows-1252, which it leaves undefined, stand for the C1 control
+// of their value.
+//
+// Windows differs in two things:
+//
+// * A lead byte with too few bytes left in the text is replaced together with all of them, even if
+//   they are well-formed: E9 74 is one U+FFFD there, and U+FFFD 't' elsewhere.
+// * A unit that windows-1252 lacks becomes '?', but for some a look-alike, such as A for U+0100.
 //
 // Nothing here allocates or throws.
 #pragma once

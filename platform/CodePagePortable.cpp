@@ -117,9 +117,8 @@ constexpr bool Continues(uint8_t byte) noexcept {
   return byte >= 0x80 && byte < 0xC0;
 }
 
-// A well-formed sequence, or what one replacement character stands for: the longest start of one,
-// with a second byte that does not fit its lead byte, as in what is too long or a surrogate; or all
-// that is left, where that is too little for the lead byte.
+// A well-formed sequence, or the bytes that one replacement character stands for: the longest start
+// of a sequence, plus a second byte of 80 to BF that the lead byte forbids.
 struct Sequence {
   char32_t character;
   size_t length;
@@ -129,9 +128,9 @@ Sequence ReadSequence(const char* text, size_t left) noexcept {
   const auto first = static_cast<uint8_t>(text[0]);
   const Lead lead = LeadFor(first);
   if (lead.following == 0) return {kReplacementCharacter, 1};
-  if (left <= lead.following) return {kReplacementCharacter, left};
   char32_t character = first & (0x3Fu >> lead.following);
   for (size_t i = 1; i <= lead.following; ++i) {
+    if (i == left) return {kReplacementCharacter, i};
     const auto byte = static_cast<uint8_t>(text[i]);
     if (!Continues(byte)) return {kReplacementCharacter, i};
     if (i == 1 && (byte < lead.low || byte > lead.high)) return {kReplacementCharacter, 2};

@@ -1,11 +1,12 @@
-// Any bytes and any units, converted as ICU converts them: what ICU does otherwise is made the same
-// here.
+// Any bytes and any units, converted as ICU converts them. ICU tells the characters of ill-formed
+// UTF-8, too, and which bytes between them belong together; it gets the text as it is.
 #include <unicode/ucnv.h>
 #include <unicode/unistr.h>
+#include <unicode/utf8.h>
 
 #include <algorithm>
+#include <cstdint>
 #include <memory>
-#include <regex>
 #include <vector>
 
 #include "CodePage.h"
@@ -16,25 +17,26 @@ namespace {
 using platform::kCodePageSystem;
 using platform::kCodePageUTF8;
 
-// What counts as one here and as several with ICU: a lead byte with a second one that does not fit
-// it, and a lead byte with all that is left where that is too little.
-std::string WithMisfitsAsOne(const std::string& text) {
-  static const std::regex misfits(
-      "\xE0[\x80-\x9F]|\xED[\xA0-\xBF]|\xF0[\x80-\x8F]|\xF4[\x90-\xBF]");
-  std::string whole = text;
-  for (size_t at = text.size() - std::min<size_t>(text.size(), 3); at < text.size(); ++at) {
-    const auto byte = static_cast<unsigned char>(text[at]);
-    const size_t length = byte < 0xC2 || byte > 0xF4 ? 1 : byte < 0xE0 ? 2 : byte < 0xF0 ? 3 : 4;
-    if (text.size() - at >= length) continue;
-    whole.resize(at);
-    whole += '\xFF';
-    break;
-  }
-  return std::regex_replace(whole, misfits, "\xFF");
+bool IsLead(uint8_t byte) {
+  return byte >= 0xC2 && byte <= 0xF4;
 }
 
+// ICU replaces a lead byte and a second byte that it forbids (ED A0) one by one, the platform
+// replaces both together: after a replaced lead byte alone, a byte of 80 to BF adds nothing.
 std::u16string ICUDecodedUTF8(const std::string& text) {
-  const auto decoded = icu::UnicodeString::fromUTF8(WithMisfitsAsOne(text));
+  const auto* const bytes = reinterpret_cast<const uint8_t*>(text.data());
+  const auto length = static_cast<int32_t>(text.size());
+  icu::UnicodeString decoded;
+  bool isAfterLead = false;
+  for (int32_t at = 0; at < length;) {
+    const int32_t start = at;
+    UChar32 character = 0;
+    U8_NEXT(bytes, at, length, character);
+    const bool isOneByte = character < 0 && at - start == 1;
+    const bool isForbidden = isAfterLead && isOneByte && U8_IS_TRAIL(bytes[start]);
+    if (!isForbidden) decoded.append(character < 0 ? UChar32{0xFFFD} : character);
+    isAfterLead = isOneByte && IsLead(bytes[start]);
+  }
   return {decoded.getBuffer(), static_cast<size_t>(decoded.length())};
 }
 

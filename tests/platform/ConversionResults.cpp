@@ -1,5 +1,6 @@
 #include "ConversionResults.h"
 
+#include <algorithm>
 #include <cstdint>
 #include <random>
 
@@ -81,19 +82,32 @@ std::string Encoded(uint32_t codePage, const Units& units) {
   return Encoded(codePage, units, size);
 }
 
-// Sound text after what is malformed, or too little of it.
+// Whether the text ends within the length that a lead byte announces.
+bool IsTruncated(const std::string& text) {
+  for (size_t after = 0; after < std::min<size_t>(text.size(), 3); ++after) {
+    const auto byte = static_cast<uint8_t>(text[text.size() - 1 - after]);
+    const size_t announced = byte < 0xC2 || byte > 0xF4 ? 0 : byte < 0xE0 ? 1 : byte < 0xF0 ? 2 : 3;
+    if (announced > after) return true;
+  }
+  return false;
+}
+
+// Hashes take only texts that are not truncated.
 void AddMalformed(Report& report) {
   for (const std::string& malformed : kMalformed) {
     for (const std::string& before : kSound) {
       for (const std::string& after : kSound) {
         const std::string text = before + malformed + after;
-        report.Add("utf-8 " + Report::Hex(text), Decoded(kCodePageUTF8, text));
+        report.Add((IsTruncated(text) ? "truncated " : "utf-8 ") + Report::Hex(text), Decoded(kCodePageUTF8, text));
       }
     }
   }
   for (const std::string& first : kMalformed) {
     for (const std::string& second : kMalformed) {
-      for (const char* const end : {"", "e", "en", "end"}) report.Hash(Decoded(kCodePageUTF8, "a" + first + second + end));
+      for (const char* const end : {"", "e", "en", "end"}) {
+        const std::string text = "a" + first + second + end;
+        if (!IsTruncated(text)) report.Hash(Decoded(kCodePageUTF8, text));
+      }
     }
     report.AddHash("utf-8 " + Report::Hex(first) + " and another");
   }
@@ -146,7 +160,7 @@ void AddRandom(Report& report) {
       const uint32_t plain = block % 2 == 0 ? 8 : 2;
       for (char& each : bytes) each = edges[random() % plain == 0 ? random() % edges.size() : 0];
       for (uint16_t& each : units) each = static_cast<uint16_t>(random() % 4 == 0 ? 0xD7F0 + random() % 0x820 : random() % 0x10000);
-      report.Hash(Decoded(kCodePageUTF8, bytes));
+      report.Hash(Decoded(kCodePageUTF8, bytes + "end"));
       report.Hash(Decoded(kCodePageSystem, bytes));
       report.Hash(Encoded(kCodePageUTF8, units));
       report.Hash(Encoded(kCodePageSystem, Decoded(kCodePageSystem, bytes)));

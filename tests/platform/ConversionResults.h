@@ -5,6 +5,7 @@
 #include <vector>
 
 // A line for each case: its name, " = ", and the result in hexadecimal digits; or a name, " # " and a hash
-// of many results. The same on every system, but for the lines that begin with "look-alike": what the
-// system picks for a character that its code page lacks.
+// of many results. The same on every system, except for lines that begin with
+// * "truncated": UTF-8 that ends in too few bytes for a lead byte, all of which Windows replaces;
+// * "look-alike": a character that the code page lacks, and what Windows picks for it.
 std::vector<std::string> ConversionResults();
