@@ -11,6 +11,7 @@
 #include "DictionaryTable.h"
 #include "LittleEndian.h"
 #include "StoredGroups.h"
+#include "StreamSize.h"
 
 namespace tovali_private {
 namespace {
@@ -25,12 +26,7 @@ constexpr size_t kLengthSize = 4;
 // An image's stream, with what is left of it known beforehand.
 class ImageSource {
  public:
-  explicit ImageSource(std::istream& image) : stream(image) {
-    stream.seekg(0, std::ios::end);
-    const std::streamoff end = stream.tellg();
-    stream.seekg(0);
-    if (stream && end > 0) left = static_cast<uint64_t>(end);
-  }
+  explicit ImageSource(std::istream& image) : stream(image), left(StreamSize(image)) {}
 
   // Reads exactly `count` bytes, or fails before it allocates any.
   bool Read(Bytes& bytes, uint64_t count) {
@@ -77,7 +73,7 @@ class ImageSource {
 
   std::istream& stream;
   uint64_t position = 0;
-  uint64_t left = 0;
+  uint64_t left;
 };
 
 // What else stands before the entry data of a version 1.5 body, as it stands there.

@@ -7,6 +7,7 @@
 #include "BinaryLoader.h"
 #include "DictionaryReader.h"
 #include "DictionaryTable.h"
+#include "StreamSize.h"
 #include "TextSyntax.h"
 
 using tovali_private::DictionaryReader;
@@ -14,6 +15,13 @@ using tovali_private::DictionaryReader;
 namespace {
 
 using tovali_private::kBinaryMagic;
+using tovali_private::SkipToEnd;
+using tovali_private::StreamSize;
+
+// Whether anything other than its end ended the reading of the stream.
+bool HasFailed(const std::istream& image) {
+  return image.bad() || (image.fail() && !image.eof());
+}
 
 enum class Recognised { kTooShort, kText, kBinary };
 
@@ -27,29 +35,20 @@ Recognised Recognise(std::istream& image) {
   return isBinary ? Recognised::kBinary : Recognised::kText;
 }
 
-// Leaves the stream at its start.
-uint64_t SizeOf(std::istream& image) {
-  image.seekg(0, std::ios::end);
-  const std::streamoff end = image.tellg();
-  image.seekg(0);
-  return end > 0 ? static_cast<uint64_t>(end) : 0;
-}
-
 // Whether a text image, whose last line has been read, ended there and ended well.
 void CheckTextEnd(std::istream& image, TextEncoding encoding, LoadStatus& status) {
-  if (image.bad()) return;  // and leaves the load interrupted
-  const std::streamoff unitSize = encoding == TextEncoding::kCodePage ? 1 : 2;
-  const std::streamoff stop = image.good() ? std::streamoff{image.tellg()} : 0;
-  image.clear();
-  image.seekg(0, std::ios::end);
-  const std::streamoff end = image.tellg();
+  if (HasFailed(image)) return;  // the load stays interrupted
+  const uint64_t unitSize = encoding == TextEncoding::kCodePage ? 1 : 2;
+  const uint64_t left = image.good() ? SkipToEnd(image) : 0;
+  const uint64_t size = StreamSize(image);
+  if (image.bad()) return;
   status.damage = LoadDamage::kNone;
-  if (stop != 0 && stop < end) {
+  if (left != 0) {
     status.damage = LoadDamage::kZeroCharacter;
-    status.damageOffset = static_cast<uint64_t>(stop - unitSize);
-  } else if (end % unitSize != 0) {
+    status.damageOffset = size - left - unitSize;
+  } else if (size % unitSize != 0) {
     status.damage = LoadDamage::kHalfUnit;
-    status.damageOffset = static_cast<uint64_t>(end - 1);
+    status.damageOffset = size - 1;
   }
 }
 
@@ -74,7 +73,7 @@ void DictionaryTable::Load(std::istream& image) {
   const auto reader = DictionaryReader::Create(&image);
   switch (Recognise(image)) {
     case Recognised::kTooShort:
-      lastLoad.damage = LoadDamage::kTooShort;
+      if (!HasFailed(image)) lastLoad.damage = LoadDamage::kTooShort;
       break;
     case Recognised::kText: {
       const MoveAtEnd moving(*this);
@@ -83,6 +82,7 @@ void DictionaryTable::Load(std::istream& image) {
     }
     case Recognised::kBinary:
       tovali_private::LoadBinary(*this, image, lastLoad);
+      if (HasFailed(image)) lastLoad.damage = LoadDamage::kInterrupted;
       break;
   }
 }
@@ -90,8 +90,7 @@ void DictionaryTable::Load(std::istream& image) {
 void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
   lastLoad.format = ImageFormat::kText;
   lastLoad.encoding = reader.Encoding();
-  const uint64_t size = SizeOf(image);
-  memory.Expect(size);
+  memory.Expect(StreamSize(image));
   while (const uint16_t* line = reader.GetNextLine()) {
     if (line[0] == 0) continue;
     switch (StoreLine({line, reader.LineLength()})) {

@@ -41,10 +41,10 @@ class DictionaryTable {
   // If this table is the default dictionary, there is none afterwards.
   ~DictionaryTable();
 
-  // Adds the entries of one image, text or binary, to those the table holds. The stream stands at
-  // its start and can seek. Damage is not reported but by LastLoad; time and memory are linear in
-  // the image's size. Throws OVErrException when a conversion fails and std::bad_alloc; what was
-  // stored before stays.
+  // Adds the entries of one image, text or binary, to those the table holds. Requires: the stream
+  // is at its start and can seek back there. Damage is not reported but by LastLoad; time and
+  // memory are linear in the image's size. Throws OVErrException when a conversion fails and
+  // std::bad_alloc; what was stored before stays.
   void Load(std::istream& image);
 
   // How the latest load went, one that threw included; valid until the next one. To know it all, it

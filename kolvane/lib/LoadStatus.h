@@ -49,7 +49,8 @@ struct LoadStatus {
                                           // or else of its keys
 
   // Where that was, in bytes from the image's start: the field that is wrong or cut short; for a
-  // binary image that was interrupted, the entry. 0 where there is no such place.
+  // binary image that was interrupted, the entry, or the field that the stream failed to give. 0
+  // where there is no such place.
   uint64_t damageOffset = 0;
 
   // Whether the image is what it claims to be. A dropped line is no damage, nor is what follows the

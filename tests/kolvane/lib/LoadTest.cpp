@@ -8,6 +8,8 @@
 #include <optional>
 #include <random>
 #include <sstream>
+#include <stdexcept>
+#include <streambuf>
 
 #include "Converters.h"
 #include "DictionaryReader.h"
@@ -336,28 +338,83 @@ TEST(Load, MovesEntriesAsFarAsThereIsMemory) {
   });
 }
 
-// Streams that hold all, a little, or nothing of what they read in memory.
+// Seeks to its end only if it may, and fails behind its first bytes.
+class PickyBuffer : public std::streambuf {
+ public:
+  PickyBuffer(std::string& image, size_t readable, bool mayFindEnd) : size(image.size()), findsEnd(mayFindEnd) {
+    setg(image.data(), image.data(), image.data() + readable);
+  }
+
+ protected:
+  int_type underflow() override {
+    if (egptr() < eback() + size) throw std::runtime_error("unreadable");
+    return traits_type::eof();
+  }
+  pos_type seekoff(off_type offset, std::ios::seekdir from, std::ios::openmode) override {
+    if (!findsEnd || offset != 0 || from == std::ios::beg) return off_type(-1);
+    isAtEnd |= from == std::ios::end;
+    return isAtEnd ? static_cast<off_type>(size) : gptr() - eback();
+  }
+  pos_type seekpos(pos_type to, std::ios::openmode) override {
+    setg(eback(), eback() + off_type(to), egptr());
+    isAtEnd = false;
+    return to;
+  }
+
+ private:
+  size_t size;
+  bool findsEnd;
+  bool isAtEnd = false;
+};
+
+void ExpectSameLoad(DictionaryTable& expected, std::istream& stream) {
+  DictionaryTable table;
+  table.Load(stream);
+  EXPECT_EQ(ContentsOf(table), ContentsOf(expected));
+  EXPECT_EQ(table.LastLoad().format, expected.LastLoad().format);
+  EXPECT_EQ(table.LastLoad().damage, expected.LastLoad().damage);
+  EXPECT_EQ(table.LastLoad().damageOffset, expected.LastLoad().damageOffset);
+}
+
+// Streams that hold all, a little, or nothing of what they read in memory, and that seek only to positions.
 TEST(Load, ReadsEveryKindOfStream) {
+  using namespace std::string_literals;
   const std::string path = testing::TempDir() + "kolvane-image" + std::to_string(std::random_device()());
   std::vector<std::string> images = ValidImages();
   for (size_t i = 0; i < 3; ++i) images.push_back(images[i] + images[i].substr(2) + images[i].substr(1));  // shifted by a byte
-  for (const std::string& image : images) {
+  for (const std::string& end : {"\n\0\0x"s, "\n\0\0"s, "x"s}) images.push_back(images[1] + end);
+  for (std::string& image : images) {
+    SCOPED_TRACE(&image - images.data());
     std::ofstream(path, std::ios::binary) << image;
     DictionaryTable expected;
     Load(expected, image);
     for (const std::streamsize held : {0, 1, 7, 8, 4096}) {
+      SCOPED_TRACE(held);
       std::vector<char> memory(static_cast<size_t>(held));
       std::ifstream stream;
       stream.rdbuf()->pubsetbuf(held != 0 ? memory.data() : nullptr, held);
       stream.open(path, std::ios::binary);
-      DictionaryTable table;
-      table.Load(stream);
-      ASSERT_EQ(ContentsOf(table), ContentsOf(expected)) << held;
-      ASSERT_EQ(table.LastLoad().damage, expected.LastLoad().damage) << held;
-      ASSERT_EQ(table.LastLoad().damageOffset, expected.LastLoad().damageOffset) << held;
+      ExpectSameLoad(expected, stream);
     }
+    PickyBuffer buffer(image, image.size(), false);
+    std::istream stream(&buffer);
+    ExpectSameLoad(expected, stream);
   }
   std::remove(path.c_str());
+}
+
+TEST(Load, TellsThatAStreamFailed) {
+  for (std::string& image : ValidImages()) {
+    for (size_t readable = 0; readable < image.size(); ++readable) {
+      for (const bool findsEnd : {false, true}) {
+        PickyBuffer buffer(image, readable, findsEnd);
+        std::istream stream(&buffer);
+        DictionaryTable table;
+        table.Load(stream);
+        ASSERT_EQ(table.LastLoad().damage, LoadDamage::kInterrupted) << readable << " of " << image.size() << ' ' << findsEnd;
+      }
+    }
+  }
 }
 
 }  // namespace
