@@ -128,10 +128,10 @@ bool BinaryParser::Parse() {
   const uint8_t* const fields = header.data() + kBinaryMagic.size();
   const int major = static_cast<int8_t>(fields[0]);
   const int minor = static_cast<int8_t>(fields[1]);
-  const int valueEncoding = static_cast<int8_t>(fields[2]);
-  status.encoding = valueEncoding == 0               ? TextEncoding::kUTF16LE
-                    : valueEncoding == kUTF8Selector ? TextEncoding::kUTF8
-                                                     : TextEncoding::kCodePage;
+  stored.valueSelector = static_cast<int8_t>(fields[2]);
+  status.encoding = stored.valueSelector == 0               ? TextEncoding::kUTF16LE
+                    : stored.valueSelector == kUTF8Selector ? TextEncoding::kUTF8
+                                                            : TextEncoding::kCodePage;
   if (major == 1 && minor == 5) return ParseBody1_5();
   if (major == 1 && minor == 0) return ParseBody1_0();
   return Stop(LoadDamage::kUnsupportedVersion, kBinaryMagic.size());
@@ -286,7 +286,6 @@ bool BinaryParser::Stop(LoadDamage met, uint64_t offset) {
 // first entry stands that belongs to another bucket.
 void ConvertValues(const StoredImage& stored, StoredImage& converted, LoadStatus& status,
                    std::optional<uint64_t>& misfiled) {
-  const int* const selector = SelectorFor(status.encoding);
   UnicodeBuffer units;
   const StoredGroup* current = nullptr;
   converted.keysChecked = true;
@@ -294,7 +293,7 @@ void ConvertValues(const StoredImage& stored, StoredImage& converted, LoadStatus
     if (std::exchange(current, &group) != &group) converted.BeginGroup(group.bucket);
     status.damageOffset = entry.offset;  // should it interrupt the load
     ConvertToUnicode(reinterpret_cast<const char*>(entry.value.data()), entry.value.size(), units,
-                     selector);
+                     &stored.valueSelector);
     converted.Append(entry.key,
                      {reinterpret_cast<const uint8_t*>(units.Data()), size_t{units.Length()} * 2});
     const bool canBeFound = entry.Key().Hash(DictionaryTable::kBucketCount) == group.bucket;

@@ -68,6 +68,7 @@ struct StoredImage {
   Bytes lengths;  // 32 bits for the key of each entry, and for its value
   Bytes data;     // the key of each entry, and its value
   std::vector<StoredGroup> groups;
+  int valueSelector = 0;     // the encoding byte: 0 for UTF-16, else a selector (Converters.h)
   uint64_t load = 0;         // the number of the load that brought it
   bool keysChecked = false;  // whether they were found to belong to their buckets or not
 

@@ -184,6 +184,33 @@ TEST(Load, EndsWhereAConversionFails) {
   }
 }
 
+constexpr int kNoSelector = 1 << 20;
+std::vector<int> gSelectors;
+
+uint32_t CountNotingSelector(const char* text, int byteCount, int* unitCount, const int* selector) noexcept {
+  gSelectors.push_back(selector != nullptr ? *selector : kNoSelector);
+  return MultiByteToUnicodeLength(text, byteCount, unitCount, selector);
+}
+uint32_t ConvertNotingSelector(const char* text, int byteCount, uint16_t* units, int capacity, const int* selector) noexcept {
+  gSelectors.push_back(selector != nullptr ? *selector : kNoSelector);
+  return MultiByteToUnicode(text, byteCount, units, capacity, selector);
+}
+
+TEST(Load, ConvertsValuesByTheEncodingByte) {
+  const ConverterTable working = gConverterTable;
+  gConverterTable.multiByteToUnicodeLength = CountNotingSelector;
+  gConverterTable.multiByteToUnicode = ConvertNotingSelector;
+  for (const auto& image : {Image1_5, Image1_0}) {
+    for (const int encoding : {1, 2, 0x7F, -0x80, -1}) {
+      DictionaryTable table;
+      gSelectors.clear();
+      Load(table, image(encoding, {{580, {{"/a", "x"}}}}));
+      EXPECT_EQ(gSelectors, std::vector<int>(2, encoding));
+    }
+  }
+  gConverterTable = working;
+}
+
 TEST(Load, PutsOffWhatNobodyAskedFor) {
   const std::string binary = Image1_5(0, {{580, {{"/a", Bytes(u"x")}, {"/a", Bytes(u"y")}}}});
   DictionaryTable defaults, other;
