@@ -48,6 +48,35 @@ static_assert(std::size(kNamedCharacters) == 132);
 constexpr size_t kShortestName = 2;
 constexpr size_t kLongestName = 6;
 
+// The places of all names in the table by their first letter, which is ASCII, and for each letter
+// where its places begin; they end where those of the next letter begin.
+struct LetterIndex {
+  uint8_t places[std::size(kNamedCharacters)];
+  uint8_t begins[0x80 + 1];
+};
+
+constexpr LetterIndex kLetterIndex = [] {
+  LetterIndex index{};
+  uint8_t count = 0;
+  for (size_t letter = 0; letter < 0x80; ++letter) {
+    index.begins[letter] = count;
+    for (size_t place = 0; place < std::size(kNamedCharacters); ++place) {
+      if (kNamedCharacters[place].name[0] != static_cast<char>(letter)) continue;
+      index.places[count++] = static_cast<uint8_t>(place);
+    }
+  }
+  index.begins[0x80] = count;
+  return index;
+}();
+
+static_assert(kLetterIndex.begins[0x80] == std::size(kNamedCharacters));
+
+std::span<const uint8_t> PlacesOf(uint16_t letter) noexcept {
+  if (letter >= 0x80) return {};
+  const uint8_t* const places = kLetterIndex.places;
+  return {places + kLetterIndex.begins[letter], places + kLetterIndex.begins[letter + 1]};
+}
+
 }  // namespace
 
 std::span<const NamedCharacter> NamedCharacters() noexcept {
@@ -59,7 +88,8 @@ const NamedCharacter* MatchNamedCharacter(std::span<const uint16_t> text) noexce
   const auto name = text.subspan(2, std::min(text.size() - 2, kLongestName + 1));
   const auto brace = std::find(name.begin(), name.end(), '}');
   if (brace == name.end()) return nullptr;
-  for (const NamedCharacter& named : kNamedCharacters) {
+  for (const uint8_t place : PlacesOf(name[0])) {
+    const NamedCharacter& named = kNamedCharacters[place];
     if (std::equal(name.begin(), brace, named.name.begin(), named.name.end())) return &named;
   }
   return nullptr;

@@ -20,7 +20,8 @@ struct NamedCharacter {
   size_t WrittenLength() const noexcept { return name.size() + 3; }
 };
 
-// All of them, in a fixed order. No name is the start of another.
+// All of them: four controls, then the entity names of HTML 4 for Latin-1 by code point, then its
+// special ones. No name is the start of another.
 std::span<const NamedCharacter> NamedCharacters() noexcept;
 
 // The character whose `#{name}` stands at the start of the text, or null. Names are case-sensitive.
