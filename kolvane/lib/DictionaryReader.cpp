@@ -28,7 +28,7 @@ TextEncoding EncodingByMark(std::string_view image) noexcept {
 }
 
 std::unique_ptr<DictionaryReader> DictionaryReader::Create(std::istream* stream) {
-  const bool readable = stream != nullptr && stream->good();
+  const bool isReadable = stream != nullptr && stream->good();
   uint8_t mark[2] = {};
   uint32_t count = sizeof mark;
   ReadStreamBytes(stream, mark, count);
@@ -40,7 +40,7 @@ std::unique_ptr<DictionaryReader> DictionaryReader::Create(std::istream* stream)
     default:
       break;
   }
-  if (readable) {
+  if (isReadable && !stream->bad()) {
     stream->clear();  // of the end that a stream of fewer than two bytes has met
     stream->seekg(0);
   }

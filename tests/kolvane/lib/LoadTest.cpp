@@ -365,7 +365,7 @@ TEST(Load, MovesEntriesAsFarAsThereIsMemory) {
   });
 }
 
-// Seeks to its end only if it may, and fails behind its first bytes.
+// Seeks to its end only if it may, and fails once, after its first bytes.
 class PickyBuffer : public std::streambuf {
  public:
   PickyBuffer(std::string& image, size_t readable, bool mayFindEnd) : size(image.size()), findsEnd(mayFindEnd) {
@@ -374,8 +374,9 @@ class PickyBuffer : public std::streambuf {
 
  protected:
   int_type underflow() override {
-    if (egptr() < eback() + size) throw std::runtime_error("unreadable");
-    return traits_type::eof();
+    if (egptr() == eback() + size) return traits_type::eof();
+    setg(eback(), gptr(), eback() + size);
+    throw std::runtime_error("unreadable");
   }
   pos_type seekoff(off_type offset, std::ios::seekdir from, std::ios::openmode) override {
     if (!findsEnd || offset != 0 || from == std::ios::beg) return off_type(-1);
