@@ -1,6 +1,10 @@
 // Loading libraries while a program runs.
+//
+// All functions take the system's loader lock, under which a library's constructors and destructors
+// run too. Callers hold no lock that such code may want.
 #pragma once
 
+#include <cstdint>
 #include <string>
 
 namespace platform {
@@ -15,8 +19,18 @@ void UnloadSharedLibrary(SharedLibrary library) noexcept;
 // The address of a function that the library exports, or null.
 void* FindFunction(SharedLibrary library, const char* name) noexcept;
 
-// What the address belongs to: equal for two addresses in the same library or program, null for an
-// address in neither.
-const void* ModuleOf(const void* address) noexcept;
+// The addresses from `begin` to just below `end`.
+struct AddressRange {
+  bool Contains(const void* address) const noexcept {
+    const auto value = reinterpret_cast<uintptr_t>(address);
+    return begin <= value && value < end;
+  }
+
+  uintptr_t begin;
+  uintptr_t end;
+};
+
+// Where the library is in memory until it is unloaded; all addresses if the system does not say.
+AddressRange AddressesOf(SharedLibrary library) noexcept;
 
 }  // namespace platform

@@ -53,13 +53,13 @@ void* FindFunction(SharedLibrary library, const char* name) noexcept {
   return reinterpret_cast<void*>(::GetProcAddress(static_cast<HMODULE>(library), name));
 }
 
-const void* ModuleOf(const void* address) noexcept {
-  if (address == nullptr) return nullptr;
-  HMODULE module = nullptr;
-  ::GetModuleHandleExW(
-      GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
-      static_cast<LPCWSTR>(address), &module);
-  return module;
+// A module's handle is the address of its headers.
+AddressRange AddressesOf(SharedLibrary library) noexcept {
+  const auto begin = reinterpret_cast<uintptr_t>(library);
+  const auto* const dosHeader = reinterpret_cast<const IMAGE_DOS_HEADER*>(begin);
+  const auto headers = begin + static_cast<uintptr_t>(dosHeader->e_lfanew);
+  const auto* const header = reinterpret_cast<const IMAGE_NT_HEADERS*>(headers);
+  return {begin, begin + header->OptionalHeader.SizeOfImage};
 }
 
 }  // namespace platform

@@ -16,11 +16,23 @@ bool FindEntryPoint(platform::SharedLibrary library, const std::string& name, Fu
 }
 
 template <class Function>
-const void* ModuleOf(Function function) noexcept {
-  return platform::ModuleOf(reinterpret_cast<const void*>(function));
+bool IsIn(const platform::AddressRange& code, Function function) noexcept {
+  return code.Contains(reinterpret_cast<const void*>(function));
 }
 
 }  // namespace
+
+std::unique_ptr<PlugIn> FindPlugIn(platform::SharedLibrary library, const char* prefix,
+                                   std::string& reason) {
+  const std::string name = prefix;
+  auto plugIn = std::make_unique<PlugIn>();
+  plugIn->library = library;
+  plugIn->addresses = platform::AddressesOf(library);
+  const bool complete = FindEntryPoint(library, name + "Initialize", plugIn->initialize, reason) &&
+                        FindEntryPoint(library, name + "Terminate", plugIn->terminate, reason) &&
+                        FindEntryPoint(library, name + "Version", plugIn->version, reason);
+  return complete ? std::move(plugIn) : nullptr;
+}
 
 PlugIns::PlugIns(HandleTable& handleTable, Objects& objectStore, Coercions& coercionStore,
                  const Trace& hostTrace, const ErrorReports& hostReports,
@@ -32,23 +44,14 @@ PlugIns::PlugIns(HandleTable& handleTable, Objects& objectStore, Coercions& coer
       reports(hostReports),
       running(innermostCode) {}
 
-VRKResult PlugIns::Add(platform::SharedLibrary library, const char* prefix, VRKPlugIn& outPlugIn,
-                       std::string& reason) {
-  const std::string name = prefix;
-  auto plugIn = std::make_unique<PlugIn>();
-  plugIn->library = library;
-  const bool complete = FindEntryPoint(library, name + "Initialize", plugIn->initialize, reason) &&
-                        FindEntryPoint(library, name + "Terminate", plugIn->terminate, reason) &&
-                        FindEntryPoint(library, name + "Version", plugIn->version, reason);
-  if (!complete) return kVRKNotFound;
-  outPlugIn = handles.Add(std::move(plugIn));
-  return kVRKNoError;
+VRKPlugIn PlugIns::Add(std::unique_ptr<PlugIn> plugIn) {
+  return handles.Add(std::move(plugIn));
 }
 
 VRKResult PlugIns::Initialize(VRKPlugIn plugIn) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
-  if (IsRunning(ModuleOf(found->initialize))) return kVRKInUse;
+  if (IsRunning(found->addresses)) return kVRKInUse;
   PlugIn* const outer = std::exchange(initialising, found);
   const VRKResult result = CallOut(running, kVRKCallbackThrew, found->initialize, 0u);
   initialising = outer;
@@ -58,7 +61,7 @@ VRKResult PlugIns::Initialize(VRKPlugIn plugIn) {
 VRKResult PlugIns::Terminate(VRKPlugIn plugIn) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
-  if (IsRunning(ModuleOf(found->initialize))) return kVRKInUse;
+  if (IsRunning(found->addresses)) return kVRKInUse;
   const RunningCode code(running, found->terminate);  // until its objects are released, too
   const VRKResult result = CallOut(running, kVRKCallbackThrew, found->terminate, 0u);
   ReleaseKept(*found, 0);
@@ -78,13 +81,13 @@ VRKResult PlugIns::Version(VRKPlugIn plugIn, uint32_t& outVersion) {
 VRKResult PlugIns::Remove(VRKPlugIn plugIn, platform::SharedLibrary& outLibrary) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
-  const void* const module = ModuleOf(found->initialize);
-  if (IsRunning(module) || ServesOthers(module)) return kVRKInUse;
+  const platform::AddressRange& code = found->addresses;
+  if (IsRunning(code) || ServesOthers(code)) return kVRKInUse;
   {
-    const RunningCode code(running, found->initialize);
+    const RunningCode releasing(running, found->initialize);
     ReleaseKept(*found, 0);
   }
-  const bool isNeeded = ServesOthers(module) || HandlesMessages(module) || !found->kept.empty();
+  const bool isNeeded = ServesOthers(code) || HandlesMessages(code) || !found->kept.empty();
   if (isNeeded) return kVRKInUse;
   outLibrary = found->library;
   handles.Remove<PlugIn>(plugIn);
@@ -115,31 +118,35 @@ VRKResult PlugIns::CreateObject(VRKToken objectClass, VRKDictionary parameters,
   return kVRKNoError;
 }
 
-uint32_t PlugIns::InstalledCount() const noexcept {
-  const size_t serving = objects.Factories().size() + coercions.Installed().size();
-  return static_cast<uint32_t>(serving) + handles.Live(Kind::kMessageHandler);
+bool PlugIns::MustStay(platform::SharedLibrary library,
+                       const platform::AddressRange& addresses) const noexcept {
+  bool isKept = false;
+  handles.ForEach<PlugIn>(
+      [&](VRKPlugIn, const PlugIn& plugIn) { isKept = isKept || plugIn.library == library; });
+  if (isKept) return false;
+  return IsRunning(addresses) || ServesOthers(addresses) || HandlesMessages(addresses);
 }
 
-bool PlugIns::IsRunning(const void* module) const noexcept {
-  for (const RunningCode* code = running; code != nullptr; code = code->Outer()) {
-    if (platform::ModuleOf(code->Address()) == module) return true;
+bool PlugIns::IsRunning(const platform::AddressRange& code) const noexcept {
+  for (const RunningCode* each = running; each != nullptr; each = each->Outer()) {
+    if (code.Contains(each->Address())) return true;
   }
   return false;
 }
 
-bool PlugIns::ServesOthers(const void* module) const noexcept {
-  const auto isIn = [&](const auto& each) { return ModuleOf(each.callback.function) == module; };
+bool PlugIns::ServesOthers(const platform::AddressRange& code) const noexcept {
+  const auto isIn = [&](const auto& each) { return IsIn(code, each.callback.function); };
   const auto& factories = objects.Factories();
   const auto& installed = coercions.Installed();
   return std::any_of(factories.begin(), factories.end(), isIn) ||
-         std::any_of(installed.begin(), installed.end(), isIn) ||
-         ModuleOf(trace.Hook()) == module || ModuleOf(reports.Reporter()) == module;
+         std::any_of(installed.begin(), installed.end(), isIn) || IsIn(code, trace.Hook()) ||
+         IsIn(code, reports.Reporter());
 }
 
-bool PlugIns::HandlesMessages(const void* module) const noexcept {
+bool PlugIns::HandlesMessages(const platform::AddressRange& code) const noexcept {
   bool any = false;
   handles.ForEach<MessageHandler>([&](VRKMessageHandler, const MessageHandler& handler) {
-    any = any || ModuleOf(handler.callback.function) == module;
+    any = any || IsIn(code, handler.callback.function);
   });
   return any;
 }

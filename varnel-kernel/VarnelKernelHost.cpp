@@ -1,13 +1,18 @@
 // The operations of VarnelKernelHost.h. They are not traced.
 #include "VarnelKernelHost.h"
 
+#include <memory>
 #include <string>
+#include <utility>
 
 #include "Kernel.h"
+#include "PlugIns.h"
 #include "SharedLibrary.h"
 
+using varnel_kernel::FindPlugIn;
 using varnel_kernel::Guarded;
 using varnel_kernel::Kernel;
+using varnel_kernel::PlugIn;
 
 namespace {
 
@@ -25,6 +30,29 @@ template <class Handle>
 VRKResult CreateHandleData(VRKToken type, Handle handle, VRKData* outData, Kernel& kernel) {
   if (outData == nullptr) return kVRKInvalidArgument;
   return kernel.values.CreateData(type, &handle, sizeof handle, *outData);
+}
+
+VRKResult AddPlugIn(platform::SharedLibrary library, const char* prefix,
+                    VRKPlugIn& outPlugIn) noexcept {
+  return Guarded([&]() -> VRKResult {
+    std::unique_ptr<PlugIn> plugIn = FindPlugIn(library, prefix, gLoadError);
+    if (plugIn == nullptr) return kVRKNotFound;
+    return ServeHost([&](Kernel& kernel) {
+      outPlugIn = kernel.plugIns.Add(std::move(plugIn));
+      return kVRKNoError;
+    });
+  });
+}
+
+// A library may have installed callbacks as it was loaded, and then stays.
+void UnloadRefused(platform::SharedLibrary library) noexcept {
+  const platform::AddressRange addresses = platform::AddressesOf(library);
+  bool mustStay = false;
+  ServeHost([&](Kernel& kernel) {
+    mustStay = kernel.plugIns.MustStay(library, addresses);
+    return kVRKNoError;
+  });
+  if (!mustStay) platform::UnloadSharedLibrary(library);
 }
 
 }  // namespace
@@ -46,26 +74,20 @@ VRKResult VRKHostGetLiveCounts(VRKHostLiveCounts* outLive) {
   });
 }
 
-// Libraries are loaded and unloaded out of turn: the system's loader has a lock of its own, under
-// which a library may call the kernel. One that did so and is no plug-in stays loaded.
+// The system's loader is called without the kernel's lock: a library that calls the kernel as it is
+// loaded or unloaded takes the loader's lock first, then the kernel's.
+
 VRKResult VRKHostPlugInLoad(const char* path, const char* prefix, VRKPlugIn* outPlugIn) {
   gLoadError.clear();
   const bool given = path != nullptr && *path != 0 && prefix != nullptr && outPlugIn != nullptr;
-  uint32_t installedBefore = 0;
-  const VRKResult ready = ServeHost([&](Kernel& kernel) -> VRKResult {
-    installedBefore = kernel.plugIns.InstalledCount();
-    return given ? kVRKNoError : kVRKInvalidArgument;
-  });
+  const VRKResult ready =
+      ServeHost([=](Kernel&) { return given ? kVRKNoError : kVRKInvalidArgument; });
   if (ready != kVRKNoError) return ready;
   return Guarded([&]() -> VRKResult {
     const platform::SharedLibrary library = platform::LoadSharedLibrary(path, gLoadError);
     if (library == nullptr) return kVRKNotFound;
-    bool isInstalled = false;
-    const VRKResult result = ServeHost([&](Kernel& kernel) {
-      isInstalled = kernel.plugIns.InstalledCount() > installedBefore;
-      return kernel.plugIns.Add(library, prefix, *outPlugIn, gLoadError);
-    });
-    if (result != kVRKNoError && !isInstalled) platform::UnloadSharedLibrary(library);
+    const VRKResult result = AddPlugIn(library, prefix, *outPlugIn);
+    if (result != kVRKNoError) UnloadRefused(library);
     return result;
   });
 }

@@ -43,9 +43,16 @@ VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
 /* Plug-ins */
 
 /* Loads a library whose entry points are called `prefix` followed by Initialize, Terminate and
- * Version. kVRKNotFound: there is no such library, or it lacks an entry point; VRKHostLoadError
- * says why. A path without a separator is searched for where the system looks for libraries, among
- * them the folder of the kernel's own. */
+ * Version. A path without a separator is searched for where the system looks for libraries,
+ * including the folder of the kernel's own. The library may call the kernel from its constructors,
+ * also while other threads load, initialise, terminate or unload plug-ins.
+ *
+ * kVRKNotFound: there is no such library, or it lacks an entry point; VRKHostLoadError says why. A
+ * library that lacks one is unloaded again, unless it has installed callbacks or its code is
+ * running.
+ *
+ * Not to be called from within a callback, which holds the kernel's lock: where another thread
+ * loads or unloads a library that calls the kernel meanwhile, each would wait for the other. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefix,
                                              VRKPlugIn* outPlugIn);
 
@@ -61,11 +68,10 @@ VRK_API VRKResult VRK_CALL VRKHostPlugInInitialize(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInTerminate(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion);
 
-/* Unloads the library, whether it was terminated or not; objects that were kept for it are released
- * first. kVRKInUse, and nothing is unloaded: one of its callbacks is installed still, a trace hook
- * or reporter among them, or its code is running. Code of other libraries that it brought along is
- * not looked for. Not to be called while another thread loads a library that calls the kernel as it
- * is loaded. */
+/* Unloads the library, whether it was terminated or not. Objects that were kept for it are released
+ * first. kVRKInUse, and nothing is unloaded: one of its callbacks is still installed (the trace
+ * hook and the reporter count), or its code is running. Code in other libraries that it loaded is
+ * not searched for. Not to be called from within a callback, as VRKHostPlugInLoad. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInUnload(VRKPlugIn plugIn);
 
 /* Lists and data of handles. Outs are owned by the caller. */
@@ -111,11 +117,11 @@ typedef struct VRKHostTraceCall {
   VRKResult result;
 } VRKHostTraceCall;
 
-/* Hears of each call of an operation of VarnelKernel.h, but for VRKTokenGetString, twice. What it
- * returns before the call runs, if it is not 0, becomes the call's result, and the call does not
- * run; after it the result is ignored. VRKRuntimeError has no result code: it
- * ends with 0, and returns 0 where it did not run. Calls that the hook makes itself are not traced.
- * No exception may leave it. */
+/* Called before and after each operation of VarnelKernel.h except VRKTokenGetString, which is not
+ * traced. A result other than 0 before the operation runs becomes the operation's result, and the
+ * operation does not run. The result after it is ignored. VRKRuntimeError has no result code: its
+ * result in the trace is 0, and it returns 0 if it did not run. Calls that the hook makes itself
+ * are not traced. No exception may leave the hook. */
 typedef VRKResult(VRK_CALL* VRKHostTraceHook)(const VRKHostTraceCall* call, void* context);
 
 /* Installs the one trace hook; null for none. */

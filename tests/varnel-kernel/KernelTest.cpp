@@ -1,9 +1,16 @@
 // The embedded kernel through its C interface: what a walk over its operations does not reach.
 #include <gtest/gtest.h>
 
+#include <atomic>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
 #include <cstring>
+#include <filesystem>
 #include <functional>
+#include <future>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "AllocationMeter.h"
@@ -191,6 +198,54 @@ TEST_F(Kernel, ReportsFailedChecksOncePerSite) {
   EXPECT_EQ(report() + report(), 0u);
   EXPECT_EQ(testing::internal::GetCapturedStderr(), "file:12: function: check failed: a == b [domain]\n");
   EXPECT_EQ(once, 1u);
+}
+
+// A copy of the library that calls the kernel as it is loaded, so that it is loaded anew.
+std::string EagerCopy() {
+  static std::atomic<int> count = 0;
+  const std::string copy = EAGER_PLUG_IN "." + std::to_string(++count);
+  std::filesystem::copy_file(EAGER_PLUG_IN, copy, std::filesystem::copy_options::overwrite_existing);
+  return copy;
+}
+
+VRKPlugIn LoadEager() {
+  VRKPlugIn plugIn{};
+  EXPECT_EQ(VRKHostPlugInLoad(EagerCopy().c_str(), "Eager", &plugIn), 0u) << VRKHostLoadError();
+  EXPECT_EQ(VRKHostSetTraceHook(nullptr, nullptr), 0u);
+  return plugIn;
+}
+
+// Threads that wait for each other cannot be joined, so that ends the run.
+void ExitUnlessDone(const std::future<void>& done) {
+  if (done.wait_for(std::chrono::seconds(20)) == std::future_status::ready) return;
+  std::fputs("Two threads wait for each other\n", stderr);
+  std::_Exit(1);
+}
+
+// The constructor of the eager library pauses before it calls the kernel, so that the other thread's
+// call begins while the loader is locked.
+TEST_F(Kernel, ServesLibrariesThatCallItAsTheyAreLoaded) {
+  const VRKPlugIn plugIn = LoadEager();
+  const std::function<VRKResult()> operations[] = {[] { return VRKHostPlugInUnload(LoadEager()); },
+                                                   [=] { return VRKHostPlugInInitialize(plugIn); },
+                                                   [=] { return VRKHostPlugInTerminate(plugIn); }};
+  for (const auto& operation : operations) {
+    auto loading = std::async(std::launch::async, [] { EXPECT_EQ(VRKHostPlugInUnload(LoadEager()), 0u); });
+    auto operating = std::async(std::launch::async, [&] {
+      std::this_thread::sleep_for(std::chrono::milliseconds(20));
+      EXPECT_EQ(operation(), 0u);
+    });
+    ExitUnlessDone(loading);
+    ExitUnlessDone(operating);
+  }
+  EXPECT_EQ(VRKHostPlugInUnload(plugIn), 0u);
+}
+
+TEST_F(Kernel, KeepsARefusedLibraryWhoseCodeItCalls) {
+  VRKPlugIn plugIn{};
+  EXPECT_EQ(VRKHostPlugInLoad(EagerCopy().c_str(), "Hooking", &plugIn), kVRKNotFound);
+  Token("text:test");  // the library's hook is called
+  ASSERT_EQ(VRKHostSetTraceHook(nullptr, nullptr), 0u);
 }
 
 VRKPlugIn LoadPlugIn(const std::string& whatItLeaves) {
