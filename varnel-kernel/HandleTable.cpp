@@ -12,7 +12,7 @@ constexpr uint32_t kRestingSlots = 1024;
 
 uint32_t HandleTable::AddItem(std::unique_ptr<Item> item, Kind kind) {
   const uint32_t index = TakeFreeSlot();
-  Slot& slot = slots[index];
+  Slot& slot = SlotAt(index);
   slot.item = std::move(item);
   slot.count = 1;
   slot.kind = kind;
@@ -29,33 +29,34 @@ std::unique_ptr<Item> HandleTable::RemoveItem(uint32_t handle, Kind kind) noexce
   constexpr uint32_t kGenerationMask = (1u << (32 - kIndexBits)) - 1;
   slot->generation = (slot->generation + 1) & kGenerationMask;
   slot->nextFree = 0;
-  (freeCount == 0 ? firstFree : slots[lastFree].nextFree) = index;
+  (freeCount == 0 ? firstFree : SlotAt(lastFree).nextFree) = index;
   lastFree = index;
   ++freeCount;
   return std::move(slot->item);
 }
 
 void HandleTable::Clear() noexcept {
-  for (uint32_t index = 1; index < slots.size(); ++index) {
-    const Kind kind = slots[index].kind;
+  for (uint32_t index = 1; index < slotCount; ++index) {
+    const Kind kind = SlotAt(index).kind;
     if (kind != Kind::kNone) RemoveItem(HandleOf(index), kind);
   }
 }
 
 uint32_t HandleTable::HandleOf(uint32_t index) const noexcept {
-  return slots[index].generation << kIndexBits | index;
+  return SlotAt(index).generation << kIndexBits | index;
 }
 
 uint32_t HandleTable::TakeFreeSlot() {
   if (freeCount > kRestingSlots) {
     const uint32_t index = firstFree;
-    firstFree = slots[index].nextFree;
+    firstFree = SlotAt(index).nextFree;
     --freeCount;
     return index;
   }
-  if (slots.size() > kIndexMask) throw std::bad_alloc();
-  slots.emplace_back();
-  return static_cast<uint32_t>(slots.size() - 1);
+  if (slotCount > kIndexMask) throw std::bad_alloc();
+  if (slotCount % kBlockSlots == 0) blocks.push_back(std::make_unique<Slot[]>(kBlockSlots));
+  if (slotCount == 0) ++slotCount;
+  return slotCount++;
 }
 
 }  // namespace varnel_kernel

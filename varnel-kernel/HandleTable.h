@@ -26,7 +26,8 @@ struct Item {
 // handle is found out for at least a million handles. Every operation takes any 32 bits for a
 // handle.
 //
-// Nothing but Add allocates. Pointers to items stay valid until the item is removed.
+// Nothing but Add allocates, and Add takes constant time. Pointers to items stay valid until the
+// item is removed.
 class HandleTable {
  public:
   // With a count of 1. Throws std::bad_alloc when there is no memory, or no handle left.
@@ -69,8 +70,8 @@ class HandleTable {
   // Calls `visit` with the handle and the item of each item of this class.
   template <class Kept, class Visit>
   void ForEach(Visit visit) const {
-    for (uint32_t index = 1; index < slots.size(); ++index) {
-      const Slot& slot = slots[index];
+    for (uint32_t index = 1; index < slotCount; ++index) {
+      const Slot& slot = SlotAt(index);
       if (slot.kind == Kept::kKind) {
         visit(typename Kept::Handle{HandleOf(index)}, static_cast<Kept&>(*slot.item));
       }
@@ -93,6 +94,7 @@ class HandleTable {
 
   static constexpr uint32_t kIndexBits = 22;
   static constexpr uint32_t kIndexMask = (1u << kIndexBits) - 1;
+  static constexpr uint32_t kBlockSlots = 1024;
 
   uint32_t AddItem(std::unique_ptr<Item> item, Kind kind);
   std::unique_ptr<Item> RemoveItem(uint32_t handle, Kind kind) noexcept;
@@ -103,15 +105,20 @@ class HandleTable {
 
   const Slot* SlotOf(uint32_t handle, Kind kind) const noexcept {
     const uint32_t index = handle & kIndexMask;
-    if (index >= slots.size()) return nullptr;
-    const Slot& slot = slots[index];
+    if (index >= slotCount) return nullptr;
+    const Slot& slot = SlotAt(index);
     return slot.kind == kind && slot.generation == handle >> kIndexBits ? &slot : nullptr;
+  }
+
+  Slot& SlotAt(uint32_t index) const noexcept {
+    return blocks[index / kBlockSlots][index % kBlockSlots];
   }
 
   uint32_t HandleOf(uint32_t index) const noexcept;
   uint32_t TakeFreeSlot();
 
-  std::vector<Slot> slots = std::vector<Slot>(1);  // the first stays empty: no handle is 0
+  std::vector<std::unique_ptr<Slot[]>> blocks;  // of kBlockSlots, so that growth moves no slot
+  uint32_t slotCount = 0;                       // slot 0 stays empty: no handle is 0
   uint32_t firstFree = 0;
   uint32_t lastFree = 0;
   uint32_t freeCount = 0;

@@ -76,14 +76,20 @@ VRKResult Traced(Trace& trace, const char* operation, Body body, Arguments... ar
   return result;
 }
 
-// Serves one call: waits for its turn, tells the trace, runs `body` with the kernel.
+// Runs `body` with a kernel, which may be null, and traces the call. Requires the kernel's lock.
 template <class Body, class... Arguments>
-VRKResult Serve(const char* operation, Body body, Arguments... arguments) noexcept {
-  const std::lock_guard lock(Kernel::mutex);
-  Kernel* const kernel = Kernel::Running();
+VRKResult RunTraced(Kernel* kernel, const char* operation, Body body,
+                    Arguments... arguments) noexcept {
   if (kernel == nullptr) return kVRKNotRunning;
   const auto run = [&] { return Guarded([&] { return body(*kernel); }); };
   return kernel->trace.IsOn() ? Traced(kernel->trace, operation, run, arguments...) : run();
+}
+
+// Serves one call: locks the kernel, traces the call, runs `body` with the running kernel.
+template <class Body, class... Arguments>
+VRKResult Serve(const char* operation, Body body, Arguments... arguments) noexcept {
+  const std::lock_guard lock(Kernel::mutex);
+  return RunTraced(Kernel::Running(), operation, body, arguments...);
 }
 
 }  // namespace varnel_kernel

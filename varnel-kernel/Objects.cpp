@@ -19,7 +19,8 @@ class Objects::Delivery {
     ++object.deliveries;
   }
   ~Delivery() {
-    if (--object.deliveries != 0) return;
+    if (--object.deliveries != 0 || !object.hasStaleHandlers) return;
+    object.hasStaleHandlers = false;
     std::erase_if(object.handlers, [this](VRKMessageHandler registration) {
       return handles.Find<MessageHandler>(registration) == nullptr;
     });
@@ -33,9 +34,7 @@ class Objects::Delivery {
       const VRKMessageHandler registration = object.handlers[--left];
       const MessageHandler* const handler = handles.Find<MessageHandler>(registration);
       if (handler == nullptr || (ofDeath && handler->isToldOfDeath)) continue;
-      const auto& messages = handler->messages;
-      if (std::find(messages.begin(), messages.end(), message) != messages.end())
-        return registration;
+      if (handler->messages.contains(message)) return registration;
     }
     return VRKMessageHandler{};
   }
@@ -188,7 +187,8 @@ VRKResult Objects::AddMessages(VRKMessageHandler registration, const VRKToken* m
   if (!std::all_of(messages, messages + count, [&](VRKToken each) { return tokens.Holds(each); })) {
     return kVRKInvalidHandle;
   }
-  handler->messages.insert(handler->messages.end(), messages, messages + count);
+  handler->messages.reserve(handler->messages.size() + count);  // all that can throw
+  handler->messages.insert(messages, messages + count);
   return kVRKNoError;
 }
 
@@ -196,7 +196,11 @@ VRKResult Objects::Remove(VRKMessageHandler registration, VRKObject object) noex
   const MessageHandler* const handler = handles.Find<MessageHandler>(registration);
   if (handler == nullptr || handler->object != object) return kVRKInvalidHandle;
   Object& handled = *handles.Find<Object>(object);
-  if (handled.deliveries == 0) std::erase(handled.handlers, registration);
+  if (handled.deliveries == 0) {
+    std::erase(handled.handlers, registration);
+  } else {
+    handled.hasStaleHandlers = true;
+  }
   handles.Remove<MessageHandler>(registration);
   return kVRKNoError;
 }

@@ -1,6 +1,7 @@
 // Objects, the handlers attached to them, and the factories that make them.
 #pragma once
 
+#include <boost/unordered/unordered_flat_set.hpp>
 #include <cstdint>
 #include <vector>
 
@@ -20,8 +21,9 @@ struct Object final : Item {
 
   const VRKToken objectClass;
   std::vector<VRKMessageHandler>
-      handlers;             // in the order of installation; stale ones may stand there
-  uint32_t deliveries = 0;  // that walk the handlers now
+      handlers;                   // in the order of installation; stale ones may stand there
+  uint32_t deliveries = 0;        // that walk the handlers now
+  bool hasStaleHandlers = false;  // removed during a delivery
   bool isDying = false;
 };
 
@@ -34,7 +36,7 @@ struct MessageHandler final : Item {
 
   const VRKObject object;
   const Callback<VRKMessageHandlerCallback> callback;
-  std::vector<VRKToken> messages;
+  boost::unordered_flat_set<VRKToken> messages;
   bool isToldOfDeath = false;  // of its object's; it is told once
 };
 

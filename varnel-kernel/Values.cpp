@@ -56,8 +56,6 @@ Values::Values(HandleTable& handleTable, TokenTable& tokenTable)
 VRKResult Values::CreateData(VRKToken type, const void* bytes, uint32_t byteCount,
                              VRKData& outData) {
   if (!tokens.Holds(type)) return kVRKInvalidHandle;
-  std::unique_ptr<Data> data = Data::Create(type, byteCount);
-  if (byteCount != 0) std::memcpy(data->Bytes(), bytes, byteCount);
   VRKToken token{};
   VRKList list{};
   VRKDictionary dictionary{};
@@ -71,6 +69,8 @@ VRKResult Values::CreateData(VRKToken type, const void* bytes, uint32_t byteCoun
     if (!ReadHandle(bytes, byteCount, dictionary)) return kVRKInvalidArgument;
     if (handles.Find<Dictionary>(dictionary) == nullptr) return kVRKInvalidHandle;
   }
+  std::unique_ptr<Data> data = Data::Create(type, byteCount);
+  if (byteCount != 0) std::memcpy(data->Bytes(), bytes, byteCount);
   data->list = list;
   data->dictionary = dictionary;
   outData = handles.Add(std::move(data));

@@ -10,7 +10,24 @@ using varnel_kernel::Data;
 using varnel_kernel::Dictionary;
 using varnel_kernel::Kernel;
 using varnel_kernel::List;
+using varnel_kernel::RunTraced;
 using varnel_kernel::Serve;
+
+namespace {
+
+template <class Counted>
+VRKResult Retain(const char* operation, typename Counted::Handle handle) noexcept {
+  return Serve(
+      operation, [=](Kernel& kernel) { return kernel.values.Retain<Counted>(handle); }, handle);
+}
+
+template <class Counted>
+VRKResult Release(const char* operation, typename Counted::Handle handle) noexcept {
+  return Serve(
+      operation, [=](Kernel& kernel) { return kernel.values.Release<Counted>(handle); }, handle);
+}
+
+}  // namespace
 
 VRKResult VRKObjectCreate(VRKToken objectClass, VRKDictionary parameters, VRKObject* outObject) {
   return Serve(
@@ -36,14 +53,12 @@ VRKResult VRKObjectDeliverMessage(VRKObject object, VRKToken message, VRKDiction
 
 VRKResult VRKObjectRetain(VRKObject object) {
   return Serve(
-      "VRKObjectRetain", [=](Kernel& kernel) -> VRKResult { return kernel.objects.Retain(object); },
-      object);
+      "VRKObjectRetain", [=](Kernel& kernel) { return kernel.objects.Retain(object); }, object);
 }
 
 VRKResult VRKObjectRelease(VRKObject object) {
   return Serve(
-      "VRKObjectRelease",
-      [=](Kernel& kernel) -> VRKResult { return kernel.objects.Release(object); }, object);
+      "VRKObjectRelease", [=](Kernel& kernel) { return kernel.objects.Release(object); }, object);
 }
 
 VRKResult VRKObjectFactoryRegister(VRKToken objectClass, uint32_t reserved,
@@ -146,15 +161,11 @@ VRKResult VRKDataCoerce(VRKData data, VRKToken toType, VRKData* outData) {
 }
 
 VRKResult VRKDataRetain(VRKData data) {
-  return Serve(
-      "VRKDataRetain",
-      [=](Kernel& kernel) -> VRKResult { return kernel.values.Retain<Data>(data); }, data);
+  return Retain<Data>("VRKDataRetain", data);
 }
 
 VRKResult VRKDataRelease(VRKData data) {
-  return Serve(
-      "VRKDataRelease",
-      [=](Kernel& kernel) -> VRKResult { return kernel.values.Release<Data>(data); }, data);
+  return Release<Data>("VRKDataRelease", data);
 }
 
 VRKResult VRKDataCoercionHandlerInstall(VRKToken fromType, VRKToken toType, uint32_t reserved,
@@ -216,17 +227,11 @@ VRKResult VRKDictionaryCreateKeyList(VRKDictionary dictionary, VRKList* outList)
 }
 
 VRKResult VRKDictionaryRetain(VRKDictionary dictionary) {
-  return Serve(
-      "VRKDictionaryRetain",
-      [=](Kernel& kernel) -> VRKResult { return kernel.values.Retain<Dictionary>(dictionary); },
-      dictionary);
+  return Retain<Dictionary>("VRKDictionaryRetain", dictionary);
 }
 
 VRKResult VRKDictionaryRelease(VRKDictionary dictionary) {
-  return Serve(
-      "VRKDictionaryRelease",
-      [=](Kernel& kernel) -> VRKResult { return kernel.values.Release<Dictionary>(dictionary); },
-      dictionary);
+  return Release<Dictionary>("VRKDictionaryRelease", dictionary);
 }
 
 VRKResult VRKListGetSize(VRKList list, uint32_t* outSize) {
@@ -257,15 +262,11 @@ VRKResult VRKListGetEntry(VRKList list, uint32_t index, VRKData* outData) {
 }
 
 VRKResult VRKListRetain(VRKList list) {
-  return Serve(
-      "VRKListRetain",
-      [=](Kernel& kernel) -> VRKResult { return kernel.values.Retain<List>(list); }, list);
+  return Retain<List>("VRKListRetain", list);
 }
 
 VRKResult VRKListRelease(VRKList list) {
-  return Serve(
-      "VRKListRelease",
-      [=](Kernel& kernel) -> VRKResult { return kernel.values.Release<List>(list); }, list);
+  return Release<List>("VRKListRelease", list);
 }
 
 VRKResult VRKMemoryAllocate(uint32_t byteCount, uint32_t reserved, void** outBlock) {
@@ -288,16 +289,16 @@ const char* VRKTokenGetString(VRKToken token) {
   return kernel != nullptr ? kernel->tokens.TextOf(token) : nullptr;
 }
 
-// Blocks may outlive the kernel that gave them.
+// Blocks may outlive the kernel that allocated them, so a kernel that was shut down takes them too.
 VRKResult VRKMemoryDeallocate(void* block) {
   const std::lock_guard lock(Kernel::mutex);
-  const auto agree = [](Kernel&) -> VRKResult { return kVRKNoError; };
-  const VRKResult result = Serve("VRKMemoryDeallocate", agree, block);
-  if (result != kVRKNoError && result != kVRKNotRunning) return result;
-  if (block == nullptr || Kernel::built == nullptr) return kVRKNoError;
-  --Kernel::built->memoryBlocks;
-  std::free(block);
-  return kVRKNoError;
+  const auto deallocate = [=](Kernel& kernel) -> VRKResult {
+    if (block == nullptr) return kVRKNoError;
+    --kernel.memoryBlocks;
+    std::free(block);
+    return kVRKNoError;
+  };
+  return RunTraced(Kernel::built, "VRKMemoryDeallocate", deallocate, block);
 }
 
 uint32_t VRKRuntimeError(uint32_t severity, const char* domain, const char* expression,

@@ -119,6 +119,35 @@ TEST_F(Kernel, CoercesTextEveryWay) {
   }
 }
 
+TEST_F(Kernel, FreesNoBlockOfACallThatWasRefused) {
+  void* block = nullptr;
+  ASSERT_EQ(VRKMemoryAllocate(8, 0, &block), 0u);
+  std::vector<uint32_t> blocksTold;
+  OnTrace hook = [&](const VRKHostTraceCall&) { blocksTold.push_back(Live().memoryBlocks); };
+  const auto refuse = [](const VRKHostTraceCall*, void*) -> VRKResult { return kVRKNotRunning; };
+  ASSERT_EQ(VRKHostSetTraceHook(refuse, nullptr), 0u);
+  EXPECT_EQ(VRKMemoryDeallocate(block), kVRKNotRunning);
+  EXPECT_EQ(Live().memoryBlocks, 1u);
+  ASSERT_EQ(VRKHostSetTraceHook(RunTrace, &hook), 0u);
+  EXPECT_EQ(VRKMemoryDeallocate(block), 0u);
+  EXPECT_EQ(blocksTold, (std::vector<uint32_t>{1, 0})) << "before the call and after it";
+  ASSERT_EQ(VRKHostSetTraceHook(nullptr, nullptr), 0u);
+}
+
+TEST_F(Kernel, KeepsAMessageThatWasAskedForAgainOnce) {
+  const VRKToken message = Token("message:m");
+  VRKObject object{};
+  VRKMessageHandler registration{};
+  ASSERT_EQ(VRKObjectCreate(VRKToken{}, VRKDictionary{}, &object), 0u);
+  OnMessage none = [] { return kVRKNotHandled; };
+  ASSERT_EQ(VRKMessageHandlerInstall(object, 0, RunMessage, &none, 0, 0, &registration), 0u);
+  ASSERT_EQ(VRKMessageHandlerAddMessages(registration, &message, 1), 0u);
+  const AllocationMeter meter;
+  for (int i = 0; i < 1000; ++i) ASSERT_EQ(VRKMessageHandlerAddMessages(registration, &message, 1), 0u);
+  EXPECT_EQ(meter.TotalBytes(), 0u);
+  VRKObjectRelease(object);
+}
+
 // Tokens count up, so that one without a text is known.
 TEST_F(Kernel, KeepsNoTextThatGotNoToken) {
   auto next = static_cast<uint32_t>(Token("text:0"));
@@ -141,10 +170,13 @@ TEST_F(Kernel, KeepsNoTextThatGotNoToken) {
 TEST_F(Kernel, RunsOutOfHandlesAndHasThemAgain) {
   const VRKToken type = Token("type:test");
   for (int round = 0; round < 2; ++round) {
-    std::vector<VRKData> live(1);
+    std::vector<VRKData> live;
+    live.reserve(4'194'304);
     VRKResult result = 0;
-    while ((result = VRKDataCreate(type, "", 0, 0, &live.back())) == 0) live.emplace_back();
-    live.pop_back();
+    {
+      const AllocationMeter meter(0, 64 * 1024);  // no call moves all that live
+      for (VRKData data{}; (result = VRKDataCreate(type, "", 0, 0, &data)) == 0;) live.push_back(data);
+    }
     EXPECT_EQ(result, VRKResult{kVRKOutOfMemory});
     EXPECT_GE(live.size(), 4'194'303u - 1024);
     for (const VRKData each : live) ASSERT_EQ(VRKDataRelease(each), 0u);

@@ -105,8 +105,9 @@ VRK_API VRKResult VRK_CALL VRKObjectCreate(VRKToken objectClass, VRKDictionary p
 VRK_API VRKResult VRK_CALL VRKObjectDeliverMessage(VRKObject object, VRKToken message,
                                                    VRKDictionary parameters, uint32_t flags);
 
-/* Null is accepted and does nothing. When an object's last reference is released, its handlers
- * receive "message:orvane.vrk.object-died", each exactly once, and their registrations end. */
+/* Null is accepted and does nothing. When an object's last reference is released, those of its
+ * handlers that asked for "message:orvane.vrk.object-died" receive it, each exactly once. The
+ * registrations of all its handlers end. */
 VRK_API VRKResult VRK_CALL VRKObjectRetain(VRKObject object);
 VRK_API VRKResult VRK_CALL VRKObjectRelease(VRKObject object);
 
