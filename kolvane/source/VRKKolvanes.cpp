@@ -49,8 +49,7 @@ void UnregisterTranslatorClasses() noexcept {
   gDefaultStringTranslatorFactory.reset();
 }
 
-void InitializeTranslatorClasses(uint32_t reserved) {
-  RequireZero(reserved);
+void InitializeTranslatorClasses() {
   try {
     RegisterTranslatorClasses();
   } catch (...) {
@@ -69,8 +68,7 @@ void RemoveCoercion() noexcept {
   Varnel::Kolvanes::ResetTypeTokens();
 }
 
-void InitializeCoercion(uint32_t reserved) {
-  RequireZero(reserved);
+void InitializeCoercion() {
   try {
     ReplaceCoercion(std::make_unique<CoercionImpl>());
   } catch (...) {
@@ -79,30 +77,22 @@ void InitializeCoercion(uint32_t reserved) {
   }
 }
 
-void TerminateCoercion(uint32_t reserved) {
-  RequireZero(reserved);
-  RemoveCoercion();
-}
-
-void TerminateTranslatorClasses(uint32_t reserved) {
-  RequireZero(reserved);
-  UnregisterTranslatorClasses();
-}
-
 }  // namespace
 
 VRKResult VRKKolvanesInitialize(uint32_t reserved) {
   return Varnel::AtBoundary({}, [=] {
-    InitializeTranslatorClasses(reserved);
-    InitializeCoercion(reserved);
+    RequireZero(reserved);
+    InitializeTranslatorClasses();
+    InitializeCoercion();
     return Varnel::kResultNoError;
   });
 }
 
 VRKResult VRKKolvanesTerminate(uint32_t reserved) {
   return Varnel::AtBoundary({}, [=] {
-    TerminateCoercion(reserved);
-    TerminateTranslatorClasses(reserved);
+    RequireZero(reserved);
+    RemoveCoercion();
+    UnregisterTranslatorClasses();
     return Varnel::kResultNoError;
   });
 }

@@ -31,7 +31,7 @@ DictionaryRef EmptyDictionary() {
   return dictionary;
 }
 
-// Two that are made of several kinds, which the order of the clauses tells apart.
+// Those that are made of several kinds, which the order of the clauses tells apart.
 struct Custom : Varnel::CustomErrorException, Varnel::Exception {
   explicit Custom(bool fails) : Exception(1), failsToDescribe(fails) {}
   void FillErrorInfo(DictionaryRef& errorInfo) const override {
@@ -46,6 +46,10 @@ struct Custom : Varnel::CustomErrorException, Varnel::Exception {
 struct CodedOutOfRange : std::out_of_range, Varnel::ResultCodeException {
   CodedOutOfRange() : out_of_range("") {}
   uint32_t GetResultCode() const noexcept override { return 99; }
+};
+
+struct LongAndOutOfRange : std::length_error, std::out_of_range {
+  LongAndOutOfRange() : length_error(""), out_of_range("") {}
 };
 
 struct Recoded : Varnel::Exception {
@@ -83,7 +87,7 @@ TEST_F(CallbacksTest, TurnExceptionsIntoCodes) {
                {18, Throw<std::bad_alloc, std::bad_array_new_length, Varnel::BadAllocation>()},
                {20, Throw<std::domain_error, std::invalid_argument, std::length_error, std::logic_error>("")},
                {20, Throw<std::overflow_error, std::underflow_error, std::range_error, std::runtime_error>("")},
-               {20, Throw<std::exception, std::bad_typeid, int>()},
+               {20, Throw<std::exception, std::bad_typeid, int, LongAndOutOfRange>()},
                {21, Throw<std::bad_cast>()},
                {98, Throw<Recoded>(1u)},
                {99, Throw<CodedOutOfRange>()},
@@ -148,6 +152,31 @@ TEST_F(CallbacksTest, AnswerMessagesOfTheObjectTheyMovedTo) {
   first.Reset();
   EXPECT_EQ(calls, 5) << "with the object's death";
   EXPECT_FALSE(handler.IsRegistered());
+}
+
+TEST_F(CallbacksTest, StayOnTheObjectThatTheyMoveToAsTheirsDies) {
+  const VRKToken died = MakeToken("message:orvane.vrk.object-died"), word = MakeToken("word");
+  for (const bool returns : {false, true}) {  // to the object that died, which a sender only says
+    const ObjectRef first = PlainObject(), second = PlainObject();
+    int words = 0;
+    std::unique_ptr<Handler> handler;
+    handler = std::make_unique<Handler>([&](VRKObject, VRKToken message, const DictionaryRef&) {
+      words += message == word;
+      if (message != died) return true;
+      handler->SetObject(second.Get());
+      if (returns) handler->SetObject(first.Get());
+      handler->AddMessages(&word, 1);
+      return true;
+    });
+    handler->SetObject(first.Get());
+    const VRKObject now = (returns ? first : second).Get();
+    EXPECT_EQ(VRKObjectDeliverMessage(first.Get(), died, {}, 1), 0u);
+    EXPECT_EQ(handler->Object(), now);
+    EXPECT_EQ(VRKObjectDeliverMessage(now, word, {}, 1), 0u);
+    EXPECT_EQ(words, 1);
+    handler.reset();
+    EXPECT_EQ(VRKObjectDeliverMessage(now, word, {}, 1), 256u);
+  }
 }
 
 TEST_F(CallbacksTest, MayDeleteThemselvesWithTheirObjects) {
@@ -288,11 +317,11 @@ TEST_F(CallbacksTest, SurviveEveryFault) {
   VRKHostSetErrorReporter([](auto...) -> uint32_t { return 0; }, nullptr);  // which allocates nothing
   const std::string alive = "objects 2 handlers 2 blocks 2 ";
   const Phase<Moves> phases[] = {{"fail", &Moves::Fail, Hears::kSome, 12, 3},
-                                 {"move", &Moves::Move, Hears::kAll, 10, 6, alive, {alive, "objects 2 handlers 1 blocks 2 "}},
+                                 {"move", &Moves::Move, Hears::kAll, 10, 4, alive, {alive, "objects 2 handlers 1 blocks 2 "}},
                                  {"construct", &Moves::Construct, Hears::kAll, 2, 3},
                                  {"convert", &Moves::Convert, Hears::kAll, 500, 90},
                                  {"report", &Moves::Report, Hears::kSome, 8, 1},
-                                 {"delete themselves", &Moves::DeleteThemselves, Hears::kAll, 36, 8},
+                                 {"delete themselves", &Moves::DeleteThemselves, Hears::kAll, 36, 7},
                                  {"die", &Moves::Die, Hears::kNothing, 2, 0, "objects 1 blocks 1 "}};
   for (const auto& phase : phases) SweepPhase(phase);
 }

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cstdint>
-#include <memory>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -19,101 +18,70 @@ namespace {
 // A list or dictionary whose data are being converted one after the other.
 class Frame {
  public:
-  Frame() = default;
-  Frame(const Frame&) = delete;
-  Frame& operator=(const Frame&) = delete;
-  virtual ~Frame() = default;
+  explicit Frame(ListRef source) : items(std::move(source)) {}
+  explicit Frame(DictionaryRef source)
+      : dictionary(std::move(source)), items(dictionary.CreateKeyList()) {}
 
-  // Goes on to the next datum, if there is one.
-  virtual bool Advance() = 0;
-  virtual const DataRef& Datum() const = 0;
-
-  // Puts the datum's value where it belongs, and lets go of the datum.
-  virtual void Accept(orvane::value_t value) = 0;
-
-  virtual orvane::value_t Result() = 0;
-
-  // Holds on to the data that the list or dictionary came out of.
+  // Keeps the data that the list or dictionary was read from.
   void Hold(DataRef from, DataRef coercedFrom) noexcept {
     sourceData = std::move(from);
     coercedData = std::move(coercedFrom);
   }
 
- private:
-  DataRef sourceData;
-  DataRef coercedData;
-};
+  bool IsDictionary() const noexcept { return static_cast<bool>(dictionary); }
 
-class ListFrame final : public Frame {
- public:
-  explicit ListFrame(ListRef source) : list(std::move(source)) {}
-
-  bool Advance() override {
-    if (index >= list.GetSize()) return false;
-    entry = list.GetEntry(index++);
-    return true;
-  }
-
-  const DataRef& Datum() const override { return entry; }
-
-  void Accept(orvane::value_t value) override {
-    array.push_back(std::move(value));
-    entry.Reset();
-  }
-
-  orvane::value_t Result() override { return orvane::value_t(array); }
-
- private:
-  ListRef list;
-  orvane::array_t array;
-  uint32_t index = 0;
-  DataRef entry;
-};
-
-class DictionaryFrame final : public Frame {
- public:
-  explicit DictionaryFrame(DictionaryRef source)
-      : dictionary(std::move(source)), keys(dictionary.CreateKeyList()) {}
-
-  bool Advance() override {
-    if (index >= keys.GetSize()) return false;
-    key = keys.GetEntry(index++);
+  // Goes on to the next datum, if there is one.
+  bool Advance() {
+    if (index >= items.GetSize()) return false;
+    datum = items.GetEntry(index++);
+    if (!IsDictionary()) return true;
+    key = std::exchange(datum, DataRef());
     keyToken = ExtractData<VRKToken>(key);
-    entry = dictionary.GetEntry(keyToken);
+    datum = dictionary.GetEntry(keyToken);
     return true;
   }
 
-  const DataRef& Datum() const override { return entry; }
+  const DataRef& Datum() const noexcept { return datum; }
 
-  void Accept(orvane::value_t value) override {
-    accepted.push_back({TokenName(keyToken), index, std::move(value)});
-    entry.Reset();
+  // Keeps the datum's value, and releases the datum.
+  void Accept(orvane::value_t value) {
+    const orvane::name_t name = IsDictionary() ? TokenName(keyToken) : orvane::name_t();
+    accepted.push_back({name, index, std::move(value)});
+    datum.Reset();
     key.Reset();
   }
 
-  // Puts each value at the result's end, where it need not make room for it.
-  orvane::value_t Result() override {
+  orvane::array_t Array() {
+    orvane::array_t array;
+    for (Accepted& each : accepted) array.push_back(std::move(each.value));
+    return array;
+  }
+
+  // Inserts in the order of the names, so that each pair goes to the result's end.
+  orvane::dictionary_t Dictionary() {
     std::ranges::sort(accepted, {},
                       [](const Accepted& each) { return std::pair(each.name, each.place); });
     orvane::dictionary_t result;
     for (const Accepted& each : accepted) result.insert_or_assign(each.name, each.value);
-    return orvane::value_t(result);
+    return result;
   }
 
  private:
   struct Accepted {
-    orvane::name_t name;
+    orvane::name_t name;  // empty in a list
     uint32_t place;
     orvane::value_t value;
   };
 
-  DictionaryRef dictionary;
-  ListRef keys;
-  std::vector<Accepted> accepted;
+  DataRef sourceData;
+  DataRef coercedData;
+  DictionaryRef dictionary;  // null for a list
+  ListRef items;             // the list, or the dictionary's keys
   uint32_t index = 0;
   DataRef key;
   VRKToken keyToken{};
-  DataRef entry;
+  DataRef datum;
+  std::vector<Accepted> accepted;
 };
 
 // Converts one thing and all that is nested in it, by a stack of frames.
@@ -121,7 +89,8 @@ class Conversion {
  public:
   // Begins with data, or with a list or dictionary itself.
   void Begin(const DataRef& datum);
-  void Enter(std::unique_ptr<Frame> frame);
+  template <class Ref>
+  Frame& Enter(Ref listOrDictionary);
 
   orvane::value_t Run();
 
@@ -129,7 +98,7 @@ class Conversion {
   void CountValue();
   std::string Counted(std::string text);
 
-  std::vector<std::unique_ptr<Frame>> frames;
+  std::vector<Frame> frames;
   std::optional<orvane::value_t> finished;  // what the innermost frame has to accept
   size_t valueCount = 0;
   uint64_t textBytes = 0;
@@ -156,11 +125,9 @@ void Conversion::Begin(const DataRef& datum) {
   } else if (becomes(kTypeToken)) {
     finished.emplace(TokenName(GetToken(coerced)));
   } else if (becomes(kTypeList)) {
-    Enter(std::make_unique<ListFrame>(GetList(coerced)));
-    frames.back()->Hold(std::move(source), std::move(coerced));
+    Enter(GetList(coerced)).Hold(std::move(source), std::move(coerced));
   } else if (becomes(kTypeDictionary)) {
-    Enter(std::make_unique<DictionaryFrame>(GetDictionary(coerced)));
-    frames.back()->Hold(std::move(source), std::move(coerced));
+    Enter(GetDictionary(coerced)).Hold(std::move(source), std::move(coerced));
   } else {
     throw std::domain_error("Attempt to convert unsupported data type in Varnel::AsValue");
   }
@@ -178,21 +145,23 @@ std::string Conversion::Counted(std::string text) {
   return text;
 }
 
-void Conversion::Enter(std::unique_ptr<Frame> frame) {
+template <class Ref>
+Frame& Conversion::Enter(Ref listOrDictionary) {
   if (frames.size() == kNestingLimit) {
     throw std::length_error("Lists and dictionaries are nested too deeply in Varnel::AsValue");
   }
-  frames.push_back(std::move(frame));
+  return frames.emplace_back(std::move(listOrDictionary));
 }
 
 orvane::value_t Conversion::Run() {
   while (!frames.empty()) {
-    Frame& frame = *frames.back();
+    Frame& frame = frames.back();
     if (finished) frame.Accept(*std::exchange(finished, std::nullopt));
     if (frame.Advance()) {
       Begin(frame.Datum());
     } else {
-      finished = frame.Result();
+      finished = frame.IsDictionary() ? orvane::value_t(frame.Dictionary())
+                                      : orvane::value_t(frame.Array());
       frames.pop_back();
     }
   }
@@ -209,14 +178,14 @@ orvane::value_t AsValue(const DataRef& source) {
 
 orvane::array_t AsArray(const ListRef& source) {
   Conversion conversion;
-  conversion.Enter(std::make_unique<ListFrame>(source));
+  conversion.Enter(source);
   return *conversion.Run().get_if<orvane::array_t>();
 }
 
 orvane::dictionary_t AsDictionary(const DictionaryRef& source) {
   if (!source) return {};
   Conversion conversion;
-  conversion.Enter(std::make_unique<DictionaryFrame>(source));
+  conversion.Enter(source);
   return *conversion.Run().get_if<orvane::dictionary_t>();
 }
 

@@ -52,8 +52,8 @@ void ThrowResultCode(uint32_t code) {
   throw Exception(code);
 }
 
-// The first clause that matches decides. All other standard exceptions give the same code as what
-// is no standard exception at all.
+// The first clause that matches decides. The three clauses before std::out_of_range matter to an
+// exception that is both.
 uint32_t ResultCodeFromException(VRKDictionary errorInfo) noexcept {
   try {
     throw;

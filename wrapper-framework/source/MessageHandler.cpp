@@ -111,20 +111,22 @@ void MessageHandler::Install(VRKObject newObject) {
   }
 }
 
-// HandleMessage may delete the handler, except when the object has died. A handler hears of its
-// object's death whatever goes wrong on the way, or it would be left behind on an object that is no
-// more.
+// HandleMessage may delete the handler, except when the object has died. ObjectDied is called even
+// if HandleMessage threw, or the handler would stay on a dead object; but not if HandleMessage
+// moved the handler to another object, whose registration must stay.
 VRKResult VRK_CALL MessageHandler::Callback(VRKObject receiver, VRKToken message,
                                             VRKDictionary parameters, void* context) {
   MessageHandler& handler = *static_cast<MessageHandler*>(context);
   if (Farewell::IsSaidBy(&handler)) return kResultNotHandled;
   RunningCall call(&handler);
+  const VRKMessageHandler served = handler.registration;
   const VRKResult handled = AtBoundary(parameters, [&] {
     const DictionaryRef held(parameters);
     const bool taken = handler.HandleMessage(receiver, message, held);
     return taken ? kResultNoError : kResultNotHandled;
   });
-  if (message != gObjectDied) return handled;
+  if (message != gObjectDied || call.handler == nullptr) return handled;
+  if (handler.object != receiver || handler.registration != served) return handled;
   return AtBoundary(parameters, [&] {
     handler.ObjectDied();
     return handled;

@@ -11,7 +11,7 @@ namespace Varnel {
 
 StringTranslatorFactory::StringTranslatorFactory(Creator translatorCreator,
                                                  orvane::name_t servedClass)
-    : creator(std::move(translatorCreator)) {
+    : StringTranslatorCreatorHolder{std::move(translatorCreator)} {
   Register(MakeToken(servedClass), 0);
 }
 

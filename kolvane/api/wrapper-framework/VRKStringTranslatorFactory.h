@@ -11,12 +11,20 @@
 
 namespace Varnel {
 
-// Lives in kernel memory. Gives each new object a handler that lives with it, and the translator
-// that its creator makes of the object's creation parameters. Knows neither of them afterwards.
-class StringTranslatorFactory : public ObjectFactory {
+// Makes the translator for a new object from the object's creation parameters.
+using StringTranslatorCreator =
+    boost::function<boost::shared_ptr<StringTranslatorInterface>(orvane::dictionary_t const&)>;
+
+// A base, so that the creator is destroyed only after the factory was unregistered.
+struct StringTranslatorCreatorHolder {
+  StringTranslatorCreator creator;
+};
+
+// Lives in kernel memory. Gives each new object a translator, which its creator makes, and a
+// handler that lives as long as the object. Keeps no reference to either.
+class StringTranslatorFactory : private StringTranslatorCreatorHolder, public ObjectFactory {
  public:
-  using Creator =
-      boost::function<boost::shared_ptr<StringTranslatorInterface>(orvane::dictionary_t const&)>;
+  using Creator = StringTranslatorCreator;
 
   // Serves the class from now on. Throws the kernel's failures; std::bad_alloc.
   StringTranslatorFactory(Creator translatorCreator, orvane::name_t servedClass);
@@ -24,9 +32,6 @@ class StringTranslatorFactory : public ObjectFactory {
   // What it throws, and what the creator throws, becomes the result of the object's creation.
   void InitializeObject(VRKToken objectClass, const DictionaryRef& parameters,
                         const ObjectRef& newObject) override;
-
- private:
-  Creator creator;
 };
 
 }  // namespace Varnel

@@ -7,6 +7,7 @@
 
 #include "Data.h"
 #include "Exceptions.h"
+#include "Farewell.h"
 #include "ReportedCheck.h"
 #include "ResultCodes.h"
 #include "Tokens.h"
@@ -59,6 +60,11 @@ std::string KeyText(DataRef& translationKey) {
 StringTranslatorHandler::StringTranslatorHandler(
     boost::shared_ptr<StringTranslatorInterface> servingTranslator)
     : MessageHandler({}, false), translator(std::move(servingTranslator)) {}
+
+StringTranslatorHandler::~StringTranslatorHandler() {
+  const Farewell farewell(this);
+  translator.reset();
+}
 
 void StringTranslatorHandler::SetObject(VRKObject newObject) {
   MessageHandler::SetObject(newObject);

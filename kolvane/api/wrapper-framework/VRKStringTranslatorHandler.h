@@ -15,6 +15,10 @@ class StringTranslatorHandler : public MessageHandler {
   // Attached to no object yet.
   explicit StringTranslatorHandler(boost::shared_ptr<StringTranslatorInterface> servingTranslator);
 
+  // Releases the translator, then ends the registration. Messages that arrive meanwhile are not
+  // handled.
+  ~StringTranslatorHandler() override;
+
   // Attaches the handler to an object and asks for the three messages of a translator. When asking
   // fails, the handler stays attached.
   void SetObject(VRKObject newObject) override;

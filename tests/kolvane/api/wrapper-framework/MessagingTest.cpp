@@ -194,6 +194,32 @@ TEST_F(MessagingTest, FactoriesMayGoWhileParametersAreConverted) {
   EXPECT_EQ(translator->heard, "default");
 }
 
+// What a factory's creator or a handler's translator owns may use the kernel as it is destroyed.
+TEST_F(MessagingTest, ServeNoOneWhileTheyAreDestroyed) {
+  const orvane::name_t name("class:test");
+  std::vector<VRKResult> results;
+  const auto whenDestroyed = [&results](auto ask) {
+    return boost::shared_ptr<void>(nullptr, [&results, ask](auto) { results.push_back(CodeOf(ask)); });
+  };
+  auto creator = [this, state = whenDestroyed([&] { ObjectRef().Create(MakeToken(name), {}); })](auto&) { return translator; };
+  auto other = std::make_unique<StringTranslatorFactory>(std::move(creator), name);
+  ObjectRef object;
+  object.Create(MakeToken(name), {});
+  other.reset();
+  EXPECT_EQ(results, std::vector<VRKResult>{kVRKNotFound});
+
+  results.clear();
+  ObjectRef plain;
+  plain.Create({}, {});
+  struct AskingTranslator : NotingTranslator {
+    explicit AskingTranslator(boost::shared_ptr<void> whenDestroyed) : state(std::move(whenDestroyed)) {}
+    boost::shared_ptr<void> state;
+  };
+  const auto ask = [&] { ThrowIfFailed(Send(plain.Get(), kMessageMakeDefault)); };
+  StringTranslatorHandler(boost::make_shared<AskingTranslator>(whenDestroyed(ask))).SetObject(plain.Get());
+  EXPECT_EQ(results, std::vector<VRKResult>{kVRKNotHandled});
+}
+
 TEST(TranslationImage, HoldsEveryByte) {
   const Units expected[] = {{}, {0x0001}, {0x0201}, {0x0201, 0x00FF}, {0x0201, 0x04FF}, {0x0201, 0x04FF, 0x0005}};
   for (uint32_t count = 0; count < std::size(expected); ++count) {
