@@ -1,4 +1,4 @@
-// What the kernel keeps of a callback, and what it knows of those that are running.
+// Registered callbacks, and the stack of those that are running.
 #pragma once
 
 #include <cstdint>
@@ -7,7 +7,7 @@
 
 namespace varnel_kernel {
 
-// Two callbacks are the same when both their function and their context are.
+// Identified by the pair of function and context.
 template <class Function>
 struct Callback {
   Function function;
@@ -16,34 +16,33 @@ struct Callback {
   bool operator==(const Callback&) const = default;
 };
 
-// Code that the kernel has called and that has not returned yet: a chain through the stack, from
-// the innermost call outwards.
-class RunningCode {
+// One call out of the kernel that has not returned yet. The objects form a stack, linked from the
+// innermost call outwards; they live on the C++ stack.
+class ActiveCallback {
  public:
   template <class Function>
-  RunningCode(RunningCode*& innermostCode, Function function) noexcept
+  ActiveCallback(ActiveCallback*& innermostCode, Function function) noexcept
       : innermost(innermostCode), outer(innermostCode), address(reinterpret_cast<void*>(function)) {
     innermost = this;
   }
-  ~RunningCode() { innermost = outer; }
-  RunningCode(const RunningCode&) = delete;
-  RunningCode& operator=(const RunningCode&) = delete;
+  ~ActiveCallback() { innermost = outer; }
+  ActiveCallback(const ActiveCallback&) = delete;
+  ActiveCallback& operator=(const ActiveCallback&) = delete;
 
-  const RunningCode* Outer() const noexcept { return outer; }
+  const ActiveCallback* Outer() const noexcept { return outer; }
   const void* Address() const noexcept { return address; }
 
  private:
-  RunningCode*& innermost;
-  RunningCode* outer;
+  ActiveCallback*& innermost;
+  ActiveCallback* outer;
   const void* address;
 };
 
-// Calls code that is not the kernel's own. Should it throw, which it must not, `onThrow` is the
-// result.
+// Calls code outside the kernel. Returns `onThrow` if that code throws, which its contract forbids.
 template <class Result, class Function, class... Arguments>
-Result CallOut(RunningCode*& innermost, Result onThrow, Function function,
+Result CallOut(ActiveCallback*& innermost, Result onThrow, Function function,
                Arguments... arguments) noexcept {
-  const RunningCode code(innermost, function);
+  const ActiveCallback code(innermost, function);
   try {
     return function(arguments...);
   } catch (...) {

@@ -8,7 +8,7 @@
 namespace varnel_kernel {
 namespace {
 
-// Keeps data alive while callbacks may release it.
+// Holds a reference to data while callbacks run that may release theirs.
 class HeldData {
  public:
   HeldData(Values& valueStore, VRKData heldData) noexcept : values(valueStore), data(heldData) {
@@ -26,7 +26,7 @@ class HeldData {
 }  // namespace
 
 Coercions::Coercions(HandleTable& handleTable, TokenTable& tokenTable, Values& valueStore,
-                     RunningCode*& innermostCode)
+                     ActiveCallback*& innermostCode)
     : handles(handleTable),
       tokens(tokenTable),
       values(valueStore),
@@ -51,7 +51,8 @@ VRKResult Coercions::Convert(VRKData data, VRKToken fromType, VRKToken toType, V
     if (result != kVRKCannotCoerce) return result;
   }
   Data* const source = handles.Find<Data>(data);
-  if (source == nullptr) return kVRKInvalidHandle;  // a callback released more than was its own
+  if (source == nullptr)
+    return kVRKInvalidHandle;  // a callback released references that it did not own
   std::unique_ptr<Data> coerced = texts.Coerce(*source, toType);
   if (coerced == nullptr) return kVRKCannotCoerce;
   outData = handles.Add(std::move(coerced));

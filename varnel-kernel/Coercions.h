@@ -1,4 +1,4 @@
-// Turning data of one type into another.
+// Coercion of data from one type to another.
 #pragma once
 
 #include <cstdint>
@@ -17,16 +17,18 @@ struct Coercion {
   VRKToken fromType;
   VRKToken toType;
   Callback<VRKDataCoercionCallback> callback;
-  uint64_t number;  // grows from one installation to the next
+  uint64_t number;  // increases with each installation
 };
 
-// Data of the type asked for stays as it is; else the handlers installed for the pair are asked,
-// latest first, and last the kernel's own coercion between texts. Handles may be any 32 bits; outs
-// are not null. Callbacks may install and remove handlers while they run.
+// Data that already has the target type is returned as it is. Otherwise the handlers installed for
+// the pair of types are tried, latest first, then the built-in coercion between text types.
+//
+// Handles may be any 32 bits. Callbacks may install and remove handlers while they run.
+// Requires: outs are not null.
 class Coercions {
  public:
   Coercions(HandleTable& handleTable, TokenTable& tokenTable, Values& valueStore,
-            RunningCode*& innermostCode);
+            ActiveCallback*& innermostCode);
 
   VRKResult Coerce(VRKData data, VRKToken toType, VRKData& outData);
   VRKResult Install(VRKToken fromType, VRKToken toType, Callback<VRKDataCoercionCallback> callback);
@@ -44,7 +46,7 @@ class Coercions {
   HandleTable& handles;
   TokenTable& tokens;
   Values& values;
-  RunningCode*& running;
+  ActiveCallback*& running;
   TextCoercion texts;
   std::vector<Coercion> installed;  // in the order of installation
   uint64_t nextNumber = 0;

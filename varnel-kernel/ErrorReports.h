@@ -1,4 +1,4 @@
-// Checks that failed, and who is told of them.
+// Forwards reports of failed checks to the installed reporter.
 #pragma once
 
 #include <cstdint>
@@ -10,20 +10,19 @@ namespace varnel_kernel {
 
 class ErrorReports {
  public:
-  explicit ErrorReports(RunningCode*& innermostCode) : running(innermostCode) {}
+  explicit ErrorReports(ActiveCallback*& innermostCode) : running(innermostCode) {}
 
-  // Null for the kernel's own reporter, which prints a report on standard error, once for each
-  // site.
+  // Null restores the kernel's own reporter, which prints each failed check once on standard error.
   void Set(VRKHostErrorReporter newReporter, void* newContext) noexcept;
   VRKHostErrorReporter Reporter() const noexcept { return reporter; }
 
-  // Returns what the reporter returns.
+  // Returns the reporter's result.
   uint32_t Report(uint32_t severity, const char* domain, const char* expression,
                   const char* sourceFile, uint32_t line, const char* function,
                   uint32_t* onceFlag) noexcept;
 
  private:
-  RunningCode*& running;
+  ActiveCallback*& running;
   VRKHostErrorReporter reporter = nullptr;
   void* context = nullptr;
 };

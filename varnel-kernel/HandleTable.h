@@ -1,4 +1,4 @@
-// The kernel's handles: small integers that name what lives, and never what has lived.
+// Maps handles to items: slot index plus generation, so that stale handles are rejected.
 #pragma once
 
 #include <array>
@@ -12,8 +12,8 @@ namespace varnel_kernel {
 enum class Kind : uint8_t { kNone, kObject, kMessageHandler, kData, kList, kDictionary, kPlugIn };
 inline constexpr size_t kKindCount = 7;
 
-// What a handle stands for. A class of items says of what kind its handles are (`kKind`) and which
-// type they have (`Handle`, an enumeration of 32 bits).
+// The base of everything that has a handle. Each derived class defines `kKind`, the kind of its
+// handles, and `Handle`, their type (a 32-bit enumeration).
 struct Item {
   Item() = default;
   Item(const Item&) = delete;
@@ -21,29 +21,29 @@ struct Item {
   virtual ~Item() = default;
 };
 
-// Owns its items. A handle is the index of a slot and the number of times that the slot has been
-// emptied; an emptied slot is not filled again before a thousand others have been, so that a stale
-// handle is found out for at least a million handles. Every operation takes any 32 bits for a
-// handle.
+// Owns its items. Any 32 bits may be passed as a handle; those of no item are rejected. A pointer
+// to an item is valid until the item is removed. Only Add allocates; it takes constant time.
 //
-// Nothing but Add allocates, and Add takes constant time. Pointers to items stay valid until the
-// item is removed.
+// A handle is a slot's index and the slot's generation (10 bits), which increases when its item is
+// removed. A freed slot queues behind 1,024 others before it is reused, so a stale handle is
+// rejected for at least a million further handles.
 class HandleTable {
  public:
-  // With a count of 1. Throws std::bad_alloc when there is no memory, or no handle left.
+  // Adds an item with a reference count of 1. Throws: std::bad_alloc if memory or handles run out.
   template <class Kept>
   typename Kept::Handle Add(std::unique_ptr<Kept> item) {
     return typename Kept::Handle{AddItem(std::move(item), Kept::kKind)};
   }
 
-  // Null for a handle that stands for no item of this class.
+  // Returns null if the handle is not that of an item of this class.
   template <class Kept>
   Kept* Find(typename Kept::Handle handle) const noexcept {
     const Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Kept::kKind);
     return slot != nullptr ? static_cast<Kept*>(slot->item.get()) : nullptr;
   }
 
-  // Adds 1 to the count and returns whether the handle stands for an item of this class.
+  // Increments the reference count. Returns false if the handle is not that of an item of this
+  // class.
   template <class Kept>
   bool Retain(typename Kept::Handle handle) noexcept {
     Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Kept::kKind);
@@ -51,23 +51,23 @@ class HandleTable {
     return slot != nullptr;
   }
 
-  // Takes 1 from the count of an item that exists and returns what is left. The item stays; a count
-  // of 0 stays 0.
+  // Decrements the reference count, unless it is 0, and returns it. Does not remove the item.
+  // Requires: the handle is that of an item of this class.
   template <class Kept>
   uint64_t Release(typename Kept::Handle handle) noexcept {
     Slot* const slot = SlotOf(static_cast<uint32_t>(handle), Kept::kKind);
     return slot->count == 0 ? 0 : --slot->count;
   }
 
-  // Ends the handle and hands its item over; null for a handle that stands for no item of this
-  // class.
+  // Invalidates the handle and returns its item, or null if the handle is not that of an item of
+  // this class.
   template <class Kept>
   std::unique_ptr<Kept> Remove(typename Kept::Handle handle) noexcept {
     std::unique_ptr<Item> item = RemoveItem(static_cast<uint32_t>(handle), Kept::kKind);
     return std::unique_ptr<Kept>(static_cast<Kept*>(item.release()));
   }
 
-  // Calls `visit` with the handle and the item of each item of this class.
+  // Calls `visit(handle, item)` for each item of this class.
   template <class Kept, class Visit>
   void ForEach(Visit visit) const {
     for (uint32_t index = 1; index < slotCount; ++index) {
@@ -80,7 +80,7 @@ class HandleTable {
 
   uint32_t Live(Kind kind) const noexcept { return live[static_cast<size_t>(kind)]; }
 
-  // Ends every handle and destroys every item.
+  // Invalidates every handle and destroys every item.
   void Clear() noexcept;
 
  private:

@@ -1,4 +1,4 @@
-// The process's one kernel, and the way that every call takes into it.
+// The one kernel of the process, and the entry path of every call: lock, state, trace, error guard.
 #pragma once
 
 #include <array>
@@ -19,18 +19,18 @@
 
 namespace varnel_kernel {
 
-// The parts, in the order in which they stand on each other. Tokens, and the number of times that a
-// handle's slot was used, outlive a shut-down: code that was loaded before it keeps both.
+// Owns the kernel's parts, each of which uses only those declared before it. A shut-down keeps
+// tokens and the generations of handles, because code that is still loaded may hold either.
 class Kernel {
  public:
-  // Builds the kernel at its first start. It is never destroyed: libraries may call into it until
-  // the process's last moment.
+  // Creates the kernel on the first call. It is never destroyed, because libraries may call it
+  // until the process ends.
   static VRKResult Start();
 
   VRKResult ShutDown(VRKHostLiveCounts* outLive) noexcept;
   VRKHostLiveCounts LiveCounts() const noexcept;
 
-  // Held by whoever uses what follows.
+  // Guards everything below.
   static inline std::recursive_mutex mutex;
   static inline Kernel* built = nullptr;
 
@@ -38,7 +38,7 @@ class Kernel {
     return built != nullptr && built->isRunning ? built : nullptr;
   }
 
-  RunningCode* innermostCode = nullptr;
+  ActiveCallback* innermostCode = nullptr;
   uint32_t memoryBlocks = 0;
   Trace trace{innermostCode};
   ErrorReports reports{innermostCode};
@@ -54,14 +54,14 @@ class Kernel {
   bool isRunning = false;
 };
 
-// No exception gets out. The kernel has none but those of memory that ran out.
+// Turns exceptions into result codes. The kernel itself throws only when memory runs out.
 template <class Body>
-VRKResult Guarded(Body body) noexcept {
+VRKResult CatchAll(Body body) noexcept {
   try {
     return body();
   } catch (const std::bad_alloc&) {
     return kVRKOutOfMemory;
-  } catch (const std::length_error&) {  // a vector that 32 bits cannot address
+  } catch (const std::length_error&) {  // a vector beyond the address space
     return kVRKOutOfMemory;
   }
 }
@@ -81,7 +81,7 @@ template <class Body, class... Arguments>
 VRKResult RunTraced(Kernel* kernel, const char* operation, Body body,
                     Arguments... arguments) noexcept {
   if (kernel == nullptr) return kVRKNotRunning;
-  const auto run = [&] { return Guarded([&] { return body(*kernel); }); };
+  const auto run = [&] { return CatchAll([&] { return body(*kernel); }); };
   return kernel->trace.IsOn() ? Traced(kernel->trace, operation, run, arguments...) : run();
 }
 

@@ -6,15 +6,15 @@
 
 namespace varnel_kernel {
 
-// A walk over an object's handlers, latest first. Handlers that are removed meanwhile leave stale
-// handles behind, which are passed over and swept out when the last walk ends; handlers that are
-// installed meanwhile are not met.
+// Re-entrant iteration over an object's handlers, newest first. Handlers removed meanwhile leave
+// stale handles, which are skipped and purged when the outermost iteration ends. Handlers installed
+// meanwhile are not visited.
 class Objects::Delivery {
  public:
-  Delivery(HandleTable& handleTable, Object& walkedObject, bool tellsOfDeath) noexcept
+  Delivery(HandleTable& handleTable, Object& walkedObject, bool deliversObjectDied) noexcept
       : handles(handleTable),
         object(walkedObject),
-        ofDeath(tellsOfDeath),
+        isObjectDied(deliversObjectDied),
         left(walkedObject.handlers.size()) {
     ++object.deliveries;
   }
@@ -28,12 +28,12 @@ class Objects::Delivery {
   Delivery(const Delivery&) = delete;
   Delivery& operator=(const Delivery&) = delete;
 
-  // The next handler that is there still and asked for the message, or null at the end.
+  // Returns the next live handler that asked for the message, or null at the end.
   VRKMessageHandler Next(VRKToken message) noexcept {
     while (left > 0) {
       const VRKMessageHandler registration = object.handlers[--left];
       const MessageHandler* const handler = handles.Find<MessageHandler>(registration);
-      if (handler == nullptr || (ofDeath && handler->isToldOfDeath)) continue;
+      if (handler == nullptr || (isObjectDied && handler->hasReceivedObjectDied)) continue;
       if (handler->messages.contains(message)) return registration;
     }
     return VRKMessageHandler{};
@@ -42,12 +42,12 @@ class Objects::Delivery {
  private:
   HandleTable& handles;
   Object& object;
-  const bool ofDeath;
+  const bool isObjectDied;
   size_t left;
 };
 
 Objects::Objects(HandleTable& handleTable, TokenTable& tokenTable, Values& valueStore,
-                 RunningCode*& innermostCode)
+                 ActiveCallback*& innermostCode)
     : handles(handleTable),
       tokens(tokenTable),
       values(valueStore),
@@ -106,7 +106,7 @@ VRKResult Objects::Deliver(VRKObject object, VRKToken message, VRKDictionary par
 VRKResult Objects::Call(VRKMessageHandler registration, VRKObject object, VRKToken message,
                         VRKDictionary parameters) {
   MessageHandler& handler = *handles.Find<MessageHandler>(registration);
-  if (message == objectDied) handler.isToldOfDeath = true;
+  if (message == objectDied) handler.hasReceivedObjectDied = true;
   const auto callback = handler.callback;
   const VRKResult result = CallOut(running, kVRKCallbackThrew, callback.function, object, message,
                                    parameters, callback.context);
@@ -119,20 +119,20 @@ VRKResult Objects::Retain(VRKObject object) noexcept {
   return handles.Retain<Object>(object) ? kVRKNoError : kVRKInvalidHandle;
 }
 
-// A delivery holds a reference, so an object whose handlers release more than is theirs dies with
-// the delivery's own release.
+// A running delivery holds a reference. If handlers release references that they do not own, the
+// object dies with the delivery's own release.
 VRKResult Objects::Release(VRKObject object) {
   if (object == VRKObject{}) return kVRKNoError;
   const Object* const found = handles.Find<Object>(object);
   if (found == nullptr) return kVRKInvalidHandle;
   const bool isLast = handles.Release<Object>(object) == 0;
-  if (isLast && found->deliveries == 0) Die(object);
+  if (isLast && found->deliveries == 0) FinalizeObject(object);
   return kVRKNoError;
 }
 
-// References that handlers take to a dying object do not bring it back: once they all have been
-// told, in a delivery too, its handle is stale.
-void Objects::Die(VRKObject object) {
+// References that handlers take to a dying object do not keep it alive: its handle is stale once
+// all handlers have received object-died.
+void Objects::FinalizeObject(VRKObject object) {
   Object& dying = *handles.Find<Object>(object);
   dying.isDying = true;
   {
@@ -187,7 +187,7 @@ VRKResult Objects::AddMessages(VRKMessageHandler registration, const VRKToken* m
   if (!std::all_of(messages, messages + count, [&](VRKToken each) { return tokens.Holds(each); })) {
     return kVRKInvalidHandle;
   }
-  handler->messages.reserve(handler->messages.size() + count);  // all that can throw
+  handler->messages.reserve(handler->messages.size() + count);  // the only statement that throws
   handler->messages.insert(messages, messages + count);
   return kVRKNoError;
 }

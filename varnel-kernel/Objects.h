@@ -1,4 +1,4 @@
-// Objects, the handlers attached to them, and the factories that make them.
+// Objects, their message handlers, and the factories that create them.
 #pragma once
 
 #include <boost/unordered/unordered_flat_set.hpp>
@@ -20,10 +20,9 @@ struct Object final : Item {
   explicit Object(VRKToken token) : objectClass(token) {}
 
   const VRKToken objectClass;
-  std::vector<VRKMessageHandler>
-      handlers;                   // in the order of installation; stale ones may stand there
-  uint32_t deliveries = 0;        // that walk the handlers now
-  bool hasStaleHandlers = false;  // removed during a delivery
+  std::vector<VRKMessageHandler> handlers;  // in order of installation; may contain stale handles
+  uint32_t deliveries = 0;                  // running ones, which iterate over `handlers`
+  bool hasStaleHandlers = false;            // removed during a delivery
   bool isDying = false;
 };
 
@@ -37,7 +36,7 @@ struct MessageHandler final : Item {
   const VRKObject object;
   const Callback<VRKMessageHandlerCallback> callback;
   boost::unordered_flat_set<VRKToken> messages;
-  bool isToldOfDeath = false;  // of its object's; it is told once
+  bool hasReceivedObjectDied = false;  // the message is delivered to it once
 };
 
 struct Factory {
@@ -45,12 +44,12 @@ struct Factory {
   Callback<VRKObjectFactoryCallback> callback;
 };
 
-// The operations on them. Handles may be any 32 bits; outs are not null. Callbacks may do anything
-// that the kernel offers while they run, to what they run for too.
+// Handles may be any 32 bits. Callbacks may call any kernel operation while they run, also on the
+// object, handler or factory that they run for. Requires: outs are not null.
 class Objects {
  public:
   Objects(HandleTable& handleTable, TokenTable& tokenTable, Values& valueStore,
-          RunningCode*& innermostCode);
+          ActiveCallback*& innermostCode);
 
   VRKResult Create(VRKToken objectClass, VRKDictionary parameters, VRKObject& outObject);
   VRKResult Deliver(VRKObject object, VRKToken message, VRKDictionary parameters);
@@ -75,14 +74,14 @@ class Objects {
   VRKResult CreateThrough(const Factory& factory, VRKDictionary parameters, VRKObject& outObject);
   VRKResult Call(VRKMessageHandler registration, VRKObject object, VRKToken message,
                  VRKDictionary parameters);
-  void Die(VRKObject object);
+  void FinalizeObject(VRKObject object);
 
   HandleTable& handles;
   TokenTable& tokens;
   Values& values;
-  RunningCode*& running;
+  ActiveCallback*& running;
   const VRKToken objectDied;
-  std::vector<Factory> factories;  // in the order of registration
+  std::vector<Factory> factories;  // in order of registration
 };
 
 }  // namespace varnel_kernel

@@ -36,7 +36,7 @@ std::unique_ptr<PlugIn> FindPlugIn(platform::SharedLibrary library, const char* 
 
 PlugIns::PlugIns(HandleTable& handleTable, Objects& objectStore, Coercions& coercionStore,
                  const Trace& hostTrace, const ErrorReports& hostReports,
-                 RunningCode*& innermostCode)
+                 ActiveCallback*& innermostCode)
     : handles(handleTable),
       objects(objectStore),
       coercions(coercionStore),
@@ -62,9 +62,9 @@ VRKResult PlugIns::Terminate(VRKPlugIn plugIn) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
   if (IsRunning(found->addresses)) return kVRKInUse;
-  const RunningCode code(running, found->terminate);  // until its objects are released, too
+  const ActiveCallback terminating(running, found->terminate);  // also while objects are released
   const VRKResult result = CallOut(running, kVRKCallbackThrew, found->terminate, 0u);
-  ReleaseKept(*found, 0);
+  ReleaseRetained(*found, 0);
   return result;
 }
 
@@ -75,41 +75,42 @@ VRKResult PlugIns::Version(VRKPlugIn plugIn, uint32_t& outVersion) {
   return kVRKNoError;
 }
 
-// What serves others would be missed by them, so it is looked for before anything is given up. Kept
-// objects are released before handlers are looked for, which may end with them; whoever is told of
-// their death cannot unload the library meanwhile, and may install something else.
+// Registrations are checked first, while nothing is lost by refusing. Retained objects are released
+// before handlers are checked, because their handlers end with them. Code that runs meanwhile
+// cannot unload the library, but may register something, so registrations are checked again.
 VRKResult PlugIns::Remove(VRKPlugIn plugIn, platform::SharedLibrary& outLibrary) {
   PlugIn* const found = handles.Find<PlugIn>(plugIn);
   if (found == nullptr) return kVRKInvalidHandle;
   const platform::AddressRange& code = found->addresses;
-  if (IsRunning(code) || ServesOthers(code)) return kVRKInUse;
+  if (IsRunning(code) || HasRegistrations(code)) return kVRKInUse;
   {
-    const RunningCode releasing(running, found->initialize);
-    ReleaseKept(*found, 0);
+    const ActiveCallback releasing(running, found->initialize);
+    ReleaseRetained(*found, 0);
   }
-  const bool isNeeded = ServesOthers(code) || HandlesMessages(code) || !found->kept.empty();
+  const bool isNeeded =
+      HasRegistrations(code) || HandlesMessages(code) || !found->retainedObjects.empty();
   if (isNeeded) return kVRKInUse;
   outLibrary = found->library;
   handles.Remove<PlugIn>(plugIn);
   return kVRKNoError;
 }
 
-// What a factory made on the way to an object that it then failed to make is not kept.
+// If a creation fails, the objects that its factory created on the way are not retained.
 VRKResult PlugIns::CreateObject(VRKToken objectClass, VRKDictionary parameters,
                                 VRKObject& outObject) {
   PlugIn* const keeper = initialising;
   if (keeper == nullptr) return objects.Create(objectClass, parameters, outObject);
-  const size_t keptBefore = keeper->kept.size();
+  const size_t keptBefore = keeper->retainedObjects.size();
   VRKObject object{};
   const VRKResult result = objects.Create(objectClass, parameters, object);
   if (result != kVRKNoError) {
-    ReleaseKept(*keeper, keptBefore);
+    ReleaseRetained(*keeper, keptBefore);
     return result;
   }
   try {
-    keeper->kept.push_back(object);
+    keeper->retainedObjects.push_back(object);
   } catch (...) {
-    ReleaseKept(*keeper, keptBefore);
+    ReleaseRetained(*keeper, keptBefore);
     objects.Release(object);
     throw;
   }
@@ -124,17 +125,17 @@ bool PlugIns::MustStay(platform::SharedLibrary library,
   handles.ForEach<PlugIn>(
       [&](VRKPlugIn, const PlugIn& plugIn) { isKept = isKept || plugIn.library == library; });
   if (isKept) return false;
-  return IsRunning(addresses) || ServesOthers(addresses) || HandlesMessages(addresses);
+  return IsRunning(addresses) || HasRegistrations(addresses) || HandlesMessages(addresses);
 }
 
 bool PlugIns::IsRunning(const platform::AddressRange& code) const noexcept {
-  for (const RunningCode* each = running; each != nullptr; each = each->Outer()) {
+  for (const ActiveCallback* each = running; each != nullptr; each = each->Outer()) {
     if (code.Contains(each->Address())) return true;
   }
   return false;
 }
 
-bool PlugIns::ServesOthers(const platform::AddressRange& code) const noexcept {
+bool PlugIns::HasRegistrations(const platform::AddressRange& code) const noexcept {
   const auto isIn = [&](const auto& each) { return IsIn(code, each.callback.function); };
   const auto& factories = objects.Factories();
   const auto& installed = coercions.Installed();
@@ -151,10 +152,10 @@ bool PlugIns::HandlesMessages(const platform::AddressRange& code) const noexcept
   return any;
 }
 
-void PlugIns::ReleaseKept(PlugIn& plugIn, size_t from) {
-  while (plugIn.kept.size() > from) {
-    const VRKObject object = plugIn.kept.back();
-    plugIn.kept.pop_back();
+void PlugIns::ReleaseRetained(PlugIn& plugIn, size_t from) {
+  while (plugIn.retainedObjects.size() > from) {
+    const VRKObject object = plugIn.retainedObjects.back();
+    plugIn.retainedObjects.pop_back();
     objects.Release(object);
   }
 }

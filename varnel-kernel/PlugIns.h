@@ -1,4 +1,4 @@
-// The libraries that extend the kernel.
+// Plug-ins: libraries that the host loads into the kernel.
 #pragma once
 
 #include <memory>
@@ -25,50 +25,51 @@ struct PlugIn final : Item {
   VRKResult(VRK_CALL* initialize)(uint32_t reserved);
   VRKResult(VRK_CALL* terminate)(uint32_t reserved);
   uint32_t(VRK_CALL* version)();
-  std::vector<VRKObject> kept;  // a reference to each object that came into being at initialisation
+  std::vector<VRKObject>
+      retainedObjects;  // owned references to the objects created while it initialised
 };
 
-// Looks up the entry points of a loaded library, which stays the caller's. Null if one is missing;
-// `reason` then names it. Throws std::bad_alloc. Asks the system's loader, so the kernel's lock
-// must not be held.
+// Looks up the entry points of a loaded library, which the caller still owns. Returns null and sets
+// `reason` if one is missing. Requires: the kernel's lock is not held, because the lookup takes the
+// system's loader lock. Throws: std::bad_alloc.
 std::unique_ptr<PlugIn> FindPlugIn(platform::SharedLibrary library, const char* prefix,
                                    std::string& reason);
 
-// The operations on them. Handles may be any 32 bits; outs are not null.
+// Handles may be any 32 bits. Requires: outs are not null.
 class PlugIns {
  public:
   PlugIns(HandleTable& handleTable, Objects& objectStore, Coercions& coercionStore,
-          const Trace& hostTrace, const ErrorReports& hostReports, RunningCode*& innermostCode);
+          const Trace& hostTrace, const ErrorReports& hostReports, ActiveCallback*& innermostCode);
 
   VRKPlugIn Add(std::unique_ptr<PlugIn> plugIn);
   VRKResult Initialize(VRKPlugIn plugIn);
   VRKResult Terminate(VRKPlugIn plugIn);
   VRKResult Version(VRKPlugIn plugIn, uint32_t& outVersion);
 
-  // Ends the plug-in, whose library is then to be unloaded.
+  // Removes the plug-in. The caller then unloads its library, without the kernel's lock.
   VRKResult Remove(VRKPlugIn plugIn, platform::SharedLibrary& outLibrary);
 
-  // Whether a library that did not become a plug-in must stay loaded: its code runs, or is
+  // Whether a library that was refused as a plug-in must stay loaded: its code is running or
   // installed as a callback, and no plug-in keeps it loaded.
   bool MustStay(platform::SharedLibrary library,
                 const platform::AddressRange& addresses) const noexcept;
 
-  // Objects::Create, and keeps the object for the plug-in that is being initialised, if one is.
+  // Objects::Create, and retains the object for the plug-in that is being initialised, if any.
   VRKResult CreateObject(VRKToken objectClass, VRKDictionary parameters, VRKObject& outObject);
 
  private:
   bool IsRunning(const platform::AddressRange& code) const noexcept;
-  bool ServesOthers(const platform::AddressRange& code) const noexcept;
+  bool HasRegistrations(const platform::AddressRange& code) const noexcept;
   bool HandlesMessages(const platform::AddressRange& code) const noexcept;
 
-  void ReleaseKept(PlugIn& plugIn, size_t from);
+  void ReleaseRetained(PlugIn& plugIn, size_t from);
 
   HandleTable& handles;
   Objects& objects;
   Coercions& coercions;
   const Trace& trace;
   const ErrorReports& reports;
-  RunningCode*& running;
+  ActiveCallback*& running;
   PlugIn* initialising = nullptr;
 };
 

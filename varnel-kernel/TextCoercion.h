@@ -1,4 +1,4 @@
-// The coercions that the kernel has built in: between its four types of text.
+// The built-in coercions, between the four text types.
 #pragma once
 
 #include <memory>
@@ -9,17 +9,19 @@
 
 namespace varnel_kernel {
 
-// "type:orvane.vrk.utf8", "…utf16le", "…utf16be" and "…utf16". Malformed and unpaired input becomes
-// U+FFFD, as does half a unit at the end. A byte-order mark at the head of utf8 or utf16 text is
-// consumed, and tells the byte order of the latter, which is little-endian without one; data
-// produced as utf16 is little-endian and begins with the mark. In the other two types a mark is a
-// character.
+// Types: "type:orvane.vrk.utf8", "…utf16le", "…utf16be" and "…utf16".
+//
+// - Malformed UTF-8, an unpaired surrogate and an odd last byte each become U+FFFD.
+// - A byte-order mark at the start of utf8 and utf16 text is consumed. For utf16 it selects the
+// byte
+//   order, which is little-endian without one. In utf16le and utf16be it is a character.
+// - utf16 data is produced in little-endian order with a byte-order mark.
 class TextCoercion {
  public:
   explicit TextCoercion(TokenTable& tokens);
 
-  // Null when one of the types is no text. Throws std::bad_alloc, also for a text that is too long
-  // to be converted (2^31 bytes or units).
+  // Returns null if one of the types is not a text type. Throws: std::bad_alloc, also for a text of
+  // 2^31 bytes or units or more.
   std::unique_ptr<Data> Coerce(Data& source, VRKToken toType) const;
 
  private:

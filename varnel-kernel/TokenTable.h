@@ -1,4 +1,4 @@
-// The kernel's tokens: texts as small integers.
+// Interned texts: each distinct text has a token, a small integer.
 #pragma once
 
 #include <boost/unordered/unordered_flat_map.hpp>
@@ -11,16 +11,16 @@
 
 namespace varnel_kernel {
 
-// Keeps every text it has seen, so that tokens and their texts stay valid for the table's life.
-// Finding a text that is there already allocates nothing.
+// Never forgets a text, so tokens and texts are valid as long as the table. Looking up a known text
+// allocates nothing.
 class TokenTable {
  public:
-  // Throws std::bad_alloc; the table is then as it was.
+  // Adds the text if it is new. Throws: std::bad_alloc; the table is then unchanged.
   VRKToken TokenOf(std::string_view text);
 
   bool Holds(VRKToken token) const noexcept;
 
-  // Null for what is no token of this table.
+  // Returns null if this table has no such token.
   const char* TextOf(VRKToken token) const noexcept;
 
  private:

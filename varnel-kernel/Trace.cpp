@@ -15,7 +15,7 @@ void Trace::Leave(const char* operation, std::span<const VRKHostTraceArgument> a
 }
 
 VRKResult Trace::Tell(const VRKHostTraceCall& call) noexcept {
-  if (hook == nullptr) return kVRKNoError;  // it may have been taken away while the call ran
+  if (hook == nullptr) return kVRKNoError;  // removed while the call ran
   isInHook = true;
   const VRKResult result = CallOut(running, kVRKCallbackThrew, hook, &call, context);
   isInHook = false;

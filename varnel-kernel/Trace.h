@@ -1,4 +1,4 @@
-// What a host's trace hook is told of a call.
+// Calls the host's trace hook before and after each kernel call.
 #pragma once
 
 #include <cstdint>
@@ -10,7 +10,7 @@
 
 namespace varnel_kernel {
 
-// How the trace names an argument of each type.
+// The kVRKTrace constant for an argument of each type.
 template <class Argument>
 constexpr uint32_t kTraceKind = kVRKTracePointer;
 template <>
@@ -30,7 +30,7 @@ inline constexpr uint32_t kTraceKind<VRKList> = kVRKTraceList;
 template <>
 inline constexpr uint32_t kTraceKind<VRKDictionary> = kVRKTraceDictionary;
 
-// An argument as it stands before the call or, when `stored`, after one that stored its outs.
+// Describes an argument before a call, or after one that has stored its outs (`stored`).
 template <class Argument>
 VRKHostTraceArgument Describe(Argument argument, bool stored) noexcept {
   if constexpr (!std::is_pointer_v<Argument>) {
@@ -54,7 +54,7 @@ VRKHostTraceArgument Describe(Argument argument, bool stored) noexcept {
 
 class Trace {
  public:
-  explicit Trace(RunningCode*& innermostCode) : running(innermostCode) {}
+  explicit Trace(ActiveCallback*& innermostCode) : running(innermostCode) {}
 
   VRKHostTraceHook Hook() const noexcept { return hook; }
   void Set(VRKHostTraceHook newHook, void* newContext) noexcept {
@@ -62,20 +62,20 @@ class Trace {
     context = newContext;
   }
 
-  // Whether calls are to be traced now; not while the hook runs.
+  // Whether calls are traced. Calls that the hook makes are not.
   bool IsOn() const noexcept { return hook != nullptr && !isInHook; }
 
-  // Tells of a call that is about to run. A result other than 0 is to become the call's.
+  // Announces a call. A result other than 0 replaces the call, which must then not run.
   VRKResult Enter(const char* operation, std::span<const VRKHostTraceArgument> arguments) noexcept;
 
-  // Tells how the call ended that was entered last.
+  // Reports the result of the innermost announced call.
   void Leave(const char* operation, std::span<const VRKHostTraceArgument> arguments,
              VRKResult result) noexcept;
 
  private:
   VRKResult Tell(const VRKHostTraceCall& call) noexcept;
 
-  RunningCode*& running;
+  ActiveCallback*& running;
   VRKHostTraceHook hook = nullptr;
   void* context = nullptr;
   uint32_t depth = 0;

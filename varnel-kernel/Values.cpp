@@ -7,7 +7,7 @@
 namespace varnel_kernel {
 namespace {
 
-// A payload is read as the handle that it holds.
+// Reads the handle in a payload. Returns false if the payload has the wrong size.
 template <class Handle>
 bool ReadHandle(const void* bytes, uint32_t byteCount, Handle& handle) {
   if (byteCount != sizeof handle) return false;
@@ -24,7 +24,7 @@ constexpr size_t RoundedUp(size_t size) noexcept {
 
 std::unique_ptr<Data> Data::Create(VRKToken type, uint32_t byteCount) {
   const size_t size = RoundedUp(sizeof(Data)) + byteCount;
-  if (size < byteCount) throw std::bad_alloc();  // it has wrapped, on 32 bits
+  if (size < byteCount) throw std::bad_alloc();  // overflow, on 32 bits
   void* const block = ::operator new(size);
   return std::unique_ptr<Data>(::new (block) Data(type, byteCount));
 }
@@ -138,19 +138,19 @@ VRKResult Values::Append(VRKList list, VRKData data) {
   return kVRKNoError;
 }
 
-// A value's references are released only once it is off the list, and what dies of that joins the
-// list, so that nothing here recurses however deep values are nested.
-void Values::Bury(std::unique_ptr<Value> value) noexcept {
-  value->nextDying = std::move(dying);
-  dying = std::move(value);
-  if (isBurying) return;
-  isBurying = true;
-  while (dying != nullptr) {
-    const std::unique_ptr<Value> buried = std::move(dying);
-    dying = std::move(buried->nextDying);
+// Deferred destruction: values that lose their last reference while another is destroyed are
+// queued, so nested values of any depth need no recursion.
+void Values::DestroyDeferred(std::unique_ptr<Value> value) noexcept {
+  value->nextPending = std::move(pendingDestruction);
+  pendingDestruction = std::move(value);
+  if (isDraining) return;
+  isDraining = true;
+  while (pendingDestruction != nullptr) {
+    const std::unique_ptr<Value> buried = std::move(pendingDestruction);
+    pendingDestruction = std::move(buried->nextPending);
     buried->ReleaseReferences(*this);
   }
-  isBurying = false;
+  isDraining = false;
 }
 
 }  // namespace varnel_kernel

@@ -15,20 +15,19 @@ namespace varnel_kernel {
 
 class Values;
 
-// What counts references, and may hold references to others of its like.
+// The base of reference-counted items, which may hold references to other values.
 struct Value : Item {
   virtual void ReleaseReferences(Values& values) noexcept = 0;
 
-  std::unique_ptr<Value>
-      nextDying;  // on the list of values that have just lost their last reference
+  std::unique_ptr<Value> nextPending;  // link in the list of values that wait for their destruction
 };
 
-// Typed bytes, which stand behind the item itself, aligned for any type.
+// Typed bytes, stored directly after the object, aligned for any type.
 struct Data final : Value {
   using Handle = VRKData;
   static constexpr Kind kKind = Kind::kData;
 
-  // The bytes are left to be written. Throws std::bad_alloc.
+  // The bytes are uninitialised. Throws: std::bad_alloc.
   static std::unique_ptr<Data> Create(VRKToken type, uint32_t byteCount);
   static void operator delete(void* block) { ::operator delete(block); }
 
@@ -37,7 +36,7 @@ struct Data final : Value {
 
   const VRKToken type;
   const uint32_t byteCount;
-  VRKList list{};  // these two for data of a list or a dictionary, which holds a reference
+  VRKList list{};  // set in data of a list or dictionary, which holds a reference to it
   VRKDictionary dictionary{};
 
  private:
@@ -62,8 +61,8 @@ struct Dictionary final : Value {
   boost::unordered_flat_map<uint32_t, VRKData> entries;  // by token; a reference to each
 };
 
-// The operations on them. Handles may be any 32 bits; outs are not null. Throws std::bad_alloc, and
-// has then changed nothing.
+// Handles may be any 32 bits. Requires: outs are not null. Throws: std::bad_alloc; nothing has
+// changed then.
 class Values {
  public:
   Values(HandleTable& handleTable, TokenTable& tokenTable);
@@ -90,7 +89,7 @@ class Values {
   VRKResult Release(typename Counted::Handle handle) noexcept {
     if (handle == typename Counted::Handle{}) return kVRKNoError;
     if (handles.Find<Counted>(handle) == nullptr) return kVRKInvalidHandle;
-    if (handles.Release<Counted>(handle) == 0) Bury(handles.Remove<Counted>(handle));
+    if (handles.Release<Counted>(handle) == 0) DestroyDeferred(handles.Remove<Counted>(handle));
     return kVRKNoError;
   }
 
@@ -99,12 +98,12 @@ class Values {
   const VRKToken dictionaryType;
 
  private:
-  void Bury(std::unique_ptr<Value> value) noexcept;
+  void DestroyDeferred(std::unique_ptr<Value> value) noexcept;
 
   HandleTable& handles;
   TokenTable& tokens;
-  std::unique_ptr<Value> dying;
-  bool isBurying = false;
+  std::unique_ptr<Value> pendingDestruction;
+  bool isDraining = false;
 };
 
 }  // namespace varnel_kernel

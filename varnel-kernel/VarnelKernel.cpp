@@ -1,5 +1,5 @@
-// The operations of VarnelKernel.h: what each takes is checked for null here, and the rest is up to
-// the kernel's parts.
+// The operations of VarnelKernel.h. They check pointers for null and forward to the kernel's parts,
+// which check handles.
 #include "VarnelKernel.h"
 
 #include <cstdlib>
@@ -289,7 +289,7 @@ const char* VRKTokenGetString(VRKToken token) {
   return kernel != nullptr ? kernel->tokens.TextOf(token) : nullptr;
 }
 
-// Blocks may outlive the kernel that allocated them, so a kernel that was shut down takes them too.
+// Runs on a kernel that was shut down, too: blocks may be deallocated after it has ended.
 VRKResult VRKMemoryDeallocate(void* block) {
   const std::lock_guard lock(Kernel::mutex);
   const auto deallocate = [=](Kernel& kernel) -> VRKResult {

@@ -9,8 +9,8 @@
 #include "PlugIns.h"
 #include "SharedLibrary.h"
 
+using varnel_kernel::CatchAll;
 using varnel_kernel::FindPlugIn;
-using varnel_kernel::Guarded;
 using varnel_kernel::Kernel;
 using varnel_kernel::PlugIn;
 
@@ -18,12 +18,12 @@ namespace {
 
 thread_local std::string gLoadError;
 
-// Serves one of the host's calls in its turn, on a kernel that is running.
+// Serves one host call: locks the kernel and runs `body` with it if it is running.
 template <class Body>
 VRKResult ServeHost(Body body) noexcept {
   const std::lock_guard lock(Kernel::mutex);
   Kernel* const kernel = Kernel::Running();
-  return kernel != nullptr ? Guarded([&] { return body(*kernel); }) : kVRKNotRunning;
+  return kernel != nullptr ? CatchAll([&] { return body(*kernel); }) : kVRKNotRunning;
 }
 
 template <class Handle>
@@ -34,7 +34,7 @@ VRKResult CreateHandleData(VRKToken type, Handle handle, VRKData* outData, Kerne
 
 VRKResult AddPlugIn(platform::SharedLibrary library, const char* prefix,
                     VRKPlugIn& outPlugIn) noexcept {
-  return Guarded([&]() -> VRKResult {
+  return CatchAll([&]() -> VRKResult {
     std::unique_ptr<PlugIn> plugIn = FindPlugIn(library, prefix, gLoadError);
     if (plugIn == nullptr) return kVRKNotFound;
     return ServeHost([&](Kernel& kernel) {
@@ -44,7 +44,7 @@ VRKResult AddPlugIn(platform::SharedLibrary library, const char* prefix,
   });
 }
 
-// A library may have installed callbacks as it was loaded, and then stays.
+// Unloads a library that did not become a plug-in, unless its constructors installed callbacks.
 void UnloadRefused(platform::SharedLibrary library) noexcept {
   const platform::AddressRange addresses = platform::AddressesOf(library);
   bool mustStay = false;
@@ -59,7 +59,7 @@ void UnloadRefused(platform::SharedLibrary library) noexcept {
 
 VRKResult VRKHostStart() {
   const std::lock_guard lock(Kernel::mutex);
-  return Guarded([] { return Kernel::Start(); });
+  return CatchAll([] { return Kernel::Start(); });
 }
 
 VRKResult VRKHostShutDown(VRKHostLiveCounts* outLive) {
@@ -83,7 +83,7 @@ VRKResult VRKHostPlugInLoad(const char* path, const char* prefix, VRKPlugIn* out
   const VRKResult ready =
       ServeHost([=](Kernel&) { return given ? kVRKNoError : kVRKInvalidArgument; });
   if (ready != kVRKNoError) return ready;
-  return Guarded([&]() -> VRKResult {
+  return CatchAll([&]() -> VRKResult {
     const platform::SharedLibrary library = platform::LoadSharedLibrary(path, gLoadError);
     if (library == nullptr) return kVRKNotFound;
     const VRKResult result = AddPlugIn(library, prefix, *outPlugIn);

@@ -1,8 +1,9 @@
-/* The host's side of the embedded kernel: what a host needs beyond VarnelKernel.h. C11 and C++20.
+/* The host interface of the embedded kernel: what a host needs beyond VarnelKernel.h. C11 and
+ * C++20.
  *
- * A process has one kernel. It serves one call at a time: calls from several threads wait for each
- * other, and a call that is made from within a callback is served at once. Everything that
- * VarnelKernel.h says of widths, handles, results and arguments holds here too.
+ * A process has one kernel. One recursive lock serialises all calls, so any thread may call, and a
+ * callback may call while its thread holds the lock. The conventions of VarnelKernel.h for widths,
+ * handles, results and arguments hold here too.
  */
 #ifndef VARNEL_KERNEL_HOST_H
 #define VARNEL_KERNEL_HOST_H
@@ -16,12 +17,12 @@ extern "C" {
 typedef uint32_t VRKPlugIn;
 #endif
 
-/* How many handles, registrations and blocks there are of each kind. */
+/* The number of live handles, registrations and blocks of each kind. */
 typedef struct VRKHostLiveCounts {
   uint32_t objects;
   uint32_t messageHandlers;
-  uint32_t objectFactories; /* counted once for each class they serve */
-  uint32_t dataCoercions;   /* counted once for each pair of types */
+  uint32_t objectFactories; /* one for each class of each factory */
+  uint32_t dataCoercions;   /* one for each pair of types of each handler */
   uint32_t data;
   uint32_t lists;
   uint32_t dictionaries;
@@ -32,10 +33,10 @@ typedef struct VRKHostLiveCounts {
 /* kVRKAlreadyExists: the kernel is running. */
 VRK_API VRKResult VRK_CALL VRKHostStart(void);
 
-/* Ends the kernel. *outLive, which may be null, gets what was still alive. All of it ends without a
- * word to anybody, and its handles are stale from then on; only tokens, memory blocks and loaded
- * libraries stay, so that code which still holds their addresses may do so. kVRKInUse, and nothing
- * is ended: the call comes from within a callback. */
+/* Shuts the kernel down. *outLive, which may be null, receives the counts of what was still alive.
+ * Everything is destroyed without object-died messages, and all handles become stale. Tokens,
+ * memory blocks and loaded libraries stay, because other code may still hold their addresses.
+ * kVRKInUse: the call comes from within a callback; nothing happened. */
 VRK_API VRKResult VRK_CALL VRKHostShutDown(VRKHostLiveCounts* outLive);
 
 VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
@@ -56,29 +57,28 @@ VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
 VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefix,
                                              VRKPlugIn* outPlugIn);
 
-/* Why the calling thread's latest VRKHostPlugInLoad returned kVRKNotFound, else empty; valid until
- * its next one. */
+/* The reason for which the calling thread's latest VRKHostPlugInLoad returned kVRKNotFound, else an
+ * empty text. Valid until the thread's next VRKHostPlugInLoad. */
 VRK_API const char* VRK_CALL VRKHostLoadError(void);
 
-/* Call the entry points and return what they return. Objects that are created while a plug-in
- * initialises are kept alive until its VRKHostPlugInTerminate returns, but for those of a creation
- * that fails. kVRKInUse, and nothing is initialised or terminated: code of the plug-in is running.
- */
+/* Call the entry points and return their results. The kernel retains objects whose creation
+ * succeeds while a plug-in initialises, and releases them when VRKHostPlugInTerminate returns.
+ * kVRKInUse: code of the plug-in is running; nothing happened. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInInitialize(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInTerminate(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion);
 
-/* Unloads the library, whether it was terminated or not. Objects that were kept for it are released
- * first. kVRKInUse, and nothing is unloaded: one of its callbacks is still installed (the trace
- * hook and the reporter count), or its code is running. Code in other libraries that it loaded is
- * not searched for. Not to be called from within a callback, as VRKHostPlugInLoad. */
+/* Unloads the library, whether it was terminated or not. Objects that the kernel retains for it are
+ * released first. kVRKInUse: one of its callbacks is still installed, including the trace hook and
+ * the reporter, or its code is running; the library stays. Code in other libraries that it loaded
+ * is not considered. Like VRKHostPlugInLoad, not to be called from within a callback. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInUnload(VRKPlugIn plugIn);
 
-/* Lists and data of handles. Outs are owned by the caller. */
+/* Lists, and data that holds handles. Outs are owned by the caller. */
 
 VRK_API VRKResult VRK_CALL VRKHostListCreate(VRKList* outList);
 
-/* The list keeps a reference of its own. */
+/* The list retains the data. */
 VRK_API VRKResult VRK_CALL VRKHostListAppend(VRKList list, VRKData data);
 
 /* Data of the types "type:orvane.vrk.token", "type:orvane.vrk.list" and
@@ -103,7 +103,7 @@ enum {
 
 typedef struct VRKHostTraceArgument {
   uint32_t kind;
-  uint32_t isOut; /* the value is what was stored there, or 0 as long as nothing was */
+  uint32_t isOut; /* the value is what was stored, or 0 if nothing was stored */
   uint32_t number;
   const void* pointer;
 } VRKHostTraceArgument;
@@ -112,8 +112,8 @@ typedef struct VRKHostTraceCall {
   const char* operation; /* its name in VarnelKernel.h */
   const VRKHostTraceArgument* arguments;
   uint32_t argumentCount;
-  uint32_t depth;      /* how many calls it is nested in */
-  uint32_t isFinished; /* 0 before the call runs, 1 after it; `result` is set then */
+  uint32_t depth;      /* the number of calls that it is nested in */
+  uint32_t isFinished; /* 0 before the call runs, 1 after it, when `result` is set */
   VRKResult result;
 } VRKHostTraceCall;
 
@@ -124,19 +124,19 @@ typedef struct VRKHostTraceCall {
  * are not traced. No exception may leave the hook. */
 typedef VRKResult(VRK_CALL* VRKHostTraceHook)(const VRKHostTraceCall* call, void* context);
 
-/* Installs the one trace hook; null for none. */
+/* Replaces the trace hook. Null removes it. */
 VRK_API VRKResult VRK_CALL VRKHostSetTraceHook(VRKHostTraceHook hook, void* context);
 
 /* Error reports */
 
-/* Serves VRKRuntimeError, and returns what it returns. */
+/* Called by VRKRuntimeError, which returns its result. */
 typedef uint32_t(VRK_CALL* VRKHostErrorReporter)(uint32_t severity, const char* domain,
                                                  const char* expression, const char* sourceFile,
                                                  uint32_t line, const char* function,
                                                  uint32_t* onceFlag, void* context);
 
-/* Installs the reporter. Null for the kernel's own, which prints a report on standard error, sets
- * its once-flag and returns 0. */
+/* Replaces the reporter. Null restores the kernel's own, which prints the report on standard error,
+ * sets the once-flag and returns 0. */
 VRK_API VRKResult VRK_CALL VRKHostSetErrorReporter(VRKHostErrorReporter reporter, void* context);
 
 #ifdef __cplusplus

@@ -9,24 +9,24 @@
 namespace Varnel::LocalizableStrings {
 namespace {
 
-class BorrowedTranslator final : public StringTranslatorInterface {
+class WeakTranslator final : public StringTranslatorInterface {
  public:
-  explicit BorrowedTranslator(boost::weak_ptr<StringTranslatorImpl> owner)
+  explicit WeakTranslator(boost::weak_ptr<StringTranslatorImpl> owner)
       : translator(std::move(owner)) {}
 
-  void MakeDefault() override { LiveTranslator(translator)->MakeDefault(); }
+  void MakeDefault() override { LockTranslator(translator)->MakeDefault(); }
 
   void SetTranslations(const char* bytes, uint32_t byteCount) override {
-    LiveTranslator(translator)->SetTranslations(bytes, byteCount);
+    LockTranslator(translator)->SetTranslations(bytes, byteCount);
   }
 
   void SetTranslations(const uint16_t* units, uint32_t unitCount) override {
-    LiveTranslator(translator)->SetTranslations(units, unitCount);
+    LockTranslator(translator)->SetTranslations(units, unitCount);
   }
 
   void TranslateString(const char* key, uint32_t keyLength,
                        std::vector<uint16_t>& result) override {
-    LiveTranslator(translator)->TranslateString(key, keyLength, result);
+    LockTranslator(translator)->TranslateString(key, keyLength, result);
   }
 
  private:
@@ -37,7 +37,7 @@ class BorrowedTranslator final : public StringTranslatorInterface {
 
 boost::weak_ptr<StringTranslatorImpl> gDefaultStringTranslator;
 
-boost::shared_ptr<StringTranslatorInterface> LiveTranslator(
+boost::shared_ptr<StringTranslatorInterface> LockTranslator(
     const boost::weak_ptr<StringTranslatorImpl>& translator) {
   boost::shared_ptr<StringTranslatorInterface> live = translator.lock();
   if (live == nullptr) throw InvariantViolation();
@@ -46,8 +46,8 @@ boost::shared_ptr<StringTranslatorInterface> LiveTranslator(
 
 boost::shared_ptr<StringTranslatorInterface> GetDefaultStringTranslator(
     orvane::dictionary_t const&) {
-  LiveTranslator(gDefaultStringTranslator);
-  return boost::make_shared<BorrowedTranslator>(gDefaultStringTranslator);
+  LockTranslator(gDefaultStringTranslator);
+  return boost::make_shared<WeakTranslator>(gDefaultStringTranslator);
 }
 
 }  // namespace Varnel::LocalizableStrings

@@ -1,4 +1,4 @@
-// The translator that translates for all who have none of their own.
+// The process-wide default translator.
 #pragma once
 
 #include <boost/shared_ptr.hpp>
@@ -11,17 +11,17 @@ namespace Varnel::LocalizableStrings {
 
 class StringTranslatorImpl;
 
-// The translator that was made the default last, which may have died since; empty until there is
-// one.
+// The latest default translator. Expired if it was destroyed; empty until there is one.
 extern boost::weak_ptr<StringTranslatorImpl> gDefaultStringTranslator;
 
-// The translator, for the length of an operation. Throws InvariantViolation when it is dead.
-boost::shared_ptr<StringTranslatorInterface> LiveTranslator(
+// Locks the translator for an operation. Throws: InvariantViolation if it was destroyed.
+boost::shared_ptr<StringTranslatorInterface> LockTranslator(
     const boost::weak_ptr<StringTranslatorImpl>& translator);
 
-// What stands for the translator that is the default now, whatever becomes the default later, and
-// does not keep it alive: once that translator is dead, all operations throw InvariantViolation. So
-// does this one. The parameters are not used.
+// Returns a translator that forwards to the current default translator, also if another one becomes
+// the default later. It does not keep that translator alive: its operations throw
+// InvariantViolation once that is destroyed. `parameters` are ignored. Throws: InvariantViolation
+// if there is no default translator.
 boost::shared_ptr<StringTranslatorInterface> GetDefaultStringTranslator(
     orvane::dictionary_t const& parameters);
 

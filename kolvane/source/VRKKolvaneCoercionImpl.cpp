@@ -20,12 +20,12 @@ CheckSite gDataUTF8Site{.domain = "orvane.varnel.kolvanes",
 
 std::string KeyText(const DataRef& data) {
   const RawPayload payload = GetRawPayload(data);
-  return Terminated({static_cast<const char*>(payload.bytes), payload.byteCount});
+  return WithTerminator({static_cast<const char*>(payload.bytes), payload.byteCount});
 }
 
 std::vector<uint16_t> Translation(const std::string& key) {
   std::vector<uint16_t> units;
-  LocalizableStrings::LiveTranslator(LocalizableStrings::gDefaultStringTranslator)
+  LocalizableStrings::LockTranslator(LocalizableStrings::gDefaultStringTranslator)
       ->TranslateString(key.data(), static_cast<uint32_t>(key.size()), units);
   return units;
 }

@@ -1,4 +1,4 @@
-// Turns keys into translated text wherever the kernel coerces data.
+// The coercion of keys into translated text.
 #pragma once
 
 #include "DataCoercion.h"
@@ -6,25 +6,25 @@
 
 namespace Varnel::Kolvanes {
 
-// The types of what is coerced, a key, and of the texts that it is coerced to.
+// The type of keys, and the types of text that they are coerced to.
 extern StaticToken gTypeLocaleIndependentUTF8;
 extern StaticToken gTypeUTF8;
 extern StaticToken gTypeUTF16LE;
 extern StaticToken gTypeUTF16BE;
 
-// The next use makes them anew.
+// Clears the four tokens, which are created again on their next use.
 void ResetTypeTokens() noexcept;
 
-// Lives in kernel memory. Coerces keys to UTF-8 and UTF-16 of either byte order, by having the
-// default translator translate them; the text ends in one 0 unit.
+// Coerces keys to UTF-8, UTF-16LE and UTF-16BE: the default translator's translation, followed by
+// one 0 unit. Allocated in kernel memory.
 class CoercionImpl final : public DataCoercion {
  public:
-  // Installs the three coercions; none of them stays installed when it throws.
+  // Installs the three coercions. Removes them if it throws.
   CoercionImpl();
 
-  // False where the kernel cannot coerce the translation, which is UTF-16LE, to the type. Throws
-  // InputContractViolation for another `fromType` than that of keys, InvariantViolation when the
-  // default translator is dead, and what the kernel and the translator throw.
+  // Returns false if the kernel cannot coerce the translation, UTF-16LE data, to the target type.
+  // Throws: InputContractViolation if `fromType` is not the type of keys, InvariantViolation if
+  // there is no default translator, and exceptions of the kernel and the translator.
   bool HandleCoercionImpl(const DataRef& source, VRKToken fromType, VRKToken toType,
                           DataRef& result) override;
 };

@@ -19,13 +19,13 @@ using Varnel::InputContractViolation;
 using Varnel::StringTranslatorFactory;
 using Varnel::Kolvanes::CoercionImpl;
 
-// Made as the library is loaded. NOLINTBEGIN(cert-err58-cpp): no load goes on without memory.
+// Static initialisers: std::bad_alloc here aborts loading the library. NOLINTBEGIN(cert-err58-cpp)
 const orvane::name_t gStringTranslatorClass(Varnel::kClassStringTranslator);
 const orvane::name_t gDefaultStringTranslatorClass(Varnel::kClassDefaultStringTranslator);
 // NOLINTEND(cert-err58-cpp)
 
-// Should the library be unloaded while it is initialised, these unregister the classes, the default
-// one first. The coercion is left alone then.
+// If the library is unloaded without termination, these unregister the classes, the default one
+// first. The coercion stays installed then.
 std::unique_ptr<StringTranslatorFactory> gStringTranslatorFactory;
 std::unique_ptr<StringTranslatorFactory> gDefaultStringTranslatorFactory;
 CoercionImpl* gKolvaneCoercion = nullptr;

@@ -1,8 +1,10 @@
-/* What the host's kernel calls of the plug-in. C11 and C++20.
+/* The plug-in's entry points, which the host's kernel calls. C11 and C++20.
  *
- * One at a time, and not while it creates the plug-in's objects, delivers messages to them or
- * coerces through the plug-in. `reserved` is 0, or 13 is the result and nothing is done. Other
- * results are 0, the kernel's, 18 where there is no memory, and those of ResultCodes.h.
+ * Requires: one call at a time, and none while the kernel creates the plug-in's objects, delivers
+ * messages to them or coerces through the plug-in. `reserved` is 0.
+ *
+ * Results: 0; 13 if `reserved` is not 0, and nothing was done; 18 if memory runs out; any other
+ * code of the kernel or of ResultCodes.h.
  */
 #ifndef VRK_KOLVANES_H
 #define VRK_KOLVANES_H
@@ -19,20 +21,21 @@
 extern "C" {
 #endif
 
-/* Registers both classes of translators, makes a first translator the default, and installs the
- * coercion of keys. The kernel is to keep the objects that are created meanwhile until the plug-in
- * is terminated: the first translator dies with its object. When the classes fail, neither is
- * registered any more; when the coercion does, the classes stay and VRKKolvanesTerminate removes
- * them. A second call without a VRKKolvanesTerminate replaces all that the first made; should the
- * classes fail then, the coercion of the first stays until VRKKolvanesTerminate. */
+/* Registers both translator classes, creates a translator and makes it the default, and installs
+ * the coercion of keys. Requires: the kernel retains the objects created meanwhile until the
+ * plug-in is terminated, because the default translator dies with its object.
+ *
+ * If registering the classes fails, neither stays registered. If installing the coercion fails, the
+ * classes stay until VRKKolvanesTerminate. A second call without VRKKolvanesTerminate replaces
+ * everything; if registering the classes fails then, the first call's coercion stays. */
 VRK_KOLVANES_API VRKResult VRK_CALL VRKKolvanesInitialize(uint32_t reserved);
 
-/* Removes what was registered and installed. Translators stay, the default one among them. The
- * plug-in can be initialised again. A library that is unloaded without it unregisters the classes
- * by itself, but not the coercion; nor must it be unloaded while there are translators. */
+/* Unregisters the classes and removes the coercion. Translators stay, including the default one.
+ * The plug-in can be initialised again. Unloading the library without this call unregisters the
+ * classes, but not the coercion. The library must not be unloaded while translators exist. */
 VRK_KOLVANES_API VRKResult VRK_CALL VRKKolvanesTerminate(uint32_t reserved);
 
-/* 0x00010000. */
+/* Returns 0x00010000. */
 VRK_KOLVANES_API uint32_t VRK_CALL VRKKolvanesVersion(void);
 
 #ifdef __cplusplus

@@ -1,4 +1,4 @@
-// The translator that does the work.
+// The translator that owns a dictionary.
 #pragma once
 
 #include <boost/shared_ptr.hpp>
@@ -10,30 +10,28 @@
 
 namespace Varnel::LocalizableStrings {
 
-// Translates with a dictionary of its own. It is to be owned by a shared pointer, as one that
-// CreateStringTranslatorImpl makes: from that others tell whether the default translator is alive.
-// Besides what is said below, throws std::bad_alloc, and OVErrException where a text is too long to
-// be converted.
+// Translates with its own dictionary. Requires: owned by a boost::shared_ptr, as from
+// CreateStringTranslatorImpl, because the default translator is tracked by a weak pointer.
+// Throws: std::bad_alloc, and OVErrException if a text is too long to be converted.
 class StringTranslatorImpl final : public StringTranslatorInterface,
                                    public boost::enable_shared_from_this<StringTranslatorImpl> {
  public:
-  // Makes the dictionary the default dictionary, too.
+  // Also makes the dictionary the process default dictionary.
   void MakeDefault() noexcept override;
 
-  // Takes the bytes as an image, which is read where it lies. A count of 0 with bytes that are not
-  // null stands for all bytes up to the first 0. More than 2^31 - 1 bytes are an
-  // InvariantViolation, and nothing is loaded.
+  // Loads the bytes as an image. A count of 0 with a pointer that is not null means all bytes up to
+  // the first 0. Throws: InvariantViolation for more than 2^31 - 1 bytes; nothing is loaded then.
   void SetTranslations(const char* bytes, uint32_t byteCount) override;
   void SetTranslations(const uint16_t* units, uint32_t unitCount) override;
 
-  // The key is read up to its NUL, whatever its length; a null key is an empty one.
+  // Reads the key up to its NUL and ignores `keyLength`. A null key is an empty one.
   void TranslateString(const char* key, uint32_t keyLength, std::vector<uint16_t>& result) override;
 
  private:
   KolvaneDictionary dictionary;
 };
 
-// A new translator without translations, whatever the parameters.
+// Returns a new translator without translations. `parameters` are ignored.
 boost::shared_ptr<StringTranslatorInterface> CreateStringTranslatorImpl(
     orvane::dictionary_t const& parameters);
 

@@ -1,4 +1,4 @@
-// The way from the kernel into C++ and back.
+// The exception boundary between the kernel and C++ code that it calls.
 #pragma once
 
 #include <utility>
@@ -7,8 +7,8 @@
 
 namespace Varnel {
 
-// Returns the result code that `body` returns, or that of what it throws. Nothing gets past it, and
-// it takes no memory. `errorInfo` is the dictionary for a CustomErrorException, or null.
+// Returns the result code of `body`, or that of the exception which it throws. Never throws or
+// allocates. `errorInfo` is passed to ResultCodeFromException, and may be null.
 template <class Body>
 VRKResult AtBoundary(VRKDictionary errorInfo, Body&& body) noexcept {
   try {

@@ -15,14 +15,14 @@
 namespace Varnel {
 namespace {
 
-// A list or dictionary whose data are being converted one after the other.
+// A list or dictionary in the course of its conversion, one datum after the other.
 class Frame {
  public:
   explicit Frame(ListRef source) : items(std::move(source)) {}
   explicit Frame(DictionaryRef source)
       : dictionary(std::move(source)), items(dictionary.CreateKeyList()) {}
 
-  // Keeps the data that the list or dictionary was read from.
+  // Retains the data that the list or dictionary was read from.
   void Hold(DataRef from, DataRef coercedFrom) noexcept {
     sourceData = std::move(from);
     coercedData = std::move(coercedFrom);
@@ -30,7 +30,7 @@ class Frame {
 
   bool IsDictionary() const noexcept { return static_cast<bool>(dictionary); }
 
-  // Goes on to the next datum, if there is one.
+  // Moves to the next datum. Returns false at the end.
   bool Advance() {
     if (index >= items.GetSize()) return false;
     datum = items.GetEntry(index++);
@@ -43,7 +43,7 @@ class Frame {
 
   const DataRef& Datum() const noexcept { return datum; }
 
-  // Keeps the datum's value, and releases the datum.
+  // Stores the datum's value and releases the datum.
   void Accept(orvane::value_t value) {
     const orvane::name_t name = IsDictionary() ? TokenName(keyToken) : orvane::name_t();
     accepted.push_back({name, index, std::move(value)});
@@ -57,7 +57,7 @@ class Frame {
     return array;
   }
 
-  // Inserts in the order of the names, so that each pair goes to the result's end.
+  // Inserts in the order of the names, so that each pair is appended.
   orvane::dictionary_t Dictionary() {
     std::ranges::sort(accepted, {},
                       [](const Accepted& each) { return std::pair(each.name, each.place); });
@@ -84,10 +84,10 @@ class Frame {
   std::vector<Accepted> accepted;
 };
 
-// Converts one thing and all that is nested in it, by a stack of frames.
+// Converts a datum and everything nested in it, with an explicit stack of frames.
 class Conversion {
  public:
-  // Begins with data, or with a list or dictionary itself.
+  // Starts with a datum, or with a list or dictionary.
   void Begin(const DataRef& datum);
   template <class Ref>
   Frame& Enter(Ref listOrDictionary);
@@ -99,7 +99,7 @@ class Conversion {
   std::string Counted(std::string text);
 
   std::vector<Frame> frames;
-  std::optional<orvane::value_t> finished;  // what the innermost frame has to accept
+  std::optional<orvane::value_t> finished;  // not yet accepted by the innermost frame
   size_t valueCount = 0;
   uint64_t textBytes = 0;
 };

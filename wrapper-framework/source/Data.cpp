@@ -11,7 +11,7 @@
 namespace Varnel {
 namespace {
 
-static_assert(std::endian::native == std::endian::little, "utf16le data is written as it lies");
+static_assert(std::endian::native == std::endian::little, "utf16le data is copied from memory");
 
 DataRef MakeUnits(const char* typeText, const uint16_t* units, uint32_t unitCount) {
   constexpr uint32_t kMaxUnits = std::numeric_limits<uint32_t>::max() / 2;
@@ -90,7 +90,7 @@ VRKToken GetToken(const DataRef& source) {
   return ReadOne<VRKToken>(CoerceOrThrow(source, type), type);
 }
 
-// The handle in a payload is retained while the data that owns it is still held.
+// The handle is retained before `coerced`, whose data owns it, is released.
 
 ListRef GetList(const DataRef& source) {
   const VRKToken type = MakeToken(kTypeList);

@@ -1,4 +1,4 @@
-// Typed data: made from C++ types and read back into them.
+// Creation of typed kernel data from C++ types, and the typed readers.
 #pragma once
 
 #include <algorithm>
@@ -8,22 +8,21 @@
 #include <type_traits>
 #include <vector>
 
-#include "Holders.h"
+#include "KernelRefs.h"
 #include "ReportedCheck.h"
 
 namespace Varnel {
 
-// All copy what they are given; pointers may be null where the count is 0. Units are in memory's
-// order. More than 2^31 - 1 units are a std::length_error.
+// All copy their input. Pointers may be null if the count is 0. Units are in memory's byte order.
+// Throws: Exception for the kernel's failures, std::length_error for more than 2^31 - 1 units.
 DataRef MakeData(const char* typeText, const void* bytes, uint32_t byteCount);
 DataRef MakeUTF8Data(const void* bytes, uint32_t byteCount);
 DataRef MakeUTF16LEData(const uint16_t* units, uint32_t unitCount);
 DataRef MakeUTF16Data(const uint16_t* units, uint32_t unitCount);
 
-// The readers coerce the data to the type that they are named after, and copy out what they read.
-// They throw the Exception of kResultInputContractViolation where that is impossible,
-// InputContractViolation where the coerced data is not what its type promises, and the kernel's
-// failures.
+// Each reader coerces the data to the type in its name and copies the payload.
+// Throws: Exception with kResultInputContractViolation if the coercion is impossible,
+// InputContractViolation if the payload does not fit its type, Exception for the kernel's failures.
 double GetDouble(const DataRef& source);
 bool GetBool(const DataRef& source);
 VRKToken GetToken(const DataRef& source);
@@ -31,11 +30,11 @@ ListRef GetList(const DataRef& source);
 DictionaryRef GetDictionary(const DataRef& source);
 std::string GetUTF8(const DataRef& source);
 
-// Replace the contents of `units`, unless they throw. An odd last byte belongs to no unit.
+// Replace the contents of `units`, which are unchanged if they throw. An odd last byte is ignored.
 void GetUTF16LE(const DataRef& source, std::vector<uint16_t>& units);
 void GetUTF16(const DataRef& source, std::vector<uint16_t>& units);
 
-// Bytes that are readable as long as the data is held.
+// Borrowed bytes, readable while the data is held.
 struct RawPayload {
   const void* bytes = nullptr;
   uint32_t byteCount = 0;
@@ -45,8 +44,8 @@ RawPayload GetRawPayload(const DataRef& source);
 
 VRKToken GetType(const DataRef& source);
 
-// The first bytes of the data, whatever its type, as a T. Another number of bytes than T has is
-// reported, and what is missing is 0.
+// Returns the first bytes of the data, of any type, as a T. A size other than T's is reported;
+// missing bytes are 0.
 template <class T>
 T ExtractData(const DataRef& source) {
   static_assert(std::is_trivially_copyable_v<T>);

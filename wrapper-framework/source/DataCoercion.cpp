@@ -1,14 +1,14 @@
 #include "DataCoercion.h"
 
 #include "Boundary.h"
+#include "DestructionScope.h"
 #include "Exceptions.h"
-#include "Farewell.h"
 #include "ResultCodes.h"
 
 namespace Varnel {
 
 DataCoercion::~DataCoercion() {
-  const Farewell farewell(this);
+  const DestructionScope destruction(this);
   VRKDataCoercionHandlerRemove(&Callback, this, 0, 0);
 }
 
@@ -29,7 +29,7 @@ bool DataCoercion::HandleCoercion(VRKData source, VRKToken fromType, VRKToken to
 
 VRKResult VRK_CALL DataCoercion::Callback(VRKData source, VRKToken fromType, VRKToken toType,
                                           void* context, VRKData* outData) {
-  if (Farewell::IsSaidBy(context)) return kResultCannotCoerce;
+  if (DestructionScope::IsDestroying(context)) return kResultCannotCoerce;
   return AtBoundary({}, [&] {
     DataCoercion& coercion = *static_cast<DataCoercion*>(context);
     const bool coerced = coercion.HandleCoercion(source, fromType, toType, outData);

@@ -1,7 +1,7 @@
-// The base of what coerces kernel data of one type into another.
+// The base class of data coercions.
 #pragma once
 
-#include "Holders.h"
+#include "KernelRefs.h"
 #include "Memory.h"
 #include "VarnelKernel.h"
 
@@ -9,24 +9,24 @@ namespace Varnel {
 
 class DataCoercion : public Memory<KernelMemoryPolicy> {
  public:
-  DataCoercion() noexcept = default;  // installed for no types yet
+  DataCoercion() noexcept = default;  // not installed
   DataCoercion(const DataCoercion&) = delete;
   DataCoercion& operator=(const DataCoercion&) = delete;
 
-  // Ends all installations.
+  // Removes all installations.
   virtual ~DataCoercion();
 
-  // Puts the source, as data of the other type, into `result`; or returns false where that is
-  // impossible. Throws when it fails. May delete the coercion.
+  // Stores the coerced data in `result` and returns true, or returns false if the coercion is
+  // impossible. An exception becomes the result code. May delete the coercion.
   virtual bool HandleCoercionImpl(const DataRef& source, VRKToken fromType, VRKToken toType,
                                   DataRef& result) = 0;
 
-  // The kernel asks this object, besides the pairs of types that it was installed for before, from
-  // now on for this one too. A null type is an InputContractViolation.
+  // Installs the coercion for a pair of types, in addition to earlier ones. Throws:
+  // InputContractViolation for a null type, Exception for the kernel's failures.
   void Install(VRKToken fromType, VRKToken toType);
 
-  // Stores data that is owned by the caller and returns true, or returns false. A null out is an
-  // InputContractViolation.
+  // Stores data owned by the caller and returns true, or returns false. Throws:
+  // InputContractViolation for a null out, and what HandleCoercionImpl throws.
   bool HandleCoercion(VRKData source, VRKToken fromType, VRKToken toType, VRKData* outData);
 
  private:

@@ -4,7 +4,7 @@
 #include <stdexcept>
 #include <typeinfo>
 
-#include "Holders.h"
+#include "KernelRefs.h"
 #include "ResultCodes.h"
 
 namespace Varnel {
@@ -15,7 +15,7 @@ void Describe(const CustomErrorException& error, VRKDictionary errorInfo) noexce
   try {
     DictionaryRef held(errorInfo);
     error.FillErrorInfo(held);
-  } catch (...) {  // the error that is being reported matters more
+  } catch (...) {  // the original error is reported
   }
 }
 

@@ -1,5 +1,4 @@
-// Errors, both ways: a result code of the kernel becomes an exception where the kernel was called,
-// and an exception becomes a result code where the kernel called.
+// Conversion between the kernel's result codes and exceptions, in both directions.
 #pragma once
 
 #include <cstdint>
@@ -11,7 +10,7 @@ namespace Varnel {
 
 class DictionaryRef;
 
-// What knows the code that it becomes.
+// An exception that carries its result code.
 class ResultCodeException {
  public:
   virtual uint32_t GetResultCode() const noexcept = 0;
@@ -22,7 +21,7 @@ class Exception : public std::exception, public ResultCodeException {
  public:
   explicit Exception(uint32_t code) noexcept : resultCode(code) {}
 
-  // Asks the other for its code, which a class derived from it may have changed.
+  // Copies the result of the other's GetResultCode, which derived classes override.
   Exception(const Exception& other) noexcept;
   Exception& operator=(const Exception&) = default;
 
@@ -33,7 +32,7 @@ class Exception : public std::exception, public ResultCodeException {
   uint32_t resultCode;
 };
 
-// A broken contract of an input, of a result that must exist, and of an internal state.
+// Violated contracts of an input, of a result that must exist, and of internal state.
 
 class InputContractViolation : public Exception {
  public:
@@ -53,24 +52,24 @@ class InvariantViolation : public Exception {
   const char* what() const noexcept override;
 };
 
-// An error that describes itself in the parameter dictionary of the message during which it was
-// thrown.
+// An exception that writes its details into the parameter dictionary of the message whose handler
+// throws it.
 class CustomErrorException {
  public:
   virtual void FillErrorInfo(DictionaryRef& errorInfo) const = 0;
   virtual ~CustomErrorException() = default;
 };
 
-// Throws an Exception, whatever the code.
+// Throws an Exception, never a derived class.
 [[noreturn]] void ThrowResultCode(uint32_t code);
 
 inline void ThrowIfFailed(VRKResult result) {
   if (result != 0) ThrowResultCode(result);
 }
 
-// The code of the exception that is being handled; to be called in a catch clause only. A
-// CustomErrorException is given the dictionary, unless that is null, to describe itself in; when
-// that fails it counts for nothing.
+// Returns the code of the exception that is being handled. A CustomErrorException first fills
+// `errorInfo`, unless it is null; an exception from that is ignored. Requires: called in a catch
+// clause.
 uint32_t ResultCodeFromException(VRKDictionary errorInfo) noexcept;
 uint32_t ResultCodeFromException(const DictionaryRef& errorInfo) noexcept;
 

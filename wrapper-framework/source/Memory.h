@@ -1,4 +1,4 @@
-// Memory of the kernel for the objects that it calls back into.
+// Kernel memory for objects that the kernel calls back.
 #pragma once
 
 #include <cstddef>
@@ -6,19 +6,18 @@
 
 namespace Varnel {
 
-// What operator new throws where the kernel has no memory; its text is "bad allocation".
+// Thrown by operator new if the kernel is out of memory; its text is "bad allocation".
 class BadAllocation : public std::bad_alloc {
  public:
   const char* what() const noexcept override;
 };
 
 struct KernelMemoryPolicy {
-  static void* Allocate(size_t byteCount) noexcept;  // null when there is none
+  static void* Allocate(size_t byteCount) noexcept;  // null if there is no memory
   static void Deallocate(void* block) noexcept;
 };
 
-// Objects of classes derived from this one come out of the policy's memory when they are made with
-// new, and go back there.
+// Classes derived from this one allocate their objects with the policy.
 template <class Policy>
 class Memory {
  public:

@@ -1,8 +1,8 @@
 #include "MessageHandler.h"
 
 #include "Boundary.h"
+#include "DestructionScope.h"
 #include "Exceptions.h"
-#include "Farewell.h"
 #include "ResultCodes.h"
 #include "Tokens.h"
 
@@ -20,31 +20,31 @@ void MakeObjectDied() {
 
 }  // namespace
 
-// A call of a handler that is running, in a chain from the innermost outwards.
-struct MessageHandler::RunningCall {
-  explicit RunningCall(MessageHandler* calledHandler) noexcept
+// A running call of a handler. The objects form a stack, linked from the innermost call outwards.
+struct MessageHandler::ActiveCall {
+  explicit ActiveCall(MessageHandler* calledHandler) noexcept
       : handler(calledHandler), outer(innermost) {
     innermost = this;
   }
-  ~RunningCall() {
+  ~ActiveCall() {
     innermost = outer;
     if (deletesHandler) delete handler;
   }
-  RunningCall(const RunningCall&) = delete;
-  RunningCall& operator=(const RunningCall&) = delete;
+  ActiveCall(const ActiveCall&) = delete;
+  ActiveCall& operator=(const ActiveCall&) = delete;
 
-  static RunningCall* OutermostOf(const MessageHandler* handler) noexcept {
-    RunningCall* outermost = nullptr;
-    for (RunningCall* each = innermost; each != nullptr; each = each->outer) {
+  static ActiveCall* OutermostOf(const MessageHandler* handler) noexcept {
+    ActiveCall* outermost = nullptr;
+    for (ActiveCall* each = innermost; each != nullptr; each = each->outer) {
       if (each->handler == handler) outermost = each;
     }
     return outermost;
   }
 
-  static inline RunningCall* innermost = nullptr;
+  static inline ActiveCall* innermost = nullptr;
 
-  MessageHandler* handler;  // null once it is gone
-  RunningCall* outer;
+  MessageHandler* handler;  // null once it is destroyed
+  ActiveCall* outer;
   bool deletesHandler = false;
 };
 
@@ -55,8 +55,8 @@ MessageHandler::MessageHandler(VRKObject attachTo, bool deletesItself)
 }
 
 MessageHandler::~MessageHandler() {
-  const Farewell farewell(this);
-  while (RunningCall* const call = RunningCall::OutermostOf(this)) {
+  const DestructionScope destruction(this);
+  while (ActiveCall* const call = ActiveCall::OutermostOf(this)) {
     call->handler = nullptr;
   }
   if (registration != VRKMessageHandler{}) VRKMessageHandlerRemove(registration, object);
@@ -83,7 +83,7 @@ void MessageHandler::ObjectDied() {
 }
 
 void MessageHandler::DeleteSelf() {
-  if (RunningCall* const call = RunningCall::OutermostOf(this)) {
+  if (ActiveCall* const call = ActiveCall::OutermostOf(this)) {
     call->deletesHandler = true;
   } else {
     delete this;
@@ -95,7 +95,7 @@ void MessageHandler::AddMessages(const VRKToken* messages, uint32_t count) {
   ThrowIfFailed(VRKMessageHandlerAddMessages(registration, messages, count));
 }
 
-// A constructor that throws runs no destructor, so what fails here is undone here.
+// Called from constructors, whose destructor does not run on failure: rolls back itself.
 void MessageHandler::Install(VRKObject newObject) {
   VRKMessageHandler installed{};
   ThrowIfFailed(VRKMessageHandlerInstall(newObject, 0, &Callback, this, 0, 0, &installed));
@@ -117,8 +117,8 @@ void MessageHandler::Install(VRKObject newObject) {
 VRKResult VRK_CALL MessageHandler::Callback(VRKObject receiver, VRKToken message,
                                             VRKDictionary parameters, void* context) {
   MessageHandler& handler = *static_cast<MessageHandler*>(context);
-  if (Farewell::IsSaidBy(&handler)) return kResultNotHandled;
-  RunningCall call(&handler);
+  if (DestructionScope::IsDestroying(&handler)) return kResultNotHandled;
+  ActiveCall call(&handler);
   const VRKMessageHandler served = handler.registration;
   const VRKResult handled = AtBoundary(parameters, [&] {
     const DictionaryRef held(parameters);

@@ -1,20 +1,27 @@
-// The base of what answers the messages to a kernel object.
+// The base class of message handlers.
 #pragma once
 
 #include <cstdint>
 
-#include "Holders.h"
+#include "KernelRefs.h"
 #include "Memory.h"
 #include "VarnelKernel.h"
 
 namespace Varnel {
 
-// Attached to at most one object, to which it holds no reference; detached again when the object
-// dies. Attached, it receives "message:orvane.vrk.object-died" and what it asks for.
+// Handles messages to a kernel object. It is attached to at most one object, holds no reference to
+// it, and is detached when the object dies. While attached it receives
+// "message:orvane.vrk.object-died" and the messages added with AddMessages.
+//
+// Example: a handler that lives as long as its object.
+//
+//   auto handler = std::make_unique<Logger>(object, true);  // deletes itself with the object
+//   handler->AddMessages(&token, 1);
+//   handler.release();
 class MessageHandler : public Memory<KernelMemoryPolicy> {
  public:
-  // Attaches the handler unless the object is null. With `deletesItself` the handler, which was
-  // then made with new, deletes itself when its object dies. Throws what SetObject throws.
+  // Attaches the handler unless the object is null. With `deletesItself` the handler deletes itself
+  // when its object dies. Requires: allocated with new if `deletesItself`. Throws: as SetObject.
   MessageHandler(VRKObject attachTo, bool deletesItself);
   MessageHandler(const MessageHandler&) = delete;
   MessageHandler& operator=(const MessageHandler&) = delete;
@@ -22,27 +29,27 @@ class MessageHandler : public Memory<KernelMemoryPolicy> {
   // Ends the registration.
   virtual ~MessageHandler();
 
-  // Attaches the handler to an object, and detaches it from the one it was on. When it fails, the
-  // handler is detached, unless the object is null (InputContractViolation) or the kernel does not
-  // let the handler off its object. A registration that is null is an Exception of
-  // kResultHandlerNotInstalled.
+  // Detaches the handler from its object and attaches it to another. After a failure the handler is
+  // detached, unless the object is null or the kernel refused to detach it.
+  // Throws: InputContractViolation for a null object, Exception for the kernel's failures,
+  // Exception with kResultHandlerNotInstalled if the kernel stores no registration.
   virtual void SetObject(VRKObject newObject);
 
-  // Called when the object has died, after HandleMessage was, also if that threw.
+  // Called when the object has died, after HandleMessage, also if that threw. Not called if
+  // HandleMessage attached the handler to another object.
   virtual void ObjectDied();
 
-  // Returns whether it took the message; what it throws becomes the delivery's result. It may
-  // delete the handler, except when the object has died.
+  // Returns whether it took the message. An exception becomes the result of the delivery. May
+  // delete the handler, except for "message:orvane.vrk.object-died".
   virtual bool HandleMessage(VRKObject receiver, VRKToken message,
                              const DictionaryRef& parameters) = 0;
 
-  // Asks for messages, besides those asked for before. Throws the Exception of
-  // kResultHandlerNotInstalled on a detached handler.
+  // Adds messages to those that the handler receives. Throws: Exception with
+  // kResultHandlerNotInstalled if the handler is detached, Exception for the kernel's failures.
   void AddMessages(const VRKToken* messages, uint32_t count);
 
  protected:
-  // Deletes the handler, which was made with new: at once, or when the calls of it that are running
-  // have returned.
+  // Deletes the handler, after its running calls have returned. Requires: allocated with new.
   void DeleteSelf();
 
   VRKObject object{};
@@ -50,7 +57,7 @@ class MessageHandler : public Memory<KernelMemoryPolicy> {
   bool deleteWhenObjectDies;
 
  private:
-  struct RunningCall;
+  struct ActiveCall;
 
   static VRKResult VRK_CALL Callback(VRKObject receiver, VRKToken message, VRKDictionary parameters,
                                      void* context);

@@ -6,15 +6,15 @@
 
 namespace orvane {
 
-// One pointer to a NUL-terminated byte string of which the process keeps a single one. Names are
-// compared for equality as pointers, and ordered by the bytes of their texts.
+// A pointer to an interned NUL-terminated byte string. Equality compares pointers; order compares
+// the bytes of the texts.
 class name_t {
  public:
   name_t() noexcept : interned(emptyText) {}
 
-  // Takes over no copy of the text: the first text of its kind is the one that all equal names
-  // point at, so it must stay as it is until the process ends. Null gives the empty name. Takes
-  // time logarithmic in the number of names; throws std::bad_alloc.
+  // Interns the text without a copy: all equal names point at the first text passed. Null gives the
+  // empty name. O(log n) in the number of names. Requires: the text stays valid and unchanged until
+  // the process ends. Throws: std::bad_alloc.
   explicit name_t(const char* text);
 
   const char* text() const noexcept { return interned; }

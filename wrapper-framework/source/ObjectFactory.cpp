@@ -3,19 +3,19 @@
 #include <utility>
 
 #include "Boundary.h"
+#include "DestructionScope.h"
 #include "Exceptions.h"
-#include "Farewell.h"
 #include "ResultCodes.h"
 
 namespace Varnel {
 namespace {
 
-// An object on its way to the kernel; it dies where the way ends early.
-struct ObjectInTheMaking {
-  ObjectInTheMaking() = default;
-  ObjectInTheMaking(const ObjectInTheMaking&) = delete;
-  ObjectInTheMaking& operator=(const ObjectInTheMaking&) = delete;
-  ~ObjectInTheMaking() {
+// Releases the object unless it is handed over to the kernel.
+struct ScopedObject {
+  ScopedObject() = default;
+  ScopedObject(const ScopedObject&) = delete;
+  ScopedObject& operator=(const ScopedObject&) = delete;
+  ~ScopedObject() {
     if (object != VRKObject{}) VRKObjectRelease(object);
   }
 
@@ -25,7 +25,7 @@ struct ObjectInTheMaking {
 }  // namespace
 
 ObjectFactory::~ObjectFactory() {
-  const Farewell farewell(this);
+  const DestructionScope destruction(this);
   VRKObjectFactoryUnregister(0, &Callback, this);
 }
 
@@ -46,8 +46,8 @@ VRKResult VRK_CALL ObjectFactory::Callback(VRKToken objectClass, VRKDictionary p
                                            void* context, VRKObject* outObject) {
   return AtBoundary({}, [&] {
     if (context == nullptr || outObject == nullptr) throw InputContractViolation();
-    if (Farewell::IsSaidBy(context)) throw InvariantViolation();
-    ObjectInTheMaking making;
+    if (DestructionScope::IsDestroying(context)) throw InvariantViolation();
+    ScopedObject making;
     static_cast<ObjectFactory*>(context)->CreateObject(objectClass, parameters, &making.object);
     if (making.object == VRKObject{}) throw OutputContractViolation();
     *outObject = std::exchange(making.object, VRKObject{});

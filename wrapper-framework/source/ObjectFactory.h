@@ -1,9 +1,9 @@
-// The base of what makes the objects of a kernel class.
+// The base class of object factories.
 #pragma once
 
 #include <cstdint>
 
-#include "Holders.h"
+#include "KernelRefs.h"
 #include "Memory.h"
 #include "VarnelKernel.h"
 
@@ -11,24 +11,26 @@ namespace Varnel {
 
 class ObjectFactory : public Memory<KernelMemoryPolicy> {
  public:
-  // Serves no class yet. The objects that the factory extends are of class `base`, or plain ones.
+  // Not registered. New objects are created with class `base`, or as plain ones if it is null.
   explicit ObjectFactory(VRKToken base = {}) noexcept : baseClass(base) {}
   ObjectFactory(const ObjectFactory&) = delete;
   ObjectFactory& operator=(const ObjectFactory&) = delete;
 
-  // Unregisters the factory. Objects that it made stay.
+  // Unregisters the factory. Objects that it created stay. The kernel may call the factory until
+  // then, after the members of derived classes are destroyed; state that InitializeObject uses
+  // belongs into a base class declared before this one.
   virtual ~ObjectFactory();
 
-  // Attaches to a new object what makes it one of the class that was asked for. When it throws, the
-  // object is released and its creation fails. May delete the factory.
+  // Attaches handlers to a new object of the requested class. An exception fails the creation and
+  // releases the object. May delete the factory.
   virtual void InitializeObject(VRKToken objectClass, const DictionaryRef& parameters,
                                 const ObjectRef& newObject) = 0;
 
-  // The kernel has the factory make the objects of this class from now on. `reserved` is 0.
+  // Registers the factory for a class. `reserved` is 0. Throws: Exception with the kernel's code.
   void Register(VRKToken objectClass, uint32_t reserved);
 
-  // Makes an object of the base class, stores it, owned by the caller, and initialises it. When it
-  // throws, an object may be stored all the same.
+  // Creates an object of the base class, stores it, owned by the caller, and initialises it. May
+  // have stored an object when it throws.
   void CreateObject(VRKToken objectClass, VRKDictionary parameters, VRKObject* outObject);
 
  protected:

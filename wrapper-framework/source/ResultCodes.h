@@ -1,5 +1,4 @@
-// The result codes that have a meaning here. Any other that the kernel returns is passed on as it
-// is.
+// The result codes that this code knows. Any other code of the kernel is passed on unchanged.
 #pragma once
 
 #include <cstdint>
@@ -8,7 +7,7 @@ namespace Varnel {
 
 inline constexpr uint32_t kResultNoError = 0;
 inline constexpr uint32_t kResultInputContractViolation = 13;  // also: data cannot be coerced to
-                                                               // the type that a reader needs
+                                                               // the type of a reader
 inline constexpr uint32_t kResultOutputContractViolation = 14;
 inline constexpr uint32_t kResultInvariantViolation = 15;
 inline constexpr uint32_t kResultHandlerNotInstalled = 16;

@@ -7,7 +7,7 @@
 namespace orvane {
 namespace {
 
-// What a shared sequence counts and frees.
+// The base of the reference-counted representations.
 struct counted_t {
   counted_t() = default;
   counted_t(const counted_t&) = delete;
@@ -18,8 +18,8 @@ struct counted_t {
   counted_t* nextDying = nullptr;
 };
 
-// The elements of one that dies can hold others that die with it. Those wait in a list until it is
-// gone, so that none is destroyed from within another.
+// Deferred destruction: representations that lose their last reference while another is destroyed
+// are queued, so deep nesting takes no stack.
 void release(counted_t* counted) noexcept {
   static counted_t* dying = nullptr;
   static bool destroying = false;
@@ -143,7 +143,7 @@ shared_sequence<Element>::shared_sequence(const shared_sequence& other) noexcept
   ++representation->useCount;
 }
 
-// The other handle may be among what is released.
+// Retains first: `other` may be part of what is released.
 template <class Element>
 shared_sequence<Element>& shared_sequence<Element>::operator=(
     const shared_sequence& other) noexcept {
@@ -201,7 +201,7 @@ void dictionary_t::insert_or_assign(name_t name, const value_t& value) {
   }
 }
 
-// Compares pairs of values; arrays and dictionaries wait in a list until their turn comes.
+// Compares values. Nested arrays and dictionaries are queued, so deep nesting takes no stack.
 class comparison {
  public:
   bool compare(const array_t& left, const array_t& right) {
@@ -231,8 +231,8 @@ class comparison {
   }
 
  private:
-  // Whether the two were compared before, or are being compared, which decides for them here too.
-  // Only what is shared can be met again.
+  // Whether this pair was compared before or is queued, so that shared parts are compared once.
+  // Sequences that are not shared cannot occur twice.
   template <class Sequence>
   bool is_known(const Sequence& left, const Sequence& right) {
     if (left.use_count() == 1 || right.use_count() == 1) return false;

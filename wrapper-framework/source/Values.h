@@ -1,7 +1,7 @@
-// Values: structured data as C++ objects, apart from any kernel.
+// Values: structured data as C++ objects, independent of any kernel.
 //
-// Nothing here is synchronised, not even between values that share nothing but the process. All of
-// it throws std::bad_alloc and nothing else, and nothing needs more stack for deeper nesting.
+// Nothing here is synchronised, not even between unrelated values: counts and the queue of deferred
+// destruction are plain process-wide state. Nesting takes no stack. Throws: std::bad_alloc only.
 #pragma once
 
 #include <concepts>
@@ -24,7 +24,7 @@ struct empty_t {
   friend bool operator==(empty_t, empty_t) noexcept { return true; }
 };
 
-// What a value can hold. A std::string holds bytes.
+// The types that a value can hold. A std::string holds bytes.
 template <class T>
 concept held_type = std::same_as<T, empty_t> || std::same_as<T, double> || std::same_as<T, bool> ||
     std::same_as<T, std::string> || std::same_as<T, name_t> || std::same_as<T, array_t> ||
@@ -32,7 +32,7 @@ concept held_type = std::same_as<T, empty_t> || std::same_as<T, double> || std::
 
 enum class type_t : uint8_t { empty, number, truth, bytes, name, array, dictionary };
 
-// Holds one thing of the held types, on the heap.
+// Holds one object of one of the held types, on the heap.
 class value_t {
  public:
   class implementation_t;
@@ -46,18 +46,19 @@ class value_t {
   value_t(value_t&& other) noexcept;  // leaves the other holding empty_t
   ~value_t();
 
-  // Assigns in place where both hold the same type. Otherwise, when it throws, nothing has changed.
+  // Assigns in place if both hold the same type. Otherwise an exception leaves this value
+  // unchanged.
   value_t& operator=(const value_t& other);
   value_t& operator=(value_t&& other) noexcept;
 
   type_t type() const noexcept;
 
-  // The held T, or null when something else is held; valid until the value changes.
+  // Returns the held T, or null if another type is held. Valid until the value changes.
   template <held_type T>
   const T* get_if() const noexcept;
 
-  // Values of different types are unequal, numbers compare as numbers, and arrays and dictionaries
-  // by what is in them, unless they share it.
+  // Values of different types are unequal. Arrays and dictionaries compare their elements, unless
+  // they share them.
   friend bool operator==(const value_t& left, const value_t& right);
 
  private:
@@ -70,7 +71,7 @@ class value_t {
   implementation_t* implementation;  // owned unless it is moved_from(); never null
 };
 
-// One held thing. Where two take part, both hold the same type.
+// A held object. Binary operations require that both hold the same type.
 class value_t::implementation_t {
  public:
   implementation_t() = default;
@@ -86,27 +87,26 @@ class value_t::implementation_t {
   implementation_t(const implementation_t&) = default;
 };
 
-// A handle to a sequence that it shares with its copies, until one of them is to change. The count
-// of handles is a plain 32-bit integer.
+// A copy-on-write sequence. Its reference count is a plain 32-bit integer.
 template <class Element>
 class shared_sequence {
  public:
-  shared_sequence();  // shares the process's one empty sequence
+  shared_sequence();  // shares the process-wide empty sequence
   shared_sequence(const shared_sequence& other) noexcept;
   shared_sequence& operator=(const shared_sequence& other) noexcept;
   ~shared_sequence();
 
-  // Valid until the handle changes.
+  // Valid until this object changes.
   std::span<const Element> elements() const noexcept;
 
-  // How many handles share the sequence.
+  // The reference count.
   uint32_t use_count() const noexcept;
   bool shares_with(const shared_sequence& other) const noexcept {
     return representation == other.representation;
   }
 
  protected:
-  // The sequence, after it was copied if others share it.
+  // Returns the elements, after copying them if they are shared.
   std::vector<Element>& unique();
 
  private:
@@ -120,16 +120,16 @@ class shared_sequence {
 
 class array_t : public shared_sequence<value_t> {
  public:
-  // When it throws, the array is as it was.
+  // An exception leaves the array unchanged.
   void push_back(value_t value);
 
   friend bool operator==(const array_t& left, const array_t& right);
 };
 
-// Names with their values, in the order of the names' bytes, each name once.
+// Pairs of unique names and values, ordered by the bytes of the names.
 class dictionary_t : public shared_sequence<std::pair<name_t, value_t>> {
  public:
-  // When it throws, the dictionary is as it was.
+  // An exception leaves the dictionary unchanged.
   void insert_or_assign(name_t name, const value_t& value);
 
   friend bool operator==(const dictionary_t& left, const dictionary_t& right);

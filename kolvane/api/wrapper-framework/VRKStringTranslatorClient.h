@@ -1,29 +1,35 @@
-// Translator objects of the kernel, used like translators.
+// The client of a translator object in the kernel.
 #pragma once
 
 #include <boost/shared_ptr.hpp>
 
-#include "Holders.h"
+#include "KernelRefs.h"
 #include "VRKStringTranslatorInterface.h"
 
 namespace Varnel {
 
-// Turns each operation into a message to a translator object, to which it holds a reference; copies
-// hold one each. Throws the kernel's failures, and those of whatever serves the object, as
-// Exception; what it made for the message is released. When the object takes no such message
-// nothing happens, but that TranslateString misses the result and throws the kernel's code for
-// that.
+// Sends each operation as a message to a translator object, to which it and each of its copies hold
+// a reference. If the object does not handle the message, nothing happens, except that
+// TranslateString throws the kernel's code for a missing entry.
+//
+// Throws: Exception with the kernel's code, or that of the object's handler.
+//
+// Example:
+//
+//   const auto translator = Varnel::CreateStringTranslator();
+//   translator->SetTranslations(image.units.get(), image.unitCount);
+//   translator->TranslateString(key.data(), keyLength, result);
 class StringTranslatorClient : public StringTranslatorInterface {
  public:
-  StringTranslatorClient() = default;  // has no object; messages go to the null object
+  StringTranslatorClient() = default;  // without an object: messages fail with kVRKInvalidHandle
 
-  // Takes a reference of its own, and releases the one it had; keeps that when it throws.
+  // Replaces the object. Keeps the old one if it throws.
   void SetObject(const ObjectRef& newObject) { object = newObject; }
 
   void MakeDefault() override;
 
-  // The bytes are sent as UTF-8 text, which the kernel turns into UTF-16. Use the units for an
-  // image that may be anything else; see VRKTranslationImage.h.
+  // Bytes are sent as UTF-8 text, which the kernel converts to UTF-16. For any other image use
+  // units (VRKTranslationImage.h).
   void SetTranslations(const char* bytes, uint32_t byteCount) override;
   void SetTranslations(const uint16_t* units, uint32_t unitCount) override;
 
@@ -33,7 +39,7 @@ class StringTranslatorClient : public StringTranslatorInterface {
   ObjectRef object;
 };
 
-// A client of a new translator object, which has a translator of its own.
+// Returns a client of a new translator object with its own translator.
 boost::shared_ptr<StringTranslatorInterface> CreateStringTranslator();
 
 }  // namespace Varnel

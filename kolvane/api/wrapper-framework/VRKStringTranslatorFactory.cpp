@@ -17,11 +17,11 @@ StringTranslatorFactory::StringTranslatorFactory(Creator translatorCreator,
 
 void StringTranslatorFactory::InitializeObject(VRKToken, const DictionaryRef& parameters,
                                                const ObjectRef& newObject) {
-  const Creator kept = creator;  // the host's coercions, called next, may end the factory
+  const Creator kept = creator;  // AsDictionary calls coercions, which may destroy the factory
   const boost::shared_ptr<StringTranslatorInterface> translator = kept(AsDictionary(parameters));
   auto handler = std::make_unique<StringTranslatorHandler>(translator);
-  handler->LiveWith(newObject.Get());
-  static_cast<void>(handler.release());  // it is its object's from here on
+  handler->AttachAndOwn(newObject.Get());
+  static_cast<void>(handler.release());  // owned by the object
 }
 
 }  // namespace Varnel

@@ -1,4 +1,4 @@
-// What makes translator objects of a kernel class.
+// The factory of translator objects of a kernel class.
 #pragma once
 
 #include <boost/function.hpp>
@@ -11,25 +11,25 @@
 
 namespace Varnel {
 
-// Makes the translator for a new object from the object's creation parameters.
+// Returns the translator of a new object, given the object's creation parameters.
 using StringTranslatorCreator =
     boost::function<boost::shared_ptr<StringTranslatorInterface>(orvane::dictionary_t const&)>;
 
-// A base, so that the creator is destroyed only after the factory was unregistered.
+// A base class, so that the creator is destroyed after the factory is unregistered.
 struct StringTranslatorCreatorHolder {
   StringTranslatorCreator creator;
 };
 
-// Lives in kernel memory. Gives each new object a translator, which its creator makes, and a
-// handler that lives as long as the object. Keeps no reference to either.
+// Attaches to each new object a handler that lives as long as the object and shares the translator
+// that the creator returns. The factory keeps no reference to either. Allocated in kernel memory.
 class StringTranslatorFactory : private StringTranslatorCreatorHolder, public ObjectFactory {
  public:
   using Creator = StringTranslatorCreator;
 
-  // Serves the class from now on. Throws the kernel's failures; std::bad_alloc.
+  // Registers the factory for the class. Throws: Exception with the kernel's code, std::bad_alloc.
   StringTranslatorFactory(Creator translatorCreator, orvane::name_t servedClass);
 
-  // What it throws, and what the creator throws, becomes the result of the object's creation.
+  // Exceptions, also the creator's, become the result of the object's creation.
   void InitializeObject(VRKToken objectClass, const DictionaryRef& parameters,
                         const ObjectRef& newObject) override;
 };

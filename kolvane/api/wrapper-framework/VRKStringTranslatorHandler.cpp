@@ -6,8 +6,8 @@
 #include <vector>
 
 #include "Data.h"
+#include "DestructionScope.h"
 #include "Exceptions.h"
-#include "Farewell.h"
 #include "ReportedCheck.h"
 #include "ResultCodes.h"
 #include "Tokens.h"
@@ -16,8 +16,7 @@
 namespace Varnel {
 namespace {
 
-// Shared by all handlers. They are forgotten whenever an object dies that a handler lived with, and
-// made anew when they are next used.
+// A token cache shared by all handlers, reset when the object of an owned handler dies.
 struct HandlerTokens {
   StaticToken makeDefault{kMessageMakeDefault};
   StaticToken setTranslations{kMessageSetTranslations};
@@ -52,7 +51,7 @@ std::string KeyText(DataRef& translationKey) {
     ReportedCheck(gTranslationKeySite,
                   [&] { return translationKey.Coerce(gTokens.typeUTF8.Get(), translationKey); });
   }
-  return Terminated(GetUTF8(translationKey));
+  return WithTerminator(GetUTF8(translationKey));
 }
 
 }  // namespace
@@ -62,7 +61,7 @@ StringTranslatorHandler::StringTranslatorHandler(
     : MessageHandler({}, false), translator(std::move(servingTranslator)) {}
 
 StringTranslatorHandler::~StringTranslatorHandler() {
-  const Farewell farewell(this);
+  const DestructionScope destruction(this);
   translator.reset();
 }
 
@@ -75,7 +74,7 @@ void StringTranslatorHandler::SetObject(VRKObject newObject) {
   AddMessages(messages.data(), static_cast<uint32_t>(messages.size()));
 }
 
-void StringTranslatorHandler::LiveWith(VRKObject newObject) {
+void StringTranslatorHandler::AttachAndOwn(VRKObject newObject) {
   SetObject(newObject);
   if (registration == VRKMessageHandler{}) ThrowResultCode(kResultHandlerNotInstalled);
   ownsItself = true;

@@ -1,4 +1,4 @@
-// What serves the messages to a translator object.
+// The message handler of translator objects.
 #pragma once
 
 #include <boost/shared_ptr.hpp>
@@ -8,24 +8,25 @@
 
 namespace Varnel {
 
-// Lives in kernel memory, and holds a share of its translator. Failures of the translator and of
-// the kernel become the result of the delivery.
+// Turns the three messages of VRKStringTranslatorProtocol.h into calls on a translator, whose
+// ownership it shares. Failures of the translator and the kernel become the result of the delivery.
+// Allocated in kernel memory.
 class StringTranslatorHandler : public MessageHandler {
  public:
-  // Attached to no object yet.
+  // Not attached to an object.
   explicit StringTranslatorHandler(boost::shared_ptr<StringTranslatorInterface> servingTranslator);
 
   // Releases the translator, then ends the registration. Messages that arrive meanwhile are not
   // handled.
   ~StringTranslatorHandler() override;
 
-  // Attaches the handler to an object and asks for the three messages of a translator. When asking
-  // fails, the handler stays attached.
+  // Attaches the handler to an object and adds the three messages. If adding fails, the handler
+  // stays attached.
   void SetObject(VRKObject newObject) override;
 
-  // Attaches the handler, which was made with new, to an object, with which it dies. When it
-  // throws, as it does when the object dies meanwhile, the handler is the caller's still.
-  void LiveWith(VRKObject newObject);
+  // Attaches the handler to an object and gives the object ownership of it. If this throws, also
+  // because the object died meanwhile, the caller keeps ownership. Requires: allocated with new.
+  void AttachAndOwn(VRKObject newObject);
 
   void ObjectDied() override;
   bool HandleMessage(VRKObject receiver, VRKToken message,

@@ -1,10 +1,10 @@
-// Holders of kernel data, lists, dictionaries and objects, with the kernel's operations on them.
-// Each throws the kernel's code as an Exception, and leaves what it would have replaced.
+// Owning handles of kernel data, lists, dictionaries and objects, with the kernel's operations on
+// them. Throws: Exception with the kernel's code; outputs are then unchanged.
 #pragma once
 
 #include <cstdint>
 
-#include "HandleHolder.h"
+#include "RefHandle.h"
 #include "VarnelKernel.h"
 
 namespace Varnel {
@@ -37,31 +37,31 @@ struct ObjectTraits {
   static VRKResult Release(VRKObject object) noexcept { return VRKObjectRelease(object); }
 };
 
-class DataRef : public HandleHolder<DataTraits> {
+class DataRef : public RefHandle<DataTraits> {
  public:
-  using HandleHolder::HandleHolder;
+  using RefHandle::RefHandle;
 
-  // Becomes new data with a copy of the bytes.
+  // Replaces the handle by one of new data with a copy of the bytes.
   void Create(VRKToken type, const void* bytes, uint32_t byteCount);
 
-  // Puts this data, as data of another type, into `target`, which may be this holder itself. False,
-  // and `target` left alone, when that is impossible.
+  // Stores the coerced data in `target`, which may be this object. Returns false and leaves
+  // `target` unchanged if the coercion is impossible.
   bool Coerce(VRKToken toType, DataRef& target) const;
 };
 
-class ListRef : public HandleHolder<ListTraits> {
+class ListRef : public RefHandle<ListTraits> {
  public:
-  using HandleHolder::HandleHolder;
+  using RefHandle::RefHandle;
 
   uint32_t GetSize() const;
   DataRef GetEntry(uint32_t index) const;
 };
 
-class DictionaryRef : public HandleHolder<DictionaryTraits> {
+class DictionaryRef : public RefHandle<DictionaryTraits> {
  public:
-  using HandleHolder::HandleHolder;
+  using RefHandle::RefHandle;
 
-  // Becomes a new, empty dictionary.
+  // Replaces the handle by one of a new, empty dictionary.
   void Create();
 
   void SetEntry(VRKToken key, const DataRef& data) const;
@@ -69,16 +69,16 @@ class DictionaryRef : public HandleHolder<DictionaryTraits> {
   ListRef CreateKeyList() const;
 };
 
-class ObjectRef : public HandleHolder<ObjectTraits> {
+class ObjectRef : public RefHandle<ObjectTraits> {
  public:
-  using HandleHolder::HandleHolder;
+  using RefHandle::RefHandle;
 
-  // Becomes a new object of the class. `parameters` may be null.
+  // Replaces the handle by one of a new object of the class. `parameters` may be null.
   void Create(VRKToken objectClass, VRKDictionary parameters);
 };
 
-// Returns whether a handler took the message, and throws what a handler failed with. Results are in
-// the parameters afterwards. The kernel's flag is 0 for a true `clearFlag`, else 1.
+// Returns whether a handler took the message. Results are in `parameters` afterwards. The kernel's
+// flag is 0 if `clearFlag` is true, else 1. Throws: Exception with a handler's failure code.
 bool DeliverMessage(VRKObject object, VRKToken message, const DictionaryRef& parameters,
                     bool clearFlag);
 

@@ -2,7 +2,7 @@
 #include <random>
 
 #include "Exceptions.h"
-#include "Holders.h"
+#include "KernelRefs.h"
 #include "Support.h"
 #include "Tokens.h"
 
@@ -55,16 +55,16 @@ void HoldAsTheModelDoes(const std::string& kind, const std::function<VRKResult(t
   EXPECT_GT(failures, 300);
 }
 
-using HoldersTest = KernelTest;
+using KernelRefsTest = KernelTest;
 
-TEST_F(HoldersTest, HoldAsTheModelDoes) {
+TEST_F(KernelRefsTest, HoldAsTheModelDoes) {
   HoldAsTheModelDoes<DataRef>("VRKData", [](VRKData* out) { return VRKDataCreate(Varnel::gTypeUTF8.Get(), nullptr, 0, 0, out); });
   HoldAsTheModelDoes<ListRef>("VRKList", VRKHostListCreate);
   HoldAsTheModelDoes<DictionaryRef>("VRKDictionary", [](VRKDictionary* out) { return VRKDictionaryCreate(0, out); });
   HoldAsTheModelDoes<ObjectRef>("VRKObject", [](VRKObject* out) { return VRKObjectCreate({}, {}, out); });
 }
 
-TEST_F(HoldersTest, CoerceIntoThemselvesOnlyWhereItIsPossible) {
+TEST_F(KernelRefsTest, CoerceIntoThemselvesOnlyWhereItIsPossible) {
   DataRef data;
   data.Create(Varnel::gTypeUTF8.Get(), "ab", 2);
   const VRKData before = data.Get();
@@ -76,7 +76,7 @@ TEST_F(HoldersTest, CoerceIntoThemselvesOnlyWhereItIsPossible) {
   EXPECT_NE(data.Get(), before);
 }
 
-TEST_F(HoldersTest, TokensAreCachedUntilReset) {
+TEST_F(KernelRefsTest, TokensAreCachedUntilReset) {
   static Varnel::StaticToken token{"token:test"};
   token.token = {};
   CallTrace trace;

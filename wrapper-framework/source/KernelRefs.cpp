@@ -1,4 +1,4 @@
-#include "Holders.h"
+#include "KernelRefs.h"
 
 #include "ResultCodes.h"
 
