@@ -16,7 +16,13 @@ using varnel_kernel::PlugIn;
 
 namespace {
 
-thread_local std::string gLoadError;
+// Trivially destructible: registering a destructor for a thread takes the loader's lock, and a
+// callback that asks for the error holds the kernel's.
+thread_local char gLoadError[4096];
+
+void SetLoadError(const std::string& reason) noexcept {
+  gLoadError[reason.copy(gLoadError, sizeof gLoadError - 1)] = '\0';
+}
 
 // Serves one host call: locks the kernel and runs `body` with it if it is running.
 template <class Body>
@@ -35,7 +41,9 @@ VRKResult CreateHandleData(VRKToken type, Handle handle, VRKData* outData, Kerne
 VRKResult AddPlugIn(platform::SharedLibrary library, const char* prefix,
                     VRKPlugIn& outPlugIn) noexcept {
   return CatchAll([&]() -> VRKResult {
-    std::unique_ptr<PlugIn> plugIn = FindPlugIn(library, prefix, gLoadError);
+    std::string reason;
+    std::unique_ptr<PlugIn> plugIn = FindPlugIn(library, prefix, reason);
+    SetLoadError(reason);
     if (plugIn == nullptr) return kVRKNotFound;
     return ServeHost([&](Kernel& kernel) {
       outPlugIn = kernel.plugIns.Add(std::move(plugIn));
@@ -78,13 +86,15 @@ VRKResult VRKHostGetLiveCounts(VRKHostLiveCounts* outLive) {
 // loaded or unloaded takes the loader's lock first, then the kernel's.
 
 VRKResult VRKHostPlugInLoad(const char* path, const char* prefix, VRKPlugIn* outPlugIn) {
-  gLoadError.clear();
+  SetLoadError({});
   const bool given = path != nullptr && *path != 0 && prefix != nullptr && outPlugIn != nullptr;
   const VRKResult ready =
       ServeHost([=](Kernel&) { return given ? kVRKNoError : kVRKInvalidArgument; });
   if (ready != kVRKNoError) return ready;
   return CatchAll([&]() -> VRKResult {
-    const platform::SharedLibrary library = platform::LoadSharedLibrary(path, gLoadError);
+    std::string reason;
+    const platform::SharedLibrary library = platform::LoadSharedLibrary(path, reason);
+    SetLoadError(reason);
     if (library == nullptr) return kVRKNotFound;
     const VRKResult result = AddPlugIn(library, prefix, *outPlugIn);
     if (result != kVRKNoError) UnloadRefused(library);
@@ -93,7 +103,7 @@ VRKResult VRKHostPlugInLoad(const char* path, const char* prefix, VRKPlugIn* out
 }
 
 const char* VRKHostLoadError() {
-  return gLoadError.c_str();
+  return gLoadError;
 }
 
 VRKResult VRKHostPlugInInitialize(VRKPlugIn plugIn) {

@@ -52,13 +52,14 @@ VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
  * library that lacks one is unloaded again, unless it has installed callbacks or its code is
  * running.
  *
- * Not to be called from within a callback, which holds the kernel's lock: where another thread
- * loads or unloads a library that calls the kernel meanwhile, each would wait for the other. */
+ * Requires: no callback of the kernel makes this call while another thread loads or unloads a
+ * library that calls the kernel. The callback holds the kernel's lock, so each would wait for the
+ * other. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefix,
                                              VRKPlugIn* outPlugIn);
 
 /* The reason for which the calling thread's latest VRKHostPlugInLoad returned kVRKNotFound, else an
- * empty text. Valid until the thread's next VRKHostPlugInLoad. */
+ * empty text; cut after 4,095 bytes. Valid until the thread's next VRKHostPlugInLoad. */
 VRK_API const char* VRK_CALL VRKHostLoadError(void);
 
 /* Call the entry points and return their results. The kernel retains objects whose creation
@@ -71,7 +72,7 @@ VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outV
 /* Unloads the library, whether it was terminated or not. Objects that the kernel retains for it are
  * released first. kVRKInUse: one of its callbacks is still installed, including the trace hook and
  * the reporter, or its code is running; the library stays. Code in other libraries that it loaded
- * is not considered. Like VRKHostPlugInLoad, not to be called from within a callback. */
+ * is not considered. Requires: as VRKHostPlugInLoad. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInUnload(VRKPlugIn plugIn);
 
 /* Lists, and data that holds handles. Outs are owned by the caller. */

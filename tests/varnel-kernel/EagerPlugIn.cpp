@@ -1,4 +1,5 @@
-// A plug-in whose constructor calls the kernel: creates a token after a pause, and sets a trace hook.
+// A plug-in whose constructor calls the kernel: creates a token after a pause, and sets a trace
+// hook and a reporter.
 #include <chrono>
 #include <thread>
 
@@ -16,12 +17,17 @@ VRKResult VRK_CALL Ignore(const VRKHostTraceCall*, void*) {
   return kVRKNoError;
 }
 
+uint32_t VRK_CALL IgnoreError(uint32_t, const char*, const char*, const char*, uint32_t, const char*, uint32_t*, void*) {
+  return 0;
+}
+
 const struct Eager {
   Eager() {
     std::this_thread::sleep_for(std::chrono::milliseconds(50));
     VRKToken token{};
     VRKTokenCreate("token:test.eager", 1, &token);
     VRKHostSetTraceHook(Ignore, nullptr);
+    VRKHostSetErrorReporter(IgnoreError, nullptr);
   }
 } gEager;
 

@@ -243,7 +243,7 @@ std::string EagerCopy() {
 VRKPlugIn LoadEager() {
   VRKPlugIn plugIn{};
   EXPECT_EQ(VRKHostPlugInLoad(EagerCopy().c_str(), "Eager", &plugIn), 0u) << VRKHostLoadError();
-  EXPECT_EQ(VRKHostSetTraceHook(nullptr, nullptr), 0u);
+  EXPECT_EQ(VRKHostSetTraceHook(nullptr, nullptr) + VRKHostSetErrorReporter(nullptr, nullptr), 0u);
   return plugIn;
 }
 
@@ -275,9 +275,30 @@ TEST_F(Kernel, ServesLibrariesThatCallItAsTheyAreLoaded) {
 
 TEST_F(Kernel, KeepsARefusedLibraryWhoseCodeItCalls) {
   VRKPlugIn plugIn{};
-  EXPECT_EQ(VRKHostPlugInLoad(EagerCopy().c_str(), "Hooking", &plugIn), kVRKNotFound);
+  EXPECT_EQ(VRKHostPlugInLoad(EagerCopy().c_str(), "Other", &plugIn), kVRKNotFound);
   Token("text:test");  // the library's hook is called
+  EXPECT_EQ(VRKHostPlugInLoad(EagerCopy().c_str(), "Other", &plugIn), kVRKNotFound);
   ASSERT_EQ(VRKHostSetTraceHook(nullptr, nullptr), 0u);
+  EXPECT_EQ(VRKRuntimeError(2, "", "", 0, "", 0, "", nullptr), 0u) << "by the library's reporter";
+}
+
+TEST_F(Kernel, TellsOfLoadErrorsInCallbacksBesideALoad) {
+  VRKObject object{};
+  ASSERT_EQ(VRKObjectCreate(VRKToken{}, VRKDictionary{}, &object), 0u);
+  OnMessage asks = [] {
+    std::this_thread::sleep_for(std::chrono::milliseconds(60));  // until the library calls the kernel
+    return *VRKHostLoadError() == 0 ? kVRKNoError : kVRKInvalidArgument;
+  };
+  Install(object, asks, "message:m");
+  const VRKToken message = Token("message:m");
+  auto loading = std::async(std::launch::async, [] { EXPECT_EQ(VRKHostPlugInUnload(LoadEager()), 0u); });
+  auto asking = std::async(std::launch::async, [&] {
+    std::this_thread::sleep_for(std::chrono::milliseconds(20));  // the load has begun
+    EXPECT_EQ(VRKObjectDeliverMessage(object, message, VRKDictionary{}, 1), 0u);
+  });
+  ExitUnlessDone(loading);
+  ExitUnlessDone(asking);
+  VRKObjectRelease(object);
 }
 
 VRKPlugIn LoadPlugIn(const std::string& whatItLeaves) {

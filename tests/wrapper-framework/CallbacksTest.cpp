@@ -179,6 +179,14 @@ TEST_F(CallbacksTest, StayOnTheObjectThatTheyMoveToAsTheirsDies) {
   }
 }
 
+TEST_F(CallbacksTest, DieWithTheirObjectsIfTheyFailToMove) {
+  ObjectRef object = PlainObject();
+  Handler* handler = nullptr;
+  handler = new Handler([&](auto&&...) { return handler->SetObject(VRKObject{0xFFFFFFFF}), true; }, object.Get(), true);
+  object.Reset();
+  EXPECT_EQ(Alive(), "");
+}
+
 TEST_F(CallbacksTest, MayDeleteThemselvesWithTheirObjects) {
   const VRKToken died = MakeToken("message:orvane.vrk.object-died");
   ObjectRef object = PlainObject();

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdint>
+#include <deque>
 #include <optional>
 #include <stdexcept>
 #include <string>
@@ -33,9 +34,8 @@ class Frame {
   // Moves to the next datum. Returns false at the end.
   bool Advance() {
     if (index >= items.GetSize()) return false;
-    datum = items.GetEntry(index++);
+    (IsDictionary() ? key : datum) = items.GetEntry(index++);
     if (!IsDictionary()) return true;
-    key = std::exchange(datum, DataRef());
     keyToken = ExtractData<VRKToken>(key);
     datum = dictionary.GetEntry(keyToken);
     return true;
@@ -48,7 +48,7 @@ class Frame {
     const orvane::name_t name = IsDictionary() ? TokenName(keyToken) : orvane::name_t();
     accepted.push_back({name, index, std::move(value)});
     datum.Reset();
-    key.Reset();
+    if (IsDictionary()) key.Reset();
   }
 
   orvane::array_t Array() {
@@ -98,7 +98,7 @@ class Conversion {
   void CountValue();
   std::string Counted(std::string text);
 
-  std::vector<Frame> frames;
+  std::deque<Frame> frames;                 // a stack that does not move its frames
   std::optional<orvane::value_t> finished;  // not yet accepted by the innermost frame
   size_t valueCount = 0;
   uint64_t textBytes = 0;

@@ -52,8 +52,8 @@ void ThrowResultCode(uint32_t code) {
   throw Exception(code);
 }
 
-// The first clause that matches decides. The three clauses before std::out_of_range matter to an
-// exception that is both.
+// The first clause that matches decides. Three clauses stand before std::out_of_range for
+// exceptions that also derive from it.
 uint32_t ResultCodeFromException(VRKDictionary errorInfo) noexcept {
   try {
     throw;

@@ -111,9 +111,8 @@ void MessageHandler::Install(VRKObject newObject) {
   }
 }
 
-// HandleMessage may delete the handler, except when the object has died. ObjectDied is called even
-// if HandleMessage threw, or the handler would stay on a dead object; but not if HandleMessage
-// moved the handler to another object, whose registration must stay.
+// HandleMessage may delete the handler, or attach it to another object, whose registration must
+// stay. Otherwise ObjectDied is called even if HandleMessage threw: the object is gone.
 VRKResult VRK_CALL MessageHandler::Callback(VRKObject receiver, VRKToken message,
                                             VRKDictionary parameters, void* context) {
   MessageHandler& handler = *static_cast<MessageHandler*>(context);
@@ -126,7 +125,8 @@ VRKResult VRK_CALL MessageHandler::Callback(VRKObject receiver, VRKToken message
     return taken ? kResultNoError : kResultNotHandled;
   });
   if (message != gObjectDied || call.handler == nullptr) return handled;
-  if (handler.object != receiver || handler.registration != served) return handled;
+  const VRKMessageHandler current = handler.registration;
+  if (current != VRKMessageHandler{} && current != served) return handled;
   return AtBoundary(parameters, [&] {
     handler.ObjectDied();
     return handled;

@@ -40,7 +40,7 @@ class MessageHandler : public Memory<KernelMemoryPolicy> {
   virtual void ObjectDied();
 
   // Returns whether it took the message. An exception becomes the result of the delivery. May
-  // delete the handler, except for "message:orvane.vrk.object-died".
+  // delete the handler.
   virtual bool HandleMessage(VRKObject receiver, VRKToken message,
                              const DictionaryRef& parameters) = 0;
 
