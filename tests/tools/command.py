@@ -60,6 +60,13 @@ class CommandTest(unittest.TestCase):
         done = subprocess.run([*KOLVANE, *map(str, arguments)], **chosen)
         return done.returncode, done.stdout or b"", (done.stderr or b"").decode()
 
+    def open_terminal(self):
+        """Returns the test's end and the command's end."""
+        try:
+            return os.openpty()
+        except (AttributeError, OSError) as error:
+            self.skipTest(f"cannot open a terminal: {error}")
+
     def file(self, content, name="d.txt"):
         self.folder.joinpath(name).write_bytes(content)
         return name

@@ -52,11 +52,12 @@ class Translate(CommandTest):
         self.addCleanup(os.close, folder)
         self.assertEqual(self.translate(stdin=nothing), (0, "", ""))
         self.assertEqual(self.translate(stdin=folder), (2, "", "kolvane: cannot read standard input\n"))
-        if not hasattr(os, "openpty"):
-            return
-        for end in (ends := os.openpty()):
-            self.addCleanup(os.close, end)
-        status, _, errors = self.translate(stdin=ends[1])
+
+    def test_a_terminal_without_keys(self):
+        ours, terminal = self.open_terminal()
+        status, _, errors = self.translate(stdin=terminal)
+        os.close(terminal)
+        os.close(ours)
         self.assertEqual(status, 2)
         self.assertIn("try 'kolvane translate --help'", errors)
 
