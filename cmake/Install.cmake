@@ -86,7 +86,8 @@ if(NOT WIN32)
   add_custom_command(OUTPUT ${manual}
     COMMAND ${GZIP} -9nc ${PROJECT_SOURCE_DIR}/docs/kolvane.1 > ${manual}
     DEPENDS docs/kolvane.1 VERBATIM)
-  add_custom_target(kolvane_manual ALL DEPENDS ${manual})
+  add_custom_target(kolvane_manual DEPENDS ${manual})
+  add_dependencies(kolvane kolvane_manual)  # building the command builds all that is installed
   install(FILES ${manual} DESTINATION ${CMAKE_INSTALL_MANDIR}/man1)
   install(FILES tools/kolvane/completions/kolvane.bash RENAME kolvane
     DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions)

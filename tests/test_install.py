@@ -1,6 +1,7 @@
 """Installs Kolvane, moves it, and builds the examples on it as their own projects:
 test_install.py SOURCE BUILD [CMAKE-OPTION...]; the options, for a cross build, go to the projects."""
 
+import functools
 import gzip
 import os
 import pathlib
@@ -76,6 +77,17 @@ class Install(unittest.TestCase):
             self.assertFalse(path.is_symlink(), path)
             for trace in (SOURCE, self.folder) if path.is_file() else ():
                 self.assertNotIn(os.fsencode(trace), path.read_bytes(), path)
+
+    @unittest.skipUnless((BUILD / "build.ninja").exists() and not OPTIONS, "scripts/run uses Ninja, for this machine")
+    def test_scripts_run_builds_all_that_is_installed(self):
+        [target] = re.findall(r"--target (\S+)", (SOURCE / "scripts/run").read_text())
+        ninja = functools.partial(self.must, "ninja", "-t", cwd=BUILD)
+        rules = [line.rsplit(": ", 1) for line in ninja("targets", "all").splitlines()]
+        built = {pathlib.Path(output).name for output, rule in rules if rule != "phony"}
+        installed = {path.name for path in self.prefix.rglob("*") if path.is_file()}
+        self.assertIn("kolvane", built & installed)
+        needed = {pathlib.Path(node).name for node in re.findall(r'label="(.+?)"', ninja("graph", target))}
+        self.assertEqual(built & installed - needed, set())
 
     @unittest.skipIf(OPTIONS, "no manual page on Windows")
     def test_manual_and_completions_know_every_option(self):
