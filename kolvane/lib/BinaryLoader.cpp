@@ -1,17 +1,16 @@
 #include "BinaryLoader.h"
 
 #include <algorithm>
-#include <istream>
 #include <limits>
 #include <optional>
 #include <utility>
 
+#include "ByteStreams.h"
 #include "Converters.h"
 #include "DictionaryReader.h"
 #include "DictionaryTable.h"
 #include "LittleEndian.h"
 #include "StoredGroups.h"
-#include "StreamSize.h"
 
 namespace tovali_private {
 namespace {
@@ -26,7 +25,7 @@ constexpr size_t kLengthSize = 4;
 // An image's stream, with what is left of it known beforehand.
 class ImageSource {
  public:
-  explicit ImageSource(std::istream& image) : stream(image), left(StreamSize(image)) {}
+  explicit ImageSource(InputStream& image) : stream(image), left(image.Size()) {}
 
   // Reads exactly `count` bytes, or fails before it allocates any.
   bool Read(Bytes& bytes, uint64_t count) {
@@ -40,8 +39,7 @@ class ImageSource {
     const uint64_t wanted = std::min(count, left);
     if (wanted > bytes.max_size()) throw std::bad_alloc();
     bytes.resize(static_cast<size_t>(wanted), boost::container::default_init);
-    stream.read(reinterpret_cast<char*>(bytes.data()), static_cast<std::streamsize>(wanted));
-    bytes.resize(static_cast<size_t>(stream.gcount()));
+    bytes.resize(stream.Read(bytes));
     left -= bytes.size();
     position += bytes.size();
   }
@@ -65,13 +63,13 @@ class ImageSource {
  private:
   bool Read(std::span<uint8_t> bytes) {
     if (bytes.size() > left) return false;
-    stream.read(reinterpret_cast<char*>(bytes.data()), static_cast<std::streamsize>(bytes.size()));
-    left -= bytes.size();
-    position += bytes.size();
-    return static_cast<bool>(stream);
+    const size_t count = stream.Read(bytes);
+    left -= count;
+    position += count;
+    return count == bytes.size();
   }
 
-  std::istream& stream;
+  InputStream& stream;
   uint64_t position = 0;
   uint64_t left;
 };
@@ -87,7 +85,7 @@ struct Tables1_5 {
 // Takes an image apart into groups, with a look at lengths, but none at keys and values.
 class BinaryParser {
  public:
-  BinaryParser(std::istream& image, StoredImage& storedImage, LoadStatus& loadStatus)
+  BinaryParser(InputStream& image, StoredImage& storedImage, LoadStatus& loadStatus)
       : source(image), stored(storedImage), status(loadStatus) {}
 
   // Returns whether the body was there to its end.
@@ -324,7 +322,7 @@ bool IsBinary(std::string_view image) noexcept {
   return image.substr(isMarked ? 2 : 0).starts_with(kBinaryMagic);
 }
 
-bool ParseBinary(std::istream& image, StoredImage& stored, LoadStatus& status) {
+bool ParseBinary(InputStream& image, StoredImage& stored, LoadStatus& status) {
   status.format = ImageFormat::kBinaryOther;
   BinaryParser parser(image, stored, status);
   const bool whole = parser.Parse();
@@ -333,7 +331,7 @@ bool ParseBinary(std::istream& image, StoredImage& stored, LoadStatus& status) {
   return whole;
 }
 
-int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status) {
+int LoadBinary(DictionaryTable& table, InputStream& image, LoadStatus& status) {
   StoredImage stored;
   LoadStatus parsed = status;
   const bool whole = ParseBinary(image, stored, parsed);

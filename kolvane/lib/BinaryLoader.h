@@ -11,7 +11,6 @@
 //        length and the key, a u32 length and the value
 #pragma once
 
-#include <iosfwd>
 #include <string_view>
 
 #include "LoadStatus.h"
@@ -20,6 +19,7 @@ class DictionaryTable;
 
 namespace tovali_private {
 
+class InputStream;
 struct StoredImage;
 
 inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
@@ -36,7 +36,7 @@ bool IsBinary(std::string_view image) noexcept;
 // Nothing that an image says is trusted: a count or a length that exceeds what is left of the
 // stream is a short read, and is found out before anything is allocated for it. Throws
 // std::bad_alloc.
-bool ParseBinary(std::istream& image, StoredImage& stored, LoadStatus& status);
+bool ParseBinary(InputStream& image, StoredImage& stored, LoadStatus& status);
 
 // The selector of the conversion (Converters.h) of values that are stored in `encoding`, which is
 // not UTF-16.
@@ -46,6 +46,6 @@ const int* SelectorFor(TextEncoding encoding) noexcept;
 // stays as it is until somebody looks into that bucket. Returns 0 when it read the body to its end
 // and -1 when it stopped before; `status` gets format, encoding, counts and damage. What was read
 // before a stop, or before a value whose conversion throws OVErrException, stays in the table.
-int LoadBinary(DictionaryTable& table, std::istream& image, LoadStatus& status);
+int LoadBinary(DictionaryTable& table, InputStream& image, LoadStatus& status);
 
 }  // namespace tovali_private

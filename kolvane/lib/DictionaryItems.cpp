@@ -4,7 +4,6 @@
 #include <cstring>
 #include <limits>
 #include <memory>
-#include <ostream>
 #include <vector>
 
 #include "Converters.h"
@@ -13,23 +12,23 @@
 namespace tovali_private {
 namespace {
 
-uint32_t WriteBytes(std::ostream& out, const void* bytes, size_t byteCount) {
-  out.write(static_cast<const char*>(bytes), static_cast<std::streamsize>(byteCount));
+uint32_t WriteBytes(OutputStream& out, const void* bytes, size_t byteCount) {
+  out.Write({static_cast<const uint8_t*>(bytes), byteCount});
   return static_cast<uint32_t>(byteCount);
 }
 
-uint32_t WriteUnits(std::ostream& out, std::span<const uint16_t> units) {
+uint32_t WriteUnits(OutputStream& out, std::span<const uint16_t> units) {
   return WriteBytes(out, units.data(), units.size_bytes());
 }
 
-uint32_t WriteTextValue(std::ostream& out, std::span<const uint16_t> value) {
+uint32_t WriteTextValue(OutputStream& out, std::span<const uint16_t> value) {
   static constexpr uint16_t kLineEnd[] = {'"', '\r', '\n'};
   const auto escaped = EscapeForText(value);
   const uint32_t written = WriteUnits(out, escaped ? std::span<const uint16_t>(*escaped) : value);
   return written + WriteUnits(out, kLineEnd);
 }
 
-uint32_t WriteMultiByteValue(std::ostream& out, const KolvaneString& value, const int* selector) {
+uint32_t WriteMultiByteValue(OutputStream& out, const KolvaneString& value, const int* selector) {
   const int size = CountMultiByte(value.Data(), value.Length(), selector);
   std::vector<char> bytes(static_cast<size_t>(size));
   ConvertToMultiByte(value.Data(), value.Length(), bytes.data(), size, selector);
@@ -45,11 +44,11 @@ const uint8_t* CopyOf(std::span<const uint8_t> bytes) {
 
 }  // namespace
 
-uint32_t HashItem::WriteKey(std::ostream& out, bool binary, const int* selector) const {
+uint32_t HashItem::WriteKey(OutputStream& out, bool binary, const int* selector) const {
   return Write(out, binary, selector);
 }
 
-uint32_t HashItem::WriteValue(std::ostream& out, bool binary, const int* selector) const {
+uint32_t HashItem::WriteValue(OutputStream& out, bool binary, const int* selector) const {
   return Write(out, binary, selector);
 }
 
@@ -64,7 +63,7 @@ ByteRunKey::~ByteRunKey() {
   if (storage == Storage::kAllocated) delete[] data;
 }
 
-uint32_t ByteRunKey::Write(std::ostream& out, bool binary, const int*) const {
+uint32_t ByteRunKey::Write(OutputStream& out, bool binary, const int*) const {
   if (length == 0) return 0;
   if (binary) return WriteBytes(out, data, length);
   std::vector<uint16_t> text;
@@ -133,16 +132,16 @@ uint32_t DictionaryEntry::SerializedSize() const {
   return ByteRunKey::SerializedSize() + 2 * value.Length();
 }
 
-uint32_t DictionaryEntry::Write(std::ostream& out, bool binary, const int* selector) const {
+uint32_t DictionaryEntry::Write(OutputStream& out, bool binary, const int* selector) const {
   const uint32_t keyBytes = WriteKey(out, binary, selector);
   return keyBytes + WriteValue(out, binary, selector);
 }
 
-uint32_t DictionaryEntry::WriteKey(std::ostream& out, bool binary, const int* selector) const {
+uint32_t DictionaryEntry::WriteKey(OutputStream& out, bool binary, const int* selector) const {
   return ByteRunKey::Write(out, binary, selector);
 }
 
-uint32_t DictionaryEntry::WriteValue(std::ostream& out, bool binary, const int* selector) const {
+uint32_t DictionaryEntry::WriteValue(OutputStream& out, bool binary, const int* selector) const {
   if (!binary) return WriteTextValue(out, value.Units());
   if (selector != nullptr) return WriteMultiByteValue(out, value, selector);
   return WriteBytes(out, value.Data(), value.ByteLength());

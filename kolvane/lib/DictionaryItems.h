@@ -3,11 +3,11 @@
 
 #include <cstdint>
 #include <cstring>
-#include <iosfwd>
 #include <memory>
 #include <span>
 
 #include "Arena.h"
+#include "ByteStreams.h"
 #include "KolvaneString.h"
 
 namespace tovali_private {
@@ -28,11 +28,11 @@ class HashItem {
   // `"key=value"` CR LF, of which WriteKey writes what ends with the `=`, and WriteValue the rest.
   // In binary form keys are written as they are, values as UTF-16 in little-endian order where the
   // selector is null, else as multibyte text in the code page that it names (Converters.h); lengths
-  // are not written. A text that cannot be converted throws OVErrException. Failures of the stream
-  // stay with the stream.
-  virtual uint32_t Write(std::ostream& out, bool binary, const int* selector) const = 0;
-  virtual uint32_t WriteKey(std::ostream& out, bool binary, const int* selector) const;
-  virtual uint32_t WriteValue(std::ostream& out, bool binary, const int* selector) const;
+  // are not written. A text that cannot be converted throws OVErrException; what the stream throws
+  // passes.
+  virtual uint32_t Write(OutputStream& out, bool binary, const int* selector) const = 0;
+  virtual uint32_t WriteKey(OutputStream& out, bool binary, const int* selector) const;
+  virtual uint32_t WriteValue(OutputStream& out, bool binary, const int* selector) const;
 
   virtual ~HashItem() = default;
 
@@ -58,7 +58,7 @@ class ByteRunKey : public HashItem {
 
   // An empty key writes nothing, in text form either.
   uint32_t SerializedSize() const override { return length; }
-  uint32_t Write(std::ostream& out, bool binary, const int* selector) const override;
+  uint32_t Write(OutputStream& out, bool binary, const int* selector) const override;
   uint32_t Hash(uint32_t n) const noexcept override;
   bool Equals(const HashItem& other) const noexcept final;
 
@@ -141,9 +141,9 @@ class DictionaryEntry final : public ByteRunKey {
   static void operator delete(void* entry) noexcept { Arena::Free(entry); }
 
   uint32_t SerializedSize() const override;
-  uint32_t Write(std::ostream& out, bool binary, const int* selector) const override;
-  uint32_t WriteKey(std::ostream& out, bool binary, const int* selector) const override;
-  uint32_t WriteValue(std::ostream& out, bool binary, const int* selector) const override;
+  uint32_t Write(OutputStream& out, bool binary, const int* selector) const override;
+  uint32_t WriteKey(OutputStream& out, bool binary, const int* selector) const override;
+  uint32_t WriteValue(OutputStream& out, bool binary, const int* selector) const override;
 
   // About what it was handed of its EntryMemory.
   uint64_t MemorySize() const noexcept;

@@ -1,54 +1,44 @@
 // The road of an image into a dictionary.
+#include <algorithm>
 #include <array>
-#include <istream>
-#include <string_view>
 #include <utility>
 
 #include "BinaryLoader.h"
+#include "ByteStreams.h"
 #include "DictionaryReader.h"
 #include "DictionaryTable.h"
-#include "StreamSize.h"
 #include "TextSyntax.h"
 
 using tovali_private::DictionaryReader;
+using tovali_private::InputStream;
 
 namespace {
 
 using tovali_private::kBinaryMagic;
-using tovali_private::SkipToEnd;
-using tovali_private::StreamSize;
-
-// Whether anything other than its end ended the reading of the stream.
-bool HasFailed(const std::istream& image) {
-  return image.bad() || (image.fail() && !image.eof());
-}
 
 enum class Recognised { kTooShort, kText, kBinary };
 
-// The test for the binary format, on the 21 bytes where the stream stands. Leaves the stream at its
+// Tests for the binary format, with the 21 bytes at the stream's position. Leaves the stream at its
 // start.
-Recognised Recognise(std::istream& image) {
-  std::array<char, kBinaryMagic.size()> head{};
-  if (!image.read(head.data(), head.size())) return Recognised::kTooShort;
-  image.seekg(0);
-  const bool isBinary = std::string_view(head.data(), head.size()) == kBinaryMagic;
-  return isBinary ? Recognised::kBinary : Recognised::kText;
+Recognised Recognise(InputStream& image) {
+  std::array<uint8_t, kBinaryMagic.size()> head{};
+  if (image.Read(head) < head.size()) return Recognised::kTooShort;
+  image.Rewind();
+  return std::ranges::equal(head, kBinaryMagic) ? Recognised::kBinary : Recognised::kText;
 }
 
 // Whether a text image, whose last line has been read, ended there and ended well.
-void CheckTextEnd(std::istream& image, TextEncoding encoding, LoadStatus& status) {
-  if (HasFailed(image)) return;  // the load stays interrupted
+void CheckTextEnd(InputStream& image, TextEncoding encoding, LoadStatus& status) {
   const uint64_t unitSize = encoding == TextEncoding::kCodePage ? 1 : 2;
-  const uint64_t left = image.good() ? SkipToEnd(image) : 0;
-  const uint64_t size = StreamSize(image);
-  if (image.bad()) return;
+  const uint64_t left = image.SkipToEnd();
+  if (image.HasFailed()) return;  // the load stays interrupted
   status.damage = LoadDamage::kNone;
   if (left != 0) {
     status.damage = LoadDamage::kZeroCharacter;
-    status.damageOffset = size - left - unitSize;
-  } else if (size % unitSize != 0) {
+    status.damageOffset = image.Size() - left - unitSize;
+  } else if (image.Size() % unitSize != 0) {
     status.damage = LoadDamage::kHalfUnit;
-    status.damageOffset = size - 1;
+    status.damageOffset = image.Size() - 1;
   }
 }
 
@@ -66,14 +56,14 @@ class DictionaryTable::MoveAtEnd {
   DictionaryTable& table;
 };
 
-void DictionaryTable::Load(std::istream& image) {
+void DictionaryTable::Load(InputStream& image) {
   lastLoad = {};
   ++loadNumber;
   lastLoad.damage = LoadDamage::kInterrupted;  // until the load has come to an end
   const auto reader = DictionaryReader::Create(&image);
   switch (Recognise(image)) {
     case Recognised::kTooShort:
-      if (!HasFailed(image)) lastLoad.damage = LoadDamage::kTooShort;
+      if (!image.HasFailed()) lastLoad.damage = LoadDamage::kTooShort;
       break;
     case Recognised::kText: {
       const MoveAtEnd moving(*this);
@@ -82,15 +72,15 @@ void DictionaryTable::Load(std::istream& image) {
     }
     case Recognised::kBinary:
       tovali_private::LoadBinary(*this, image, lastLoad);
-      if (HasFailed(image)) lastLoad.damage = LoadDamage::kInterrupted;
+      if (image.HasFailed()) lastLoad.damage = LoadDamage::kInterrupted;
       break;
   }
 }
 
-void DictionaryTable::LoadText(std::istream& image, DictionaryReader& reader) {
+void DictionaryTable::LoadText(InputStream& image, DictionaryReader& reader) {
   lastLoad.format = ImageFormat::kText;
   lastLoad.encoding = reader.Encoding();
-  memory.Expect(StreamSize(image));
+  memory.Expect(image.Size());
   while (const uint16_t* line = reader.GetNextLine()) {
     if (line[0] == 0) continue;
     switch (StoreLine({line, reader.LineLength()})) {

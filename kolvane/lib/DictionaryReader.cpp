@@ -1,10 +1,8 @@
 #include "DictionaryReader.h"
 
 #include <algorithm>
-#include <istream>
 
 #include "Converters.h"
-#include "HeldBytes.h"
 #include "LittleEndian.h"
 #include "Scan.h"
 
@@ -27,8 +25,7 @@ TextEncoding EncodingByMark(std::string_view image) noexcept {
   return TextEncoding::kCodePage;
 }
 
-std::unique_ptr<DictionaryReader> DictionaryReader::Create(std::istream* stream) {
-  const bool isReadable = stream != nullptr && stream->good();
+std::unique_ptr<DictionaryReader> DictionaryReader::Create(InputStream* stream) {
   uint8_t mark[2] = {};
   uint32_t count = sizeof mark;
   ReadStreamBytes(stream, mark, count);
@@ -40,43 +37,26 @@ std::unique_ptr<DictionaryReader> DictionaryReader::Create(std::istream* stream)
     default:
       break;
   }
-  if (isReadable && !stream->bad()) {
-    stream->clear();  // of the end that a stream of fewer than two bytes has met
-    stream->seekg(0);
-  }
+  if (stream != nullptr) stream->Rewind();
   return std::make_unique<MultibyteReader>(stream);
 }
 
-std::span<const uint8_t> DictionaryReader::Held() {
-  return stream != nullptr ? HeldBytes(*stream) : std::span<const uint8_t>();
+std::span<const uint8_t> DictionaryReader::Buffered() {
+  return stream != nullptr ? stream->Buffered() : std::span<const uint8_t>();
 }
 
-void DictionaryReader::Skip(size_t count) noexcept {
-  if (count != 0) SkipHeld(*stream, count);
+void DictionaryReader::Consume(size_t count) noexcept {
+  if (count != 0) stream->Consume(count);
 }
 
-void DictionaryReader::ReadStreamBytes(std::istream* stream, uint8_t* bytes, uint32_t& count) {
-  uint32_t stored = 0;
-  while (stream != nullptr && stored < count) {
-    const auto held = HeldBytes(*stream);
-    const size_t taken = std::min<size_t>(held.size(), count - stored);
-    if (taken == 0) {
-      char byte = 0;
-      if (!stream->get(byte)) break;
-      bytes[stored++] = static_cast<uint8_t>(byte);
-      continue;
-    }
-    std::copy_n(held.data(), taken, bytes + stored);
-    SkipHeld(*stream, taken);
-    stored += static_cast<uint32_t>(taken);
-  }
-  count = stored;
+void DictionaryReader::ReadStreamBytes(InputStream* stream, uint8_t* bytes, uint32_t& count) {
+  count = stream != nullptr ? static_cast<uint32_t>(stream->Read({bytes, count})) : 0;
 }
 
 const uint16_t* UnicodeReader::GetNextLine() {
   line.Clear();
   for (uint16_t unit = 0;;) {
-    TakeHeldUnits();
+    TakeBufferedUnits();
     if (ReadChar(unit)) {
       if (line.Length() == 0) return nullptr;
       break;
@@ -89,17 +69,17 @@ const uint16_t* UnicodeReader::GetNextLine() {
 }
 
 // Takes the units up to the first that ends the line or the input.
-void UnicodeReader::TakeHeldUnits() {
+void UnicodeReader::TakeBufferedUnits() {
   constexpr size_t kBlock = 64;
   const bool isSwapped = Encoding() == TextEncoding::kUTF16BE;
   for (;;) {
-    const auto held = Held();
-    const std::span<uint16_t> block = line.Extend(std::min(held.size() / 2, kBlock));
-    std::copy_n(held.data(), block.size_bytes(), reinterpret_cast<uint8_t*>(block.data()));
+    const auto buffered = Buffered();
+    const std::span<uint16_t> block = line.Extend(std::min(buffered.size() / 2, kBlock));
+    std::copy_n(buffered.data(), block.size_bytes(), reinterpret_cast<uint8_t*>(block.data()));
     if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), Swapped);
     const size_t run = UnicodeEnds::RunBefore(std::span<const uint16_t>(block));
     line.SetLength(line.Length() - static_cast<uint32_t>(block.size() - run));
-    Skip(2 * run);
+    Consume(2 * run);
     if (run < kBlock) return;
   }
 }
@@ -121,7 +101,7 @@ bool ByteSwapUnicodeReader::ReadChar(uint16_t& unit) {
 const uint16_t* MultibyteReader::GetNextLine() {
   bytes.Clear();
   for (;;) {
-    TakeHeldBytes();
+    TakeBufferedBytes();
     uint8_t byte = 0;
     uint32_t count = 1;
     ReadBytes(&byte, count);
@@ -138,12 +118,12 @@ const uint16_t* MultibyteReader::GetNextLine() {
 }
 
 // Takes the bytes up to the first that ends the line or the input.
-void MultibyteReader::TakeHeldBytes() {
-  const auto held = Held();
-  const size_t run = MultibyteEnds::RunBefore(held);
+void MultibyteReader::TakeBufferedBytes() {
+  const auto buffered = Buffered();
+  const size_t run = MultibyteEnds::RunBefore(buffered);
   const std::span<uint8_t> block = bytes.Extend(run);
-  std::copy_n(held.data(), run, block.data());
-  Skip(run);
+  std::copy_n(buffered.data(), run, block.data());
+  Consume(run);
 }
 
 }  // namespace tovali_private

@@ -2,11 +2,11 @@
 #pragma once
 
 #include <cstdint>
-#include <iosfwd>
 #include <memory>
 #include <span>
 #include <string_view>
 
+#include "ByteStreams.h"
 #include "GrowableBuffer.h"
 #include "LoadStatus.h"
 
@@ -35,32 +35,31 @@ class DictionaryReader {
 
   // For the encoding that the mark tells. A mark is left behind the stream's position; without one
   // the stream is moved back to position 0.
-  static std::unique_ptr<DictionaryReader> Create(std::istream* stream);
+  static std::unique_ptr<DictionaryReader> Create(InputStream* stream);
 
  protected:
-  DictionaryReader(std::istream* input, TextEncoding inputEncoding)
+  DictionaryReader(InputStream* input, TextEncoding inputEncoding)
       : stream(input), encoding(inputEncoding) {}
 
-  // Reads up to `count` bytes and sets `count` to those that came before the stream ended or
-  // failed.
+  // Reads up to `count` bytes and sets `count` to the number read, which is less only at the end.
   void ReadBytes(uint8_t* bytes, uint32_t& count) { ReadStreamBytes(stream, bytes, count); }
-  static void ReadStreamBytes(std::istream* stream, uint8_t* bytes, uint32_t& count);
+  static void ReadStreamBytes(InputStream* stream, uint8_t* bytes, uint32_t& count);
 
-  // See HeldBytes.h.
-  std::span<const uint8_t> Held();
-  void Skip(size_t count) noexcept;
+  // See InputStream.
+  std::span<const uint8_t> Buffered();
+  void Consume(size_t count) noexcept;
 
   UnicodeBuffer line;
 
  private:
-  std::istream* stream;
+  InputStream* stream;
   TextEncoding encoding;
 };
 
 // UTF-16 in little-endian order. Line feed, carriage return, U+2028 and U+2029 end lines.
 class UnicodeReader : public DictionaryReader {
  public:
-  explicit UnicodeReader(std::istream* input) : UnicodeReader(input, TextEncoding::kUTF16LE) {}
+  explicit UnicodeReader(InputStream* input) : UnicodeReader(input, TextEncoding::kUTF16LE) {}
 
   const uint16_t* GetNextLine() override;
 
@@ -72,13 +71,13 @@ class UnicodeReader : public DictionaryReader {
   using DictionaryReader::DictionaryReader;
 
  private:
-  void TakeHeldUnits();
+  void TakeBufferedUnits();
 };
 
 // UTF-16 in big-endian order.
 class ByteSwapUnicodeReader final : public UnicodeReader {
  public:
-  explicit ByteSwapUnicodeReader(std::istream* input)
+  explicit ByteSwapUnicodeReader(InputStream* input)
       : UnicodeReader(input, TextEncoding::kUTF16BE) {}
 
   bool ReadChar(uint16_t& unit) override;
@@ -87,13 +86,12 @@ class ByteSwapUnicodeReader final : public UnicodeReader {
 // Text of the system's code page. Line feed and carriage return end lines.
 class MultibyteReader final : public DictionaryReader {
  public:
-  explicit MultibyteReader(std::istream* input)
-      : DictionaryReader(input, TextEncoding::kCodePage) {}
+  explicit MultibyteReader(InputStream* input) : DictionaryReader(input, TextEncoding::kCodePage) {}
 
   const uint16_t* GetNextLine() override;
 
  private:
-  void TakeHeldBytes();
+  void TakeBufferedBytes();
 
   ByteBuffer bytes;
 };

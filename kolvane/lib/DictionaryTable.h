@@ -17,7 +17,8 @@
 
 namespace tovali_private {
 class DictionaryReader;
-}
+class InputStream;
+}  // namespace tovali_private
 
 // What became of a text line.
 enum class StoredLine : uint8_t { kDropped, kAdded, kReplaced };
@@ -41,10 +42,11 @@ class DictionaryTable {
   // If this table is the default dictionary, there is none afterwards.
   ~DictionaryTable();
 
-  // Adds the entries of one image, text or binary, to those the table holds. Requires: the stream
-  // is at its start and can seek back there. Damage is not reported but by LastLoad; time and
-  // memory are linear in the image's size. Throws OVErrException when a conversion fails and
-  // std::bad_alloc; what was stored before stays.
+  // Adds the entries of one image, text or binary. Damage is reported by LastLoad only. Time and
+  // memory are linear in the image's size. Requires: the stream is at its start and can seek back
+  // there. Throws: OVErrException if a conversion fails, std::bad_alloc; what was stored before
+  // stays.
+  void Load(tovali_private::InputStream& image);
   void Load(std::istream& image);
 
   // How the latest load went, one that threw included; valid until the next one. To know it all, it
@@ -108,7 +110,7 @@ class DictionaryTable {
   void MoveFromMostlyDeadMemory() noexcept;
   void MoveChain(tovali_private::HashItem*& head);
   static void ReplaceByMoved(tovali_private::HashItem*& head) noexcept;
-  void LoadText(std::istream& image, tovali_private::DictionaryReader& reader);
+  void LoadText(tovali_private::InputStream& image, tovali_private::DictionaryReader& reader);
 
   tovali_private::EntryMemory memory;
   uint64_t liveBytes = 0;  // what the entries take

@@ -3,11 +3,11 @@
 #include <algorithm>
 #include <ostream>
 #include <span>
-#include <sstream>
 #include <stdexcept>
 #include <string_view>
 
 #include "BinaryLoader.h"
+#include "ByteStreams.h"
 #include "Converters.h"
 #include "DictionaryTable.h"
 #include "LittleEndian.h"
@@ -48,21 +48,18 @@ size_t CarriedUnits(TextEncoding encoding, Bytes stored, Units value) {
 class ImageComposer {
  public:
   explicit ImageComposer(TextEncoding valueEncoding)
-      : encoding(valueEncoding), encodingByte(EncodingByte(valueEncoding)) {
-    written.exceptions(std::ios::badbit);
-  }
+      : encoding(valueEncoding), encodingByte(EncodingByte(valueEncoding)) {}
 
   void Append(const DictionaryEntry& entry) {
     const uint32_t bucket = entry.Hash(DictionaryTable::kBucketCount);
     if (image.groups.empty() || image.groups.back().bucket != bucket) image.BeginGroup(bucket);
     const int selector = encodingByte;
-    written.seekp(0);
+    written.Clear();
     const size_t keySize = entry.WriteKey(written, true, nullptr);
     size_t valueSize = entry.WriteValue(written, true, selector == 0 ? nullptr : &selector);
     const Units value = entry.Value().Units();
     if (selector == 0) valueSize = value.size_bytes();  // an odd last byte answers nothing
-    const std::string_view both = written.view();
-    const Bytes bytes(reinterpret_cast<const uint8_t*>(both.data()), keySize + valueSize);
+    const Bytes bytes = written.Bytes().first(keySize + valueSize);
     image.Append(bytes.first(keySize), bytes.subspan(keySize));
     const size_t carried = CarriedUnits(encoding, bytes.subspan(keySize), value);
     if (carried < value.size()) lost.push_back({&entry, carried});
@@ -79,7 +76,7 @@ class ImageComposer {
  private:
   TextEncoding encoding;
   uint8_t encodingByte;
-  std::ostringstream written;
+  MemoryOutput written;
   StoredImage image;
   std::vector<LostValue> lost;
 };

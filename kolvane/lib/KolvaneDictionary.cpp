@@ -1,13 +1,15 @@
 #include "KolvaneDictionary.h"
 
+#include "ByteStreams.h"
 #include "DictionaryTable.h"
 
 KolvaneDictionary::KolvaneDictionary() : table(std::make_unique<DictionaryTable>()) {}
 
 KolvaneDictionary::~KolvaneDictionary() = default;
 
-void KolvaneDictionary::Load(std::istream& image) {
-  table->Load(image);
+void KolvaneDictionary::Load(std::span<const uint8_t> image) {
+  tovali_private::MemoryInput input(image);
+  table->Load(input);
 }
 
 const LoadStatus& KolvaneDictionary::LastLoad() {

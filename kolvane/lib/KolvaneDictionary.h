@@ -1,8 +1,10 @@
 // A dictionary as its users hold it.
 #pragma once
 
+#include <cstdint>
 #include <iosfwd>
 #include <memory>
+#include <span>
 
 #include "LoadStatus.h"
 #include "TranslatedString.h"
@@ -19,6 +21,7 @@ class KolvaneDictionary {
   ~KolvaneDictionary();
 
   void Load(std::istream& image);
+  void Load(std::span<const uint8_t> image);
   const LoadStatus& LastLoad();
   void MakeDefault() noexcept;
   TranslatedString Translate(const char* text, const int* selector);

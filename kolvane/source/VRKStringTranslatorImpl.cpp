@@ -1,6 +1,5 @@
 #include "VRKStringTranslatorImpl.h"
 
-#include <boost/interprocess/streams/bufferstream.hpp>
 #include <cstring>
 
 #include "Exceptions.h"
@@ -22,8 +21,8 @@ void StringTranslatorImpl::MakeDefault() noexcept {
 void StringTranslatorImpl::SetTranslations(const char* bytes, uint32_t byteCount) {
   if (byteCount > kMostBytes) throw InvariantViolation();
   const bool endsAtZero = byteCount == 0 && bytes != nullptr;
-  boost::interprocess::ibufferstream image(bytes, endsAtZero ? std::strlen(bytes) : byteCount);
-  dictionary.Load(image);
+  const size_t size = endsAtZero ? std::strlen(bytes) : byteCount;
+  dictionary.Load(std::span(reinterpret_cast<const uint8_t*>(bytes), size));
 }
 
 void StringTranslatorImpl::SetTranslations(const uint16_t* units, uint32_t unitCount) {

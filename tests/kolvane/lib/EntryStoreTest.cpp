@@ -1,8 +1,6 @@
 // Strings, items, and the table with its chains and index.
 #include <gtest/gtest.h>
 
-#include <sstream>
-
 #include "Converters.h"
 #include "DictionaryTable.h"
 #include "OVErrException.h"
@@ -62,6 +60,10 @@ TEST(ByteRunKey, HashesAndComparesBytes) {
   EXPECT_EQ(ByteRunKey(bytes, 0, true).Bytes().data(), nullptr);
 }
 
+std::string Written(const MemoryOutput& out) {
+  return {out.Bytes().begin(), out.Bytes().end()};
+}
+
 TEST(DictionaryEntry, WritesItself) {
   const int utf8 = 1, codePage = 2;
   struct {
@@ -83,18 +85,18 @@ TEST(DictionaryEntry, WritesItself) {
   for (const auto& each : cases) {
     SCOPED_TRACE(&each - cases);
     const auto entry = Entry(each.key, each.value);
-    std::ostringstream whole, parts;
+    MemoryOutput whole, parts;
     EXPECT_EQ(entry->Write(whole, each.binary, each.selector), each.written.size());
     EXPECT_EQ(entry->WriteKey(parts, each.binary, each.selector) + entry->WriteValue(parts, each.binary, each.selector),
               each.written.size());
-    EXPECT_EQ(whole.str(), each.written);
-    EXPECT_EQ(parts.str(), each.written);
+    EXPECT_EQ(Written(whole), each.written);
+    EXPECT_EQ(Written(parts), each.written);
   }
   EXPECT_EQ(Entry("/abc", u"xyz")->SerializedSize(), 10u);
-  std::ostringstream odd;
+  MemoryOutput odd;
   const uint8_t bytes[] = {'H', 0, 'i'};
   DictionaryEntry::Create(gMemory, Key("/a"), bytes)->Write(odd, true, nullptr);
-  EXPECT_EQ(odd.str(), std::string("/aH\0i", 5));
+  EXPECT_EQ(Written(odd), std::string("/aH\0i", 5));
 }
 
 template <class Conversion>

@@ -47,14 +47,11 @@ TEST(DictionaryReader, DeliversLines) {
   };
   for (const auto& each : cases) {
     SCOPED_TRACE(&each - cases);
-    std::istringstream stream(each.input);
+    MemoryInput stream(each.input);
     const auto reader = DictionaryReader::Create(&stream);
     EXPECT_EQ(Lines(*reader), each.lines);
     EXPECT_EQ(Lines(*reader), each.after);
   }
-  std::istringstream failed("some text");
-  failed.setstate(std::ios::failbit);
-  EXPECT_EQ(DictionaryReader::Create(&failed)->GetNextLine(), nullptr);
   EXPECT_EQ(DictionaryReader::Create(nullptr)->GetNextLine(), nullptr);
 }
 
@@ -429,6 +426,11 @@ TEST(Load, ReadsEveryKindOfStream) {
     ExpectSameLoad(expected, stream);
   }
   std::remove(path.c_str());
+  std::istringstream failed(images[0]);
+  failed.setstate(std::ios::failbit);
+  DictionaryTable table;
+  table.Load(failed);
+  EXPECT_EQ(table.LastLoad().damage, LoadDamage::kTooShort);
 }
 
 TEST(Load, TellsThatAStreamFailed) {

@@ -3,7 +3,6 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <boost/interprocess/streams/bufferstream.hpp>
 #include <optional>
 #include <span>
 #include <string_view>
@@ -11,6 +10,7 @@
 #include <utility>
 
 #include "BinaryLoader.h"
+#include "ByteStreams.h"
 #include "DictionaryTable.h"
 #include "Messages.h"
 #include "Rules.h"
@@ -75,7 +75,7 @@ class ImageCheck {
       : file(checked), findings(list) {}
 
   Definitions Run() {
-    boost::interprocess::ibufferstream stream(file.bytes.data(), file.bytes.size());
+    tovali_private::MemoryInput stream(file.bytes);
     tovali_private::ParseBinary(stream, image, status);
     CheckDamage();
     image.ForEachEntry(

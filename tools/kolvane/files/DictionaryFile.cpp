@@ -1,9 +1,9 @@
 #include "DictionaryFile.h"
 
-#include <boost/interprocess/streams/bufferstream.hpp>
 #include <unordered_set>
 
 #include "BinaryLoader.h"
+#include "ByteStreams.h"
 #include "TextLines.h"
 #include "TextSyntax.h"
 
@@ -41,7 +41,7 @@ void FindLines(const ImageFile& file, FoundOnce& found) {
 }
 
 void FindStored(const ImageFile& file, FoundOnce& found) {
-  boost::interprocess::ibufferstream stream(file.bytes.data(), file.bytes.size());
+  tovali_private::MemoryInput stream(file.bytes);
   tovali_private::StoredImage image;
   LoadStatus status;
   tovali_private::ParseBinary(stream, image, status);
@@ -52,7 +52,7 @@ void FindStored(const ImageFile& file, FoundOnce& found) {
 }  // namespace
 
 LoadStatus LoadInto(DictionaryTable& table, const ImageFile& file) {
-  boost::interprocess::ibufferstream stream(file.bytes.data(), file.bytes.size());
+  tovali_private::MemoryInput stream(file.bytes);
   table.Load(stream);
   return table.LastLoad();
 }

@@ -33,31 +33,25 @@ size_t LineCounter::LineAt(uint64_t offset) noexcept {
 
 TextLines::TextLines(std::string_view textImage)
     : image(textImage),
-      stream(image.data(), image.size()),
+      stream(image),
       reader(tovali_private::DictionaryReader::Create(&stream)),
       counter(image, reader->Encoding()) {
-  stream.clear();
-  stream.seekg(0);
+  stream.Rewind();
 }
 
 bool TextLines::Next(TextLine& line) {
   for (;;) {
-    const size_t start = Position();
+    const size_t start = static_cast<size_t>(stream.Position());
     const uint16_t* const text = reader->GetNextLine();
     if (text == nullptr) return false;
     if (reader->LineLength() == 0) continue;
-    const size_t end = Position();
+    const size_t end = static_cast<size_t>(stream.Position());
     const bool isWide = reader->Encoding() != TextEncoding::kCodePage;
-    const bool endsInText = stream.good() && end < image.size();
+    const bool endsInText = end < image.size();
     const bool lastIsZero = image[end - 1] == 0 && (!isWide || image[end - 2] == 0);
     const size_t number = counter.LineAt(start);
     line = {
         number, counter.CharactersBefore(), {text, reader->LineLength()}, endsInText && lastIsZero};
     return true;
   }
-}
-
-size_t TextLines::Position() {
-  const std::streamoff at = stream.rdbuf()->pubseekoff(0, std::ios::cur, std::ios::in);
-  return static_cast<size_t>(at);
 }

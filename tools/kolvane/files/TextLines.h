@@ -1,12 +1,12 @@
 // The lines of a text dictionary, and where they stand.
 #pragma once
 
-#include <boost/interprocess/streams/bufferstream.hpp>
 #include <cstdint>
 #include <memory>
 #include <span>
 #include <string_view>
 
+#include "ByteStreams.h"
 #include "DictionaryReader.h"
 
 // Numbers the lines of a text image from 1, for offsets in bytes that never fall. CR LF ends one
@@ -51,10 +51,8 @@ class TextLines {
   bool Next(TextLine& line);
 
  private:
-  size_t Position();
-
   std::string_view image;
-  boost::interprocess::ibufferstream stream;
+  tovali_private::MemoryInput stream;
   std::unique_ptr<tovali_private::DictionaryReader> reader;
   LineCounter counter;
 };
