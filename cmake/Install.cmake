@@ -59,6 +59,13 @@ file(RELATIVE_PATH binToLib ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FULL_LI
 set_target_properties(kolvane PROPERTIES INSTALL_RPATH $ORIGIN/${binToLib})
 set_target_properties(VRKKolvanes PROPERTIES INSTALL_RPATH $ORIGIN)
 
+if(MINGW)  # `cmake --install ... --component symbols`
+  foreach(target kolvane VRKKolvanes VarnelKernel)
+    install(FILES $<TARGET_FILE:${target}>.debug DESTINATION ${CMAKE_INSTALL_BINDIR}
+      COMPONENT symbols EXCLUDE_FROM_ALL)
+  endforeach()
+endif()
+
 # The CMake package.
 configure_package_config_file(cmake/KolvaneConfig.cmake.in KolvaneConfig.cmake
   INSTALL_DESTINATION ${package} NO_SET_AND_CHECK_MACRO)

@@ -7,6 +7,7 @@ import os
 import pathlib
 import re
 import shutil
+import struct
 import subprocess
 import sys
 import tempfile
@@ -88,6 +89,19 @@ class Install(unittest.TestCase):
         self.assertIn("kolvane", built & installed)
         needed = {pathlib.Path(node).name for node in re.findall(r'label="(.+?)"', ninja("graph", target))}
         self.assertEqual(built & installed - needed, set())
+
+    @unittest.skipUnless(OPTIONS, "binaries of Windows")
+    def test_symbols_are_apart(self):
+        self.must("cmake", "--install", BUILD, "--prefix", self.folder / "symbols", "--component", "symbols")
+        for name, most in [("kolvane.exe", 3_000_000), ("VRKKolvanes.dll", 700_000), ("VarnelKernel.dll", 700_000)]:
+            image = (self.prefix / "bin" / name).read_bytes()
+            header = struct.unpack_from("<I", image, 0x3C)[0]
+            self.assertEqual(struct.unpack_from("<II", image, header + 12), (0, 0), "the symbol table's place and size")
+            self.assertIn(f"{name}.debug".encode(), image)
+            self.assertLess(len(image), most, "does it link the standard streams?")
+        self.assertEqual({path.name for path in self.prefix.rglob("*.debug")}, set())
+        self.assertEqual({path.name for path in (self.folder / "symbols").rglob("*") if path.is_file()},
+                         {f"{name}.debug" for name in ("kolvane.exe", "VRKKolvanes.dll", "VarnelKernel.dll")})
 
     @unittest.skipIf(OPTIONS, "no manual page on Windows")
     def test_manual_and_completions_know_every_option(self):
