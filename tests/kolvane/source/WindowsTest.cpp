@@ -1,4 +1,4 @@
-// What a 32-bit host on Windows counts on.
+// What a host on Windows counts on.
 #include <windows.h>
 
 #include <cstddef>
@@ -8,21 +8,27 @@
 
 namespace {
 
-template <class... Types>
-constexpr bool kAreOf32Bits = ((sizeof(Types) == 4 && alignof(Types) == 4) && ...);
+template <size_t size, class... Types>
+constexpr bool kHaveSize = ((sizeof(Types) == size && alignof(Types) == size) && ...);
 
-static_assert(kAreOf32Bits<void*, size_t, VRKResult, VRKPlugIn>);
-static_assert(kAreOf32Bits<VRKObject, VRKMessageHandler, VRKToken, VRKData, VRKList, VRKDictionary>);
-static_assert(kAreOf32Bits<VRKObjectFactoryCallback, VRKMessageHandlerCallback, VRKDataCoercionCallback>);
-static_assert(sizeof(VRKHostTraceArgument) == 16 && offsetof(VRKHostTraceArgument, pointer) == 12);
-static_assert(sizeof(VRKHostTraceCall) == 24 && sizeof(VRKHostLiveCounts) == 36);
+// Handles have 32 bits everywhere.
+static_assert(kHaveSize<4, VRKResult, VRKPlugIn>);
+static_assert(kHaveSize<4, VRKObject, VRKMessageHandler, VRKToken, VRKData, VRKList, VRKDictionary>);
+static_assert(sizeof(VRKHostLiveCounts) == 36);
 
 // What the payloads hold besides.
 static_assert(sizeof(double) == 8 && sizeof(bool) == 1 && sizeof(wchar_t) == sizeof(uint16_t));
 
-// What lives in the kernel's memory and in holders: a table of operations, and the fields.
-static_assert(sizeof(Varnel::DataRef) == 4 && sizeof(Varnel::StringTranslatorClient) == 8);
+// Objects in the kernel's memory and holders: a pointer to the virtual functions, and the fields.
+static_assert(sizeof(Varnel::DataRef) == 4);
+#ifdef _WIN64
+static_assert(kHaveSize<8, void*, size_t, VRKObjectFactoryCallback, VRKMessageHandlerCallback, VRKDataCoercionCallback>);
+#else
+static_assert(kHaveSize<4, void*, size_t, VRKObjectFactoryCallback, VRKMessageHandlerCallback, VRKDataCoercionCallback>);
+static_assert(sizeof(VRKHostTraceArgument) == 16 && offsetof(VRKHostTraceArgument, pointer) == 12);
+static_assert(sizeof(VRKHostTraceCall) == 24 && sizeof(Varnel::StringTranslatorClient) == 8);
 static_assert(sizeof(Varnel::MessageHandler) == 16 && sizeof(Varnel::ObjectFactory) == 8 && sizeof(Varnel::DataCoercion) == 4);
+#endif
 
 TEST(PlugInOnWindows, IsFoundByOrdinalsAndNames) {
   const EntryPoints entry;
