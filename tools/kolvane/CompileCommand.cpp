@@ -17,6 +17,7 @@
 #include "ImageFile.h"
 #include "LoadWarnings.h"
 #include "OutputFile.h"
+#include "Paths.h"
 #include "Text.h"
 
 namespace {
@@ -32,8 +33,8 @@ Examples:
 
 A translator that loads the image answers as one that loads each INPUT in turn: of two definitions of
 a key the later one wins. Equal contents give equal bytes. INPUT may be text, a binary image, or '-' for
-standard input. Nothing is written where an input is damaged, or where the encoding of the values
-lacks a character of one of them.)";
+standard input; OUT is none of them. Nothing is written where an input is damaged or no dictionary, or
+where the encoding of the values lacks a character of one of them.)";
 
 struct Request {
   std::vector<std::string> inputs;
@@ -101,7 +102,17 @@ void RefuseLosses(const std::vector<tovali_private::LostValue>& lost, TextEncodi
       lost.size() == 1 ? "a translation" : fmt::format("{} translations", lost.size())));
 }
 
+// Sources are not replaced by what is made of them.
+void RequireOtherOutput(const Request& request) {
+  for (const std::string& input : request.inputs) {
+    if (!AreSameFile(input, request.output)) continue;
+    throw Failure(fmt::format("{}: nothing was written, for the output is the input {}",
+                              Printable(request.output), Printable(input)));
+  }
+}
+
 ExitStatus Compile(const Request& request) {
+  RequireOtherOutput(request);
   DictionaryTable table;
   if (!LoadAll(request, table)) throw Failure("nothing was written, for an input is not whole");
   std::ostringstream image;

@@ -7,6 +7,7 @@
 #include <utility>
 
 #include "Messages.h"
+#include "Paths.h"
 #include "ResultText.h"
 
 namespace {
@@ -16,11 +17,10 @@ void Require(VRKResult result, const std::string& what) {
 }
 
 // A name alone would be searched for.
-std::string PathOf(const std::string& file) {
+std::string AbsoluteName(const std::string& file) {
   std::error_code failed;
-  const std::filesystem::path name(std::u8string(file.begin(), file.end()));
-  const std::u8string path = std::filesystem::absolute(name, failed).u8string();
-  return failed ? file : std::string(path.begin(), path.end());
+  const std::filesystem::path path = std::filesystem::absolute(PathOf(file), failed);
+  return failed ? file : NameOf(path);
 }
 
 }  // namespace
@@ -36,7 +36,7 @@ TranslatorHost::~TranslatorHost() {
 }
 
 void TranslatorHost::LoadPlugIn(const std::optional<std::string>& file) {
-  const std::string path = file ? PathOf(*file) : KOLVANE_PLUG_IN;
+  const std::string path = file ? AbsoluteName(*file) : KOLVANE_PLUG_IN;
   const std::string failure =
       fmt::format("cannot load the plug-in {}", Printable(file.value_or(path)));
   const VRKResult loaded = VRKHostPlugInLoad(path.c_str(), "VRKKolvanes", &plugIn);

@@ -12,7 +12,9 @@
 
 #include "File.h"
 #include "Messages.h"
+#include "Paths.h"
 #include "StandardOutput.h"
+#include "Termination.h"
 
 namespace {
 
@@ -20,15 +22,6 @@ namespace fs = std::filesystem;
 
 [[noreturn]] void Fail(const std::string& name, std::string_view reason) {
   throw Failure(fmt::format("{}: {}", Printable(name), reason));
-}
-
-fs::path PathOf(const std::string& name) {
-  return {std::u8string(name.begin(), name.end())};
-}
-
-std::string NameOf(const fs::path& path) {
-  const std::u8string name = path.u8string();
-  return {name.begin(), name.end()};
 }
 
 // Through symbolic links, also one to what is not there yet.
@@ -82,6 +75,7 @@ class FileBeside {
 
 void Replace(const std::string& name, const fs::path& target, const fs::file_status& status,
              std::string_view bytes) {
+  const platform::DelayedTermination termination;  // which would leave the file beside
   const FileBeside file(target);
   if (const std::string reason = Write(file.Path(), bytes); !reason.empty()) Fail(name, reason);
   std::error_code error;
