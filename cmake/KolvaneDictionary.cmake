@@ -14,6 +14,10 @@ given. Its full path is the target's property KOLVANE_DICTIONARY, for whoever in
 
   install(FILES $<TARGET_PROPERTY:<target>,KOLVANE_DICTIONARY> DESTINATION share/example)
 
+The build fails, and OUTPUT stays as it is, where a source is damaged, holds malformed UTF-8, lacks the
+byte-order mark of UTF-16 or is no dictionary. ENCODING image takes text for UTF-16 with its mark or the
+system's code page, whatever it looks like.
+
 The command is the one that comes with this file, or the one that the variable KOLVANE_COMMAND names.
 In a cross build, CMAKE_CROSSCOMPILING_EMULATOR runs the former; without an emulator, one of the
 machine that builds is looked for on the PATH.

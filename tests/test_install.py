@@ -174,6 +174,21 @@ class Install(unittest.TestCase):
                       self.must("cmake", "--build", build, "--verbose"))
         self.assertEqual(self.translate(build / "sub/d.bin"), "Abbrechen\n")
 
+    def test_the_build_fails_where_a_dictionary_would_be_garbled(self):
+        text = '"$$$/Dialog/Cancel=Отмена"\n'
+        sources = {"malformed": text.encode() + b"\xff\n", "po": b'msgid "Cancel"\nmsgstr "Abbrechen"\n', "unmarked": text.encode("utf-16-le")}
+        calls = [f"kolvane_add_dictionary({name} SOURCES {name})" for name in sources]
+        source = self.project("\n".join(["kolvane_add_dictionary(forced SOURCES de.txt malformed ENCODING utf-8)", *calls]))
+        for name, content in sources.items():
+            (source / name).write_bytes(content)
+        build, _ = self.configure(source)
+        status, output = run("cmake", "--build", build, "--", "-k", "0")
+        self.assertNotEqual(status, 0)
+        self.assertEqual(output.count("nothing was written"), 4, output)
+        for message in ["malformed:2:1: error: byte 33 is malformed UTF-8", "po: error: this is a PO file", "unmarked: error: this is UTF-16 without"]:
+            self.assertIn(message, output)
+        self.assertEqual(list(build.glob("*.kdict")), [])
+
     @unittest.skipIf(OPTIONS, "pretends to be a cross build")
     def test_cross_builds_find_a_command(self):
         source = self.project("kolvane_add_dictionary(d SOURCES de.txt)")

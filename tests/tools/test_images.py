@@ -65,7 +65,7 @@ class Images(CommandTest):
         self.file(name="cut", content=image[:-1])
         for arguments, message in [(["polish", "--values", "code-page"], "'/k': its translation holds U+017B, which the code page cannot carry"),
                                    (["half", "--values", "utf-8"], "'/k': its translation holds U+D800, which UTF-8 cannot carry"),
-                                   (["missing", "cut"], "cut: warning: the image is cut short"), (["polish", "missing"], "missing: No such file")]:
+                                   (["missing", "cut"], "cut: error: the image is cut short"), (["polish", "missing"], "missing: No such file")]:
             status, output, errors = self.run_kolvane("compile", *arguments, "-o", "out")
             self.assertEqual((status, output), (2, b""))
             self.assertIn(message, errors)
@@ -103,8 +103,8 @@ class Images(CommandTest):
         for content, options, message in [
                 ('"/a=x"\r\n"/b=€ł"\n"/c=ń"\n'.encode(), ["--to", "code-page"], "in:2:6: U+0142 has no place in the code page\nkolvane: in:3:5: "),
                 ('\ufeff"/a=😀\ud83d"'.encode("utf-16-be", "surrogatepass"), ["--to", "utf-8"], "in:1:6: U+D83D has no place in UTF-8\n"),
-                (b'"/a=x"\n"/b=\xff"', ["--to", "utf-16le", "--encoding", "utf-8"], "in:2:5: byte 11 is malformed UTF-8\n"),
-                ('\ufeff"é"\r\n\r\u2028é'.encode() + b"\xef\xbf", ["--to", "utf-16le", "--encoding", "utf-8"], "in:4:2: byte 15 is malformed UTF-8\n"),
+                (b'"/a=x"\n"/b=\xff"', ["--to", "utf-16le", "--encoding", "utf-8"], "in:2:5: error: byte 11 is malformed UTF-8; --encoding image reads"),
+                ('\ufeff"é"\r\n\r\u2028é'.encode() + b"\xef\xbf", ["--to", "utf-16le", "--encoding", "utf-8"], "in:4:2: error: byte 15 is malformed UTF-8; --encoding image reads"),
                 (b'\xff\xfe"', ["--to", "utf-8"], "in:1:1: byte 2 is half a character\n"),
                 ('\ufeffÿþ'.encode("utf-16-le"), ["--to", "code-page"], "in:1:1: nothing was written, for without a byte-order mark"),
                 ("\ufeffKolvane Binary Format".encode(), ["--to", "utf-8"], "would be taken for a binary dictionary\n"),

@@ -11,6 +11,7 @@ ONE = image([(580, [(b"/a", HI)])])
 
 # Rule, dictionary, and its findings without the file's name; then, where there is one, the reference.
 CASES = [
+    ("no-dictionary", b'msgid ""\nmsgstr "Language: de"', ["error: this is a PO file, not a dictionary"]),
     ("too-short", b'"$$$/a=b"\n', ["error: a file with fewer than 21 bytes, its byte-order mark not counted, is ignored"]),
     ("zero-character", b'"$$$/a=b"\0' + PAD, ["1:10: error: a zero character ends the line here"]),
     ("zero-character", b'"$$$/a=some text"\n\n\0"$$$/b=c"', ["3:1: error: a zero character at the start of the line ends the file for a translator"]),
@@ -20,7 +21,7 @@ CASES = [
     ("malformed-input", utf16('"$$$/a=\ud800b😀"'), ["1:8: error: U+D800 is half of a character"]),
     ("malformed-input", utf16('"$$$/a=b"') + b"\n", ["error: the file ends in half of a character"]),
     ("malformed-input", '"$$$/a=ä"\n"$$$/b=ö"\n"$$$/d=Ё"\n"$$$/c=é'.encode() + b"\xff\"\n",
-     ["4:9: error: a byte here is no UTF-8, so that the whole file is read in the code page"]),
+     ["4:9: error: a byte here is no UTF-8"]),
     ("malformed-input", b'"$$$/a=b \x81"' + PAD, ["1:10: error: a byte here is no character of the code page"]),
     ("malformed-input", image([(580, [(b"/a", b"a\0\0\xd8")])]), ["entry 1, byte 46: error: U+D800 in the value is half of a character"]),
     ("malformed-input", image([(580, [(b"/a", b"a\xff")])], 1, 0), ["entry 1, byte 49: error: a byte of the value is no UTF-8"]),

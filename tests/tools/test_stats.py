@@ -66,7 +66,7 @@ class Stats(CommandTest):
         # Of a key's two entries the second is never found, and the first entry has no business in this bucket.
         path = self.file(image([(580, [(b"/b", b"x"), (b"/a", b"y"), (b"/a", b"z")])], 1))
         self.assertEqual(list(self.figures(path, status=1)[0].values())[1:], [1, 1, 1, 3, 2.0])
-        self.assertIn("warning: byte 58: the image is damaged, a key is filed where it is never found", self.stats(path)[2])
+        self.assertIn("error: byte 58: the image is damaged, a key is filed where it is never found", self.stats(path)[2])
 
     def test_every_format_has_the_same_numbers(self):
         name = 'a,"b" <&>.txt' if os.name != "nt" and len(KOLVANE) == 1 else "a,'b' &.txt"
@@ -104,7 +104,7 @@ class Stats(CommandTest):
         cut = self.file((SAMPLES / "it.bin").read_bytes()[:1500], "cut.bin")
         status, output, errors = self.stats(path, "missing", cut, "-", stdin=text(a="x"))
         self.assertEqual((status, [line.split()[0] for line in output.splitlines()]), (2, ["file", str(path), str(cut), "-"]))
-        self.assertRegex(errors, r"^kolvane: missing: No such file.*\nkolvane: .*cut.bin: warning: the image is cut short: .*\n$")
+        self.assertRegex(errors, r"^kolvane: missing: No such file.*\nkolvane: .*cut.bin: error: the image is cut short: .*\n$")
         for other, status in [(cut, 1), ("missing", 2), (self.file(PAD, "no-keys"), 2), (reference, 0)]:
             self.assertEqual(self.stats("--reference", other, path)[0], status, other)
 

@@ -14,9 +14,12 @@
 #include "Converters.h"
 #include "DictionaryReader.h"
 #include "EncodingOption.h"
+#include "FileKind.h"
 #include "ImageFile.h"
+#include "MalformedText.h"
 #include "OutputFile.h"
 #include "Text.h"
+#include "UTF8.h"
 
 namespace {
 
@@ -31,7 +34,7 @@ Examples:
 
 Lines, their order, ends and spacing stay as they are. UTF-16 gets a byte-order mark, the other
 encodings have none. A character that the target lacks, and input that is malformed, is named with its
-line, and nothing is written. INPUT may be '-' for standard input.)";
+line, and nothing is written. INPUT may be '-' for standard input, and OUT may be INPUT.)";
 
 struct Request {
   std::string input;
@@ -76,15 +79,6 @@ std::string PlaceBehind(Units text, const std::string& name) {
   return fmt::format("{}:{}:{}", name, line, 1 + CodePointCount(text));
 }
 
-std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian) {
-  std::vector<uint16_t> units =
-      UnitsOf({reinterpret_cast<const uint8_t*>(text.data()), text.size()});
-  if (isBigEndian) {
-    for (uint16_t& unit : units) unit = static_cast<uint16_t>(unit << 8 | unit >> 8);
-  }
-  return units;
-}
-
 // Throws Failure for what is no text, or malformed.
 std::vector<uint16_t> Decoded(const ImageFile& file) {
   const std::string name = Printable(file.name);
@@ -92,12 +86,9 @@ std::vector<uint16_t> Decoded(const ImageFile& file) {
     throw Failure(name +
                   ": a binary dictionary has no encoding to change; 'kolvane dump' prints it");
   }
-  if (const auto bad = MalformedUTF8At(file.utf8)) {
-    std::string_view before = std::string_view(file.utf8).substr(0, *bad);
-    if (before.starts_with(kUTF8Mark)) before.remove_prefix(kUTF8Mark.size());
-    throw Failure(
-        fmt::format("{}: byte {} is malformed UTF-8", PlaceBehind(ToUTF16(before), name), *bad));
-  }
+  if (KindOf(file) == FileKind::kUTF16WithoutMark) RequireDictionary(file);
+  if (const auto malformed = MalformedText(file)) throw Failure(*malformed);
+  if (!file.utf8.empty()) return ToUTF16(WithoutUTF8Mark(file.utf8));
   const TextEncoding source = tovali_private::EncodingByMark(file.bytes);
   if (source == TextEncoding::kCodePage) {
     return FromMultiByte(file.bytes, tovali_private::kDefaultSelector);
@@ -114,12 +105,13 @@ std::vector<uint16_t> Decoded(const ImageFile& file) {
 // Text without a byte-order mark must not begin with what marks something else.
 void RefuseMisreading(const std::string& name, std::string_view text, TextEncoding target) {
   if (target == TextEncoding::kUTF16LE || target == TextEncoding::kUTF16BE) return;
-  const bool isMarked = tovali_private::EncodingByMark(text) != TextEncoding::kCodePage;
-  if (!isMarked && !tovali_private::IsBinary(text)) return;
+  const bool isUTF16 =
+      tovali_private::EncodingByMark(text) != TextEncoding::kCodePage || LooksLikeUTF16(text);
+  if (!isUTF16 && !tovali_private::IsBinary(text)) return;
   throw Failure(
       fmt::format("{}:1:1: nothing was written, for without a byte-order mark the text "
                   "would be taken for {}",
-                  Printable(name), isMarked ? "UTF-16" : "a binary dictionary"));
+                  Printable(name), isUTF16 ? "UTF-16" : "a binary dictionary"));
 }
 
 std::string BytesOf(Units units, bool isBigEndian) {

@@ -16,6 +16,7 @@
 #include "StandardOutput.h"
 #include "Text.h"
 #include "TextSyntax.h"
+#include "UTF8.h"
 
 namespace {
 

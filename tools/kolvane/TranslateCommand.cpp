@@ -40,7 +40,8 @@ Examples:
 A KEY is a text such as '$$$/Dialog/Cancel=Cancel'; what no dictionary has is translated by the text
 after its '='. Without a KEY, each line of standard input is one. FILE may be '-' for standard input.
 Files are handed over exactly as they are (image) or as text in UTF-8 (utf-8); auto, the default, is
-utf-8 for valid UTF-8 text with a character beyond ASCII, else image.)";
+utf-8 for text beyond ASCII that is meant as UTF-8, else image. Of a damaged FILE the rest is used, and
+the exit status is 2.)";
 
 struct Request {
   std::vector<std::string> dictionaries;
@@ -108,29 +109,41 @@ void Load(const ImageFile& file, Translator& translator) {
        [&] { translator.SetTranslations(image.units.get(), image.unitCount); });
 }
 
-// A translator does not tell how the loading of an image went; a table does.
-void Warn(const ImageFile& file) {
-  DictionaryTable table;
-  LoadWithWarnings(table, file);
+// Reports what is wrong with the file, which a translator does not tell but a table does. Returns
+// whether all of it could be loaded.
+bool IsWhole(const ImageFile& file) {
+  try {
+    DictionaryTable table;
+    return LoadWithWarnings(table, file);
+  } catch (const Failure& failure) {
+    Say(failure.what());
+    return false;
+  }
 }
 
-// Loads the files in order, with their warnings. Returns whether all of them could be loaded.
-bool LoadAll(const std::vector<std::string>& names, FileEncoding encoding, Translator& translator) {
-  bool loadedAll = true;
-  for (const std::string& name : names) {
-    try {
-      const ImageFile file = ReadImageFile(name, encoding);
-      Load(file, translator);
-      Warn(file);
-    } catch (const Failure& failure) {
-      Say(failure.what());
-      loadedAll = false;
-    } catch (const std::bad_alloc&) {
-      Say(fmt::format("{}: out of memory", Printable(name)));
-      loadedAll = false;
-    }
+enum class Loading { kWhole, kPartly, kFailed };
+
+Loading LoadFile(const std::string& name, FileEncoding encoding, Translator& translator) {
+  try {
+    const ImageFile file = ReadImageFile(name, encoding);
+    Load(file, translator);
+    return IsWhole(file) ? Loading::kWhole : Loading::kPartly;
+  } catch (const Failure& failure) {
+    Say(failure.what());
+  } catch (const std::bad_alloc&) {
+    Say(fmt::format("{}: out of memory", Printable(name)));
   }
-  return loadedAll;
+  return Loading::kFailed;
+}
+
+// Loads the files in order, and returns the worst that came of it.
+Loading LoadAll(const std::vector<std::string>& names, FileEncoding encoding,
+                Translator& translator) {
+  Loading worst = Loading::kWhole;
+  for (const std::string& name : names) {
+    worst = std::max(worst, LoadFile(name, encoding, translator));
+  }
+  return worst;
 }
 
 std::string Translation(Translator& translator, const std::string& key) {
@@ -175,15 +188,16 @@ ExitStatus Translate(const Request& request) {
   const boost::shared_ptr<Translator> translator = NewTranslator();
   Call([] { return "cannot make a translator the default"; },
        [&] { defaultTranslator->MakeDefault(); });
-  const bool loadedDefaults =
+  const Loading defaults =
       LoadAll(request.defaultDictionaries, request.encoding, *defaultTranslator);
-  const bool loadedOwn = LoadAll(request.dictionaries, request.encoding, *translator);
-  if (!loadedDefaults || !loadedOwn) return ExitStatus::kNotDone;
+  const Loading own = LoadAll(request.dictionaries, request.encoding, *translator);
+  const Loading loaded = std::max(defaults, own);
+  if (loaded == Loading::kFailed) return ExitStatus::kNotDone;
 
   const char ending = request.nul ? '\0' : '\n';
   for (const std::string& key : request.keys) WriteOutput(Translation(*translator, key) + ending);
   if (request.keys.empty()) TranslateInput(*translator, request.nul, ending);
-  return ExitStatus::kDone;
+  return loaded == Loading::kWhole ? ExitStatus::kDone : ExitStatus::kNotDone;
 }
 
 }  // namespace

@@ -13,11 +13,12 @@
 #include "ConvertCommand.h"
 #include "DictionaryFile.h"
 #include "DumpCommand.h"
+#include "FileKind.h"
 #include "Guard.h"
 #include "Input.h"
 #include "StandardOutput.h"
 #include "StatsCommand.h"
-#include "Text.h"
+#include "UTF8.h"
 
 namespace {
 
@@ -122,8 +123,10 @@ std::optional<std::string> Trial::Written(const Words& words) const {
 
 Loaded::Loaded(const Words& files, FileEncoding encoding) {
   for (const std::string& name : files) {
-    const LoadStatus status = LoadInto(table, ReadImageFile(name, encoding));
-    isWhole = isWhole && status.Complete();
+    const ImageFile file = ReadImageFile(name, encoding);
+    const LoadStatus status = LoadInto(table, file);
+    areDictionaries = areDictionaries && KindOf(file) == FileKind::kDictionary;
+    isWhole = isWhole && areDictionaries && status.Complete() && IsValidUTF8(file.utf8);
     isTooShort = isTooShort || status.damage == LoadDamage::kTooShort;
   }
   answers = AnswersOf(table);

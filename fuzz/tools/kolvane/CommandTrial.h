@@ -62,6 +62,7 @@ struct Loaded {
 
   DictionaryTable table;
   Answers answers;
+  bool areDictionaries = true;  // as far as that can be told
   bool isWhole = true;
   bool isTooShort = false;  // one of them
 };

@@ -6,6 +6,7 @@
 #include "DictionaryReader.h"
 #include "Input.h"
 #include "Text.h"
+#include "UTF8.h"
 
 namespace {
 
@@ -25,11 +26,17 @@ Answers AnswersIn(const JSON& entries) {
   return answers;
 }
 
+void RequireRefusal(const CommandRun& run) {
+  Require(run.status == ExitStatus::kNotDone && run.output.empty(),
+          "what is no dictionary is not printed");
+}
+
 void TryDumpAsJSON(Trial& trial) {
   const bool isSorted = !trial.choices.OneIn(2);
   const Words options = isSorted ? Words{"dump", "--json", "--sort"} : Words{"dump", "--json"};
   const CommandRun run = trial.Run(options + Words{trial.files.front()});
   const Loaded input({trial.files.front()}, trial.encoding);
+  if (!input.areDictionaries) return RequireRefusal(run);
   const JSON entries = JSON::parse(run.output)["entries"];
   Require(entries.size() == input.answers.size(), "JSON has each entry once");
   Require(AnswersIn(entries) == input.answers, "JSON has what a translator finds");
@@ -48,6 +55,7 @@ void TryDumpAsText(Trial& trial) {
   if (isUTF16) options.push_back("--utf-16");
   const CommandRun run = trial.Run(options + Words{trial.files.front()});
   const Loaded input({trial.files.front()}, trial.encoding);
+  if (!input.areDictionaries) return RequireRefusal(run);
   const bool isLost = run.said.find("cannot be written as text") != run.said.npos;
   Require((run.status == ExitStatus::kDone) == (input.isWhole && !isLost), "the status tells all");
   Require(isUTF16 || IsValidUTF8(run.output), "text is UTF-8");
@@ -64,13 +72,15 @@ std::optional<std::string> InUTF16(const Trial& trial, const std::string& name,
   return trial.Written(Words{"convert", "--to", "utf-16le", name} + encodingOption);
 }
 
-// A mark is a part of the first line, which only matters where there are no quotes.
+// The mark of UTF-16 is a part of the first line, which only matters where there are no quotes.
 void RequireSameLoad(const std::string& name, FileEncoding encoding, const Loaded& expected) {
   const Loaded loaded({name}, encoding);
-  const std::string image = ReadImageFile(name, encoding).bytes;
+  const ImageFile file = ReadImageFile(name, encoding);
+  const bool isUTF8 = !file.utf8.empty();
   const bool isMarked =
-      tovali_private::EncodingByMark(image) != TextEncoding::kCodePage || image.starts_with('"');
-  const bool isLoaded = isMarked && !loaded.isTooShort && !expected.isTooShort;
+      !isUTF8 && tovali_private::EncodingByMark(file.bytes) != TextEncoding::kCodePage;
+  const bool isQuoted = WithoutUTF8Mark(isUTF8 ? file.utf8 : file.bytes).starts_with('"');
+  const bool isLoaded = (isMarked || isQuoted) && !loaded.isTooShort && !expected.isTooShort;
   Require(!isLoaded || loaded.answers == expected.answers, "the encoding alone changes");
 }
 

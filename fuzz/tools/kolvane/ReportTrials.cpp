@@ -8,7 +8,7 @@
 #include "Input.h"
 #include "Rules.h"
 #include "Statistics.h"
-#include "Text.h"
+#include "UTF8.h"
 
 namespace {
 
@@ -31,6 +31,7 @@ bool IsChecked(const JSON& report, const std::string& file) {
     const bool isMalformed =
         finding["rule"] == rules::kMalformedInput.name && !finding.contains("line");
     return finding["file"] == file && (isMalformed || finding["rule"] == rules::kTooShort.name ||
+                                       finding["rule"] == rules::kNoDictionary.name ||
                                        finding["rule"] == rules::kUTF16WithoutMark.name);
   });
 }
@@ -161,14 +162,16 @@ void TryStats(Trial& trial) {
   const bool hasReference = trial.files.size() > 1;
   const Words words = (hasReference ? Words{"stats", "--reference"} : Words{"stats"}) + trial.files;
   const CommandRun run = trial.Run(words + Words{"--format=json"});
-  const Answers reference = Loaded({trial.files.front()}, trial.encoding).answers;
-  if (hasReference && reference.empty()) {
+  const Loaded first({trial.files.front()}, trial.encoding);
+  const Answers& reference = first.answers;
+  if (hasReference && (reference.empty() || !first.areDictionaries)) {
     Require(run.status == ExitStatus::kNotDone && run.output.empty(), "nothing to compare with");
     return;
   }
-  const bool areWhole = std::ranges::all_of(
-      trial.files, [&](const auto& file) { return Loaded({file}, trial.encoding).isWhole; });
-  Require((run.status == ExitStatus::kDone) == areWhole, "the status tells of damage");
+  const Loaded all(trial.files, trial.encoding);
+  Require((run.status == ExitStatus::kDone) == all.isWhole, "the status tells of damage");
+  Require((run.status == ExitStatus::kNotDone) == !all.areDictionaries, "and of no dictionary");
+  if (!all.areDictionaries) return;
   const JSON report = JSON::parse(run.output);
   Require(report["files"].size() == trial.files.size() - (hasReference ? 1 : 0),
           "each file but the reference is counted");

@@ -55,7 +55,7 @@ Definitions CheckText(const ImageFile& file, FileEncoding encoding,
   Definitions definitions;
   if (!CheckEncoding(file, encoding, findings)) return definitions;
   const bool isLoaded = CheckEnd(file, findings);
-  TextLines lines(file.bytes);
+  TextLines lines(file);
   for (TextLine line; lines.Next(line);) CheckLine(file.name, line, definitions, findings);
   return isLoaded ? definitions : Definitions();
 }
@@ -77,9 +77,9 @@ void SortByPlace(std::vector<Finding>& findings) {
 // What keeps a file, or a part of it, from being read for what it is.
 bool IsUnread(const Finding& finding) {
   if (finding.rule == &rules::kMalformedInput) return finding.place.line == 0;  // of all of it
-  constexpr const Rule* kRules[] = {&rules::kTooShort, &rules::kUTF16WithoutMark,
-                                    &rules::kTruncatedImage, &rules::kDamagedImage,
-                                    &rules::kUnsupportedVersion};
+  constexpr const Rule* kRules[] = {&rules::kTooShort,         &rules::kNoDictionary,
+                                    &rules::kUTF16WithoutMark, &rules::kTruncatedImage,
+                                    &rules::kDamagedImage,     &rules::kUnsupportedVersion};
   return std::ranges::find(kRules, finding.rule) != std::end(kRules);
 }
 

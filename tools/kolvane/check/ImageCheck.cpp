@@ -17,6 +17,7 @@
 #include "SeededHash.h"
 #include "StoredGroups.h"
 #include "Text.h"
+#include "UTF8.h"
 
 namespace {
 

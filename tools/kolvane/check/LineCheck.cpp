@@ -13,6 +13,7 @@
 #include "Rules.h"
 #include "Text.h"
 #include "TextSyntax.h"
+#include "UTF8.h"
 
 namespace {
 

@@ -31,7 +31,7 @@ class FoundOnce {
 };
 
 void FindLines(const ImageFile& file, FoundOnce& found) {
-  TextLines lines(file.bytes);
+  TextLines lines(file);
   for (TextLine line; lines.Next(line);) {
     const auto split = tovali_private::SplitKolvane(tovali_private::EntryText(line.text));
     if (!split) continue;

@@ -2,24 +2,22 @@
 
 #include <fmt/format.h>
 
-#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
 #include <memory>
 #include <string_view>
 #include <utility>
-#include <vector>
 
 #include "BinaryLoader.h"
+#include "DictionaryReader.h"
 #include "File.h"
 #include "LoadStatus.h"
 #include "Messages.h"
-#include "Text.h"
+#include "UTF8.h"
+#include "UTF8Image.h"
 
 namespace {
-
-constexpr uint16_t kByteOrderMark = 0xFEFF;
 
 [[noreturn]] void Fail(const std::string& name, std::string_view reason) {
   throw Failure(fmt::format("{}: {}", Printable(name), reason));
@@ -45,30 +43,19 @@ std::string ReadBytes(const std::string& name) {
   return ReadAll(name, file.get());
 }
 
-bool IsTextInUTF8(std::string_view bytes) {
-  const bool beyondASCII = std::any_of(bytes.begin(), bytes.end(), [](char byte) {
-    return static_cast<unsigned char>(byte) >= 0x80;
-  });
-  return beyondASCII && IsValidUTF8(bytes);
-}
-
-// UTF-16 with its byte-order mark, in the machine's byte order, which is the one that the mark
-// tells.
-std::string RecodedFromUTF8(const std::string& name, std::string_view text) {
-  std::vector<uint16_t> units = ToUTF16(text);
-  if (units.empty() || units.front() != kByteOrderMark) units.insert(units.begin(), kByteOrderMark);
-  if (units.size() > kMostImageBytes / 2) Fail(name, "too large once it is UTF-16 (2 GiB)");
-  return {reinterpret_cast<const char*>(units.data()), units.size() * 2};
+bool IsUTF8(std::string_view bytes, FileEncoding encoding) {
+  if (bytes.empty() || tovali_private::IsBinary(bytes)) return false;
+  if (encoding != FileEncoding::kAuto) return encoding == FileEncoding::kUTF8;
+  const bool isUnmarked = tovali_private::EncodingByMark(bytes) == TextEncoding::kCodePage;
+  return isUnmarked && IsMeantAsUTF8(bytes);
 }
 
 }  // namespace
 
 ImageFile ReadImageFile(const std::string& name, FileEncoding encoding) {
   std::string bytes = ReadBytes(name);
-  const bool isText = !bytes.empty() && !tovali_private::IsBinary(bytes);
-  const bool isUTF8 = isText && (encoding == FileEncoding::kUTF8 ||
-                                 (encoding == FileEncoding::kAuto && IsTextInUTF8(bytes)));
-  if (!isUTF8) return {name, std::move(bytes), {}};
-  std::string image = RecodedFromUTF8(name, bytes);
+  if (!IsUTF8(bytes, encoding)) return {name, std::move(bytes), {}};
+  std::string image = ImageOfUTF8(bytes);
+  if (image.size() > kMostImageBytes) Fail(name, "too large once it is UTF-16 (2 GiB)");
   return {name, std::move(image), std::move(bytes)};
 }

@@ -3,7 +3,12 @@
 #include <fmt/format.h>
 
 #include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
 
+#include "FileKind.h"
+#include "MalformedText.h"
 #include "Messages.h"
 #include "TextLines.h"
 
@@ -47,29 +52,42 @@ std::string Loaded(uint32_t count) {
   return count == 1 ? "1 entry was loaded" : fmt::format("{} entries were loaded", count);
 }
 
-}  // namespace
-
-std::vector<std::string> WarningsOf(const ImageFile& file, const LoadStatus& status) {
-  std::vector<std::string> warnings;
-  const auto warn = [&](std::string_view text) {
-    warnings.push_back(fmt::format("{}: warning: {}", Printable(file.name), text));
-  };
-  if (const std::string damage = DamageText(file, status); !damage.empty()) {
-    warn(fmt::format("{}; {}", damage, Loaded(status.entriesAdded)));
-  } else if (status.entriesAdded == 0) {
-    warn("the file adds nothing");
-  }
-  if (status.linesDropped != 0) {
-    warn(fmt::format("{} with one or two dollar signs where none or three are due",
-                     status.linesDropped == 1
-                         ? "1 line was dropped: it begins"
-                         : fmt::format("{} lines were dropped: they begin", status.linesDropped)));
-  }
-  return warnings;
+void SayOf(const ImageFile& file, std::string_view severity, std::string_view text) {
+  Say(fmt::format("{}: {}: {}", Printable(file.name), severity, text));
 }
 
+// These return whether there was nothing to report.
+bool ReportMalformedUTF8(const ImageFile& file) {
+  const std::optional<std::string> text = MalformedText(file);
+  if (text) Say(*text);
+  return !text;
+}
+
+bool ReportDamage(const ImageFile& file, const LoadStatus& status) {
+  if (status.Complete()) return true;
+  SayOf(file, "error",
+        fmt::format("{}; {}", DamageText(file, status), Loaded(status.entriesAdded)));
+  return false;
+}
+
+void ReportDoubts(const ImageFile& file, const LoadStatus& status) {
+  if (status.Complete() && status.entriesAdded == 0)
+    SayOf(file, "warning", "the file adds nothing");
+  if (status.linesDropped == 0) return;
+  const std::string dropped =
+      status.linesDropped == 1
+          ? "1 line was dropped: it begins"
+          : fmt::format("{} lines were dropped: they begin", status.linesDropped);
+  SayOf(file, "warning", dropped + " with one or two dollar signs where none or three are due");
+}
+
+}  // namespace
+
 bool LoadWithWarnings(DictionaryTable& table, const ImageFile& file) {
+  RequireDictionary(file);
+  const bool isWellFormed = ReportMalformedUTF8(file);
   const LoadStatus status = LoadInto(table, file);
-  for (const std::string& warning : WarningsOf(file, status)) Say(warning);
-  return status.Complete();
+  const bool isWhole = ReportDamage(file, status);
+  ReportDoubts(file, status);
+  return isWellFormed && isWhole;
 }

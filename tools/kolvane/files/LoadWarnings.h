@@ -1,14 +1,14 @@
 // What a user should know of a load that did not go as the file promised.
 #pragma once
 
-#include <string>
-#include <vector>
-
 #include "DictionaryFile.h"
 
-// One line for each, naming the file and the reason: the file is empty or adds nothing, is cut
-// short or damaged (with the place), lines were dropped (with their number).
-std::vector<std::string> WarningsOf(const ImageFile& file, const LoadStatus& status);
-
-// Loads the file and says its warnings. Returns whether it is whole. Throws what LoadInto throws.
+// Loads the file and reports on standard error, with the file's name and the place:
+// - an error for what could not be read: the file is empty, cut short or damaged, or holds
+// malformed
+//   UTF-8;
+// - a warning for what was read but may not be meant: the file adds nothing, or lines were dropped.
+//
+// Returns whether there was no error. Throws Failure for what is plainly no dictionary
+// (FileKind.h), of which nothing is loaded, and what LoadInto throws.
 bool LoadWithWarnings(DictionaryTable& table, const ImageFile& file);

@@ -2,11 +2,11 @@
 
 #include <fmt/format.h>
 
-#include <algorithm>
 #include <cstddef>
 
 #include "Converters.h"
 #include "LittleEndian.h"
+#include "UTF8.h"
 
 using tovali_private::kUTF8Selector;
 
@@ -32,20 +32,6 @@ std::vector<uint16_t> ToUTF16(std::string_view text) {
   return FromMultiByte(text, &kUTF8Selector);
 }
 
-// What is malformed comes back as U+FFFD, and may share its first bytes with that.
-std::optional<size_t> MalformedUTF8At(std::string_view text) {
-  const std::string back = ToUTF8(ToUTF16(text));
-  const auto differs = std::ranges::mismatch(text, back);
-  if (differs.in1 == text.end() && differs.in2 == back.end()) return std::nullopt;
-  auto at = static_cast<size_t>(differs.in1 - text.begin());
-  while (at < back.size() && (static_cast<unsigned char>(back[at]) & 0xC0) == 0x80) --at;
-  return at;
-}
-
-bool IsValidUTF8(std::string_view text) {
-  return !MalformedUTF8At(text);
-}
-
 std::string_view AsText(std::span<const uint8_t> bytes) noexcept {
   return {reinterpret_cast<const char*>(bytes.data()), bytes.size()};
 }
@@ -53,6 +39,15 @@ std::string_view AsText(std::span<const uint8_t> bytes) noexcept {
 std::vector<uint16_t> UnitsOf(std::span<const uint8_t> bytes) {
   std::vector<uint16_t> units(bytes.size() / 2);
   for (size_t i = 0; i < units.size(); ++i) units[i] = tovali_private::Read16(&bytes[2 * i]);
+  return units;
+}
+
+std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian) {
+  std::vector<uint16_t> units =
+      UnitsOf({reinterpret_cast<const uint8_t*>(text.data()), text.size()});
+  if (isBigEndian) {
+    for (uint16_t& unit : units) unit = static_cast<uint16_t>(unit << 8 | unit >> 8);
+  }
   return units;
 }
 

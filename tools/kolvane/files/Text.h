@@ -2,7 +2,6 @@
 #pragma once
 
 #include <cstdint>
-#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -17,16 +16,13 @@ std::vector<uint16_t> ToUTF16(std::string_view text);
 std::string ToMultiByte(std::span<const uint16_t> units, const int* selector);
 std::vector<uint16_t> FromMultiByte(std::string_view text, const int* selector);
 
-inline constexpr std::string_view kUTF8Mark = "\xEF\xBB\xBF";
-
-// The place of the first byte that belongs to no character.
-std::optional<size_t> MalformedUTF8At(std::string_view text);
-bool IsValidUTF8(std::string_view text);
-
 std::string_view AsText(std::span<const uint8_t> bytes) noexcept;
 
 // The units that are stored in little-endian order; an odd last byte belongs to none.
 std::vector<uint16_t> UnitsOf(std::span<const uint8_t> bytes);
+
+// The units of UTF-16 in either byte order.
+std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian);
 
 // A key, which is bytes, to be shown: as it is where it is UTF-8, else with a character for each
 // byte.

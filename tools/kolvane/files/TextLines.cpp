@@ -1,6 +1,7 @@
 #include "TextLines.h"
 
 #include "Text.h"
+#include "UTF8Image.h"
 
 LineCounter::LineCounter(std::string_view textImage, TextEncoding encoding) noexcept
     : image(textImage),
@@ -31,8 +32,10 @@ size_t LineCounter::LineAt(uint64_t offset) noexcept {
   return line;
 }
 
-TextLines::TextLines(std::string_view textImage)
-    : image(textImage),
+TextLines::TextLines(const ImageFile& file)
+    : isUTF8(!file.utf8.empty()),
+      recoded(isUTF8 ? MarkedUTF16(file.utf8) : std::string()),
+      image(isUTF8 ? recoded : file.bytes),
       stream(image),
       reader(tovali_private::DictionaryReader::Create(&stream)),
       counter(image, reader->Encoding()) {
@@ -52,6 +55,9 @@ bool TextLines::Next(TextLine& line) {
     const size_t number = counter.LineAt(start);
     line = {
         number, counter.CharactersBefore(), {text, reader->LineLength()}, endsInText && lastIsZero};
-    return true;
+    if (start != 0 || !isUTF8) return true;
+    line.text = line.text.subspan(1);  // the mark
+    if (!line.text.empty()) return true;
+    if (lastIsZero) return false;
   }
 }

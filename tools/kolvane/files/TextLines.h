@@ -4,10 +4,12 @@
 #include <cstdint>
 #include <memory>
 #include <span>
+#include <string>
 #include <string_view>
 
 #include "ByteStreams.h"
 #include "DictionaryReader.h"
+#include "ImageFile.h"
 
 // Numbers the lines of a text image from 1, for offsets in bytes that never fall. CR LF ends one
 // line.
@@ -41,16 +43,18 @@ struct TextLine {
   bool endsAtZero = false;         // a zero character ends it, with more behind
 };
 
-// Gives the lines that a translator would, without the empty ones. The first line of UTF-16 begins
-// with its byte-order mark. Borrows the image.
+// Gives the lines that a translator would, without the empty ones, as they are in the file: in
+// UTF-8 without a mark. The first line of UTF-16 begins with its byte-order mark. Borrows the file.
 class TextLines {
  public:
-  explicit TextLines(std::string_view textImage);
+  explicit TextLines(const ImageFile& file);
 
   // Returns false after the last line; a line is valid until the next call.
   bool Next(TextLine& line);
 
  private:
+  bool isUTF8;
+  std::string recoded;  // of UTF-8; the image of the file is not the same line by line
   std::string_view image;
   tovali_private::MemoryInput stream;
   std::unique_ptr<tovali_private::DictionaryReader> reader;

@@ -4,7 +4,8 @@
 
 namespace {
 
-constexpr const Rule* kRules[] = {&rules::kTooShort,
+constexpr const Rule* kRules[] = {&rules::kNoDictionary,
+                                  &rules::kTooShort,
                                   &rules::kZeroCharacter,
                                   &rules::kUTF16WithoutMark,
                                   &rules::kUTF8AsCodePage,

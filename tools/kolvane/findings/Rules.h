@@ -16,6 +16,8 @@ namespace rules {
 using enum Severity;
 
 // Of files.
+inline constexpr Rule kNoDictionary = {"no-dictionary", kError,
+                                       "the file is of another kind, such as PO, XML or JSON"};
 inline constexpr Rule kTooShort = {
     "too-short", kError, "the file has too few bytes to be loaded; a translator ignores it"};
 inline constexpr Rule kZeroCharacter = {
