@@ -1,5 +1,6 @@
 // Loads from std::istream. A file of its own, so that programs that load from memory alone do not
 // link the standard streams (see ByteStreams.h).
+#include <algorithm>
 #include <istream>
 #include <limits>
 #include <streambuf>
