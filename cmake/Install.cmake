@@ -17,43 +17,54 @@ else()
   set(loaded ${CMAKE_INSTALL_LIBDIR})
 endif()
 
-# Others know `target` as Kolvane::`name`. More arguments say what install() does with it.
+# Others know `target` as Kolvane::`name`.
 function(install_target target name)
   if(name STREQUAL kolvane)
     add_executable(Kolvane::${name} ALIAS ${target})
   else()
     add_library(Kolvane::${name} ALIAS ${target})
+    target_include_directories(${target} INTERFACE $<INSTALL_INTERFACE:${headers}>)
   endif()
   set_target_properties(${target} PROPERTIES EXPORT_NAME ${name})
   install(TARGETS ${target} EXPORT KolvaneTargets
     RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR}
     LIBRARY DESTINATION ${loaded}
-    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} ${ARGN})
-endfunction()
-
-# Headers go into a folder of each library's own: names like Data.h are for those who link it.
-function(install_library target name folder)
-  install_target(${target} ${name} FILE_SET HEADERS DESTINATION ${headers}/${folder})
-endfunction()
-
-# For a target whose header add_public_header shows.
-function(install_with_header target name header folder)
-  install_target(${target} ${name})
-  install(FILES ${header} DESTINATION ${headers}/${folder})
-  target_include_directories(${target} INTERFACE $<INSTALL_INTERFACE:${headers}/${folder}>)
+    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR})
 endfunction()
 
 install_target(kolvane kolvane)
 install_target(VRKKolvanes VRKKolvanes)
-install_with_header(VarnelKernel VarnelKernel varnel-kernel/VarnelKernelHost.h kernel)
-install_with_header(varnel_kernel_interface VarnelKernelInterface
-  wrapper-framework/source/VarnelKernel.h kernel)
-install_with_header(kolvane_translator_interface TranslatorInterface
-  kolvane/api/VRKStringTranslatorInterface.h messaging)
-install_library(kolvane_translator_messaging TranslatorMessaging messaging)
-install_library(varnel_framework VarnelFramework framework)
-install_library(kolvane_lib Dictionary dictionary)
-install_library(kolvane_platform Platform platform)
+install_target(VarnelKernel VarnelKernel)
+install_target(varnel_kernel_interface VarnelKernelInterface)
+install_target(kolvane_translator_interface TranslatorInterface)
+install_target(kolvane_translator_messaging TranslatorMessaging)
+install_target(varnel_framework VarnelFramework)
+install_target(kolvane_lib Dictionary)
+install_target(kolvane_platform Platform)
+
+# The headers that programs may include, each with those that it includes itself.
+add_public_headers(
+  # Kolvane::VarnelKernel
+  wrapper-framework/source/VarnelKernel.h
+  varnel-kernel/VarnelKernelHost.h
+  # Kolvane::TranslatorMessaging: the translator interface, its client and protocol, and typed data
+  kolvane/api/VRKStringTranslatorInterface.h
+  kolvane/api/wrapper-framework/VRKStringTranslatorClient.h
+  kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h
+  kolvane/api/wrapper-framework/VRKTranslationImage.h
+  wrapper-framework/source/Data.h
+  wrapper-framework/source/Exceptions.h
+  wrapper-framework/source/KernelRefs.h
+  wrapper-framework/source/RefHandle.h
+  wrapper-framework/source/ReportedCheck.h
+  wrapper-framework/source/ResultCodes.h
+  # Kolvane::Dictionary
+  kolvane/lib/KolvaneDictionary.h
+  kolvane/lib/KolvaneString.h
+  kolvane/lib/LoadStatus.h
+  kolvane/lib/OVErrException.h
+  kolvane/lib/TranslatedString.h)
+install(DIRECTORY ${PUBLIC_HEADERS_FOLDER}/ DESTINATION ${headers})
 
 file(RELATIVE_PATH binToLib ${CMAKE_INSTALL_FULL_BINDIR} ${CMAKE_INSTALL_FULL_LIBDIR})
 set_target_properties(kolvane PROPERTIES INSTALL_RPATH $ORIGIN/${binToLib})

@@ -11,7 +11,7 @@
 #include <string>
 #include <vector>
 
-#include "Input.h"
+#include "fuzz/Input.h"
 
 namespace {
 

@@ -7,7 +7,7 @@
 #include <limits>
 #include <type_traits>
 
-#include "CodePage.h"
+#include "platform/CodePage.h"
 
 namespace platform {
 namespace {

@@ -1,7 +1,7 @@
 // The system's own conversion, called as it is.
 #include <windows.h>
 
-#include "CodePage.h"
+#include "platform/CodePage.h"
 
 namespace platform {
 

@@ -4,7 +4,7 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "Console.h"
+#include "platform/Console.h"
 
 namespace platform {
 

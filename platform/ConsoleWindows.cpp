@@ -9,8 +9,8 @@
 #include <memory>
 #include <string_view>
 
-#include "Console.h"
-#include "WideText.h"
+#include "platform/Console.h"
+#include "platform/WideText.h"
 
 namespace platform {
 namespace {

@@ -1,6 +1,6 @@
 #include <csignal>
 
-#include "Debugger.h"
+#include "platform/Debugger.h"
 
 namespace platform {
 

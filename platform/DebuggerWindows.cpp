@@ -1,6 +1,6 @@
 #include <windows.h>
 
-#include "Debugger.h"
+#include "platform/Debugger.h"
 
 namespace platform {
 

@@ -1,5 +1,5 @@
-#include "File.h"
-#include "WideText.h"
+#include "platform/File.h"
+#include "platform/WideText.h"
 
 namespace platform {
 

@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <new>
 
-#include "Memory.h"
+#include "platform/Memory.h"
 
 namespace platform {
 namespace {

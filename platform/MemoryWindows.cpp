@@ -1,6 +1,6 @@
 #include <new>
 
-#include "Memory.h"
+#include "platform/Memory.h"
 
 namespace platform {
 

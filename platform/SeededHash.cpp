@@ -1,4 +1,4 @@
-#include "SeededHash.h"
+#include "platform/SeededHash.h"
 
 #define XXH_INLINE_ALL
 #include <xxhash.h>

@@ -3,7 +3,7 @@
 
 #include <algorithm>
 
-#include "SharedLibrary.h"
+#include "platform/SharedLibrary.h"
 
 namespace platform {
 namespace {

@@ -1,7 +1,7 @@
 #include <windows.h>
 
-#include "SharedLibrary.h"
-#include "WideText.h"
+#include "platform/SharedLibrary.h"
+#include "platform/WideText.h"
 
 namespace platform {
 namespace {

@@ -1,7 +1,7 @@
 #include <csignal>
 #include <initializer_list>
 
-#include "Termination.h"
+#include "platform/Termination.h"
 
 namespace platform {
 namespace {

@@ -1,6 +1,6 @@
 #include <windows.h>
 
-#include "Termination.h"
+#include "platform/Termination.h"
 
 namespace platform {
 namespace {

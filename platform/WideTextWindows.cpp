@@ -1,6 +1,6 @@
 #include <windows.h>
 
-#include "WideText.h"
+#include "platform/WideText.h"
 
 namespace platform {
 

@@ -1,4 +1,4 @@
-#include "AllocationMeter.h"
+#include "tests/AllocationMeter.h"
 
 #include <malloc.h>
 

@@ -5,7 +5,7 @@
 
 #include <string>
 
-#include "AllocationMeter.h"
+#include "tests/AllocationMeter.h"
 
 // Runs `round` for the 1st, the 2nd, ... point until there is none any more: with a fault at that point
 // alone, then with faults from there on. A round hands its fault to what is to fail, an

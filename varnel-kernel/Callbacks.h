@@ -3,7 +3,7 @@
 
 #include <cstdint>
 
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace varnel_kernel {
 

@@ -1,4 +1,4 @@
-#include "Coercions.h"
+#include "varnel-kernel/Coercions.h"
 
 #include <algorithm>
 #include <iterator>

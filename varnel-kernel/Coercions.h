@@ -4,12 +4,12 @@
 #include <cstdint>
 #include <vector>
 
-#include "Callbacks.h"
-#include "HandleTable.h"
-#include "TextCoercion.h"
-#include "TokenTable.h"
-#include "Values.h"
-#include "VarnelKernel.h"
+#include "varnel-kernel/Callbacks.h"
+#include "varnel-kernel/HandleTable.h"
+#include "varnel-kernel/TextCoercion.h"
+#include "varnel-kernel/TokenTable.h"
+#include "varnel-kernel/Values.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace varnel_kernel {
 

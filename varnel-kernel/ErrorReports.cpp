@@ -1,4 +1,4 @@
-#include "ErrorReports.h"
+#include "varnel-kernel/ErrorReports.h"
 
 #include <cstdio>
 

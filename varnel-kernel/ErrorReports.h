@@ -3,8 +3,8 @@
 
 #include <cstdint>
 
-#include "Callbacks.h"
-#include "VarnelKernelHost.h"
+#include "varnel-kernel/Callbacks.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 namespace varnel_kernel {
 

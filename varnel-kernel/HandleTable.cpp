@@ -1,4 +1,4 @@
-#include "HandleTable.h"
+#include "varnel-kernel/HandleTable.h"
 
 #include <new>
 #include <utility>

@@ -1,4 +1,4 @@
-#include "Kernel.h"
+#include "varnel-kernel/Kernel.h"
 
 namespace varnel_kernel {
 

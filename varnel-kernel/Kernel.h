@@ -6,16 +6,16 @@
 #include <new>
 #include <stdexcept>
 
-#include "Callbacks.h"
-#include "Coercions.h"
-#include "ErrorReports.h"
-#include "HandleTable.h"
-#include "Objects.h"
-#include "PlugIns.h"
-#include "TokenTable.h"
-#include "Trace.h"
-#include "Values.h"
-#include "VarnelKernelHost.h"
+#include "varnel-kernel/Callbacks.h"
+#include "varnel-kernel/Coercions.h"
+#include "varnel-kernel/ErrorReports.h"
+#include "varnel-kernel/HandleTable.h"
+#include "varnel-kernel/Objects.h"
+#include "varnel-kernel/PlugIns.h"
+#include "varnel-kernel/TokenTable.h"
+#include "varnel-kernel/Trace.h"
+#include "varnel-kernel/Values.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 namespace varnel_kernel {
 

@@ -1,4 +1,4 @@
-#include "Objects.h"
+#include "varnel-kernel/Objects.h"
 
 #include <algorithm>
 #include <memory>

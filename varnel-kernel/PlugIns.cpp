@@ -1,4 +1,4 @@
-#include "PlugIns.h"
+#include "varnel-kernel/PlugIns.h"
 
 #include <algorithm>
 #include <memory>

@@ -5,14 +5,14 @@
 #include <string>
 #include <vector>
 
-#include "Callbacks.h"
-#include "Coercions.h"
-#include "ErrorReports.h"
-#include "HandleTable.h"
-#include "Objects.h"
-#include "SharedLibrary.h"
-#include "Trace.h"
-#include "VarnelKernelHost.h"
+#include "platform/SharedLibrary.h"
+#include "varnel-kernel/Callbacks.h"
+#include "varnel-kernel/Coercions.h"
+#include "varnel-kernel/ErrorReports.h"
+#include "varnel-kernel/HandleTable.h"
+#include "varnel-kernel/Objects.h"
+#include "varnel-kernel/Trace.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 namespace varnel_kernel {
 

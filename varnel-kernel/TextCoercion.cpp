@@ -1,4 +1,4 @@
-#include "TextCoercion.h"
+#include "varnel-kernel/TextCoercion.h"
 
 #include <algorithm>
 #include <bit>
@@ -8,7 +8,7 @@
 #include <string_view>
 #include <vector>
 
-#include "CodePage.h"
+#include "platform/CodePage.h"
 
 namespace varnel_kernel {
 namespace {

@@ -4,8 +4,8 @@
 #include <memory>
 #include <optional>
 
-#include "TokenTable.h"
-#include "Values.h"
+#include "varnel-kernel/TokenTable.h"
+#include "varnel-kernel/Values.h"
 
 namespace varnel_kernel {
 

@@ -1,4 +1,4 @@
-#include "TokenTable.h"
+#include "varnel-kernel/TokenTable.h"
 
 namespace varnel_kernel {
 

@@ -6,8 +6,8 @@
 #include <string>
 #include <string_view>
 
-#include "SeededHash.h"
-#include "VarnelKernel.h"
+#include "platform/SeededHash.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace varnel_kernel {
 

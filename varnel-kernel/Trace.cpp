@@ -1,4 +1,4 @@
-#include "Trace.h"
+#include "varnel-kernel/Trace.h"
 
 namespace varnel_kernel {
 

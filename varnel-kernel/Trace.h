@@ -5,8 +5,8 @@
 #include <span>
 #include <type_traits>
 
-#include "Callbacks.h"
-#include "VarnelKernelHost.h"
+#include "varnel-kernel/Callbacks.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 namespace varnel_kernel {
 

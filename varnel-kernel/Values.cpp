@@ -1,4 +1,4 @@
-#include "Values.h"
+#include "varnel-kernel/Values.h"
 
 #include <cstring>
 #include <new>

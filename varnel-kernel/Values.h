@@ -7,9 +7,9 @@
 #include <memory>
 #include <vector>
 
-#include "HandleTable.h"
-#include "TokenTable.h"
-#include "VarnelKernel.h"
+#include "varnel-kernel/HandleTable.h"
+#include "varnel-kernel/TokenTable.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace varnel_kernel {
 

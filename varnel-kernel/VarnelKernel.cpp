@@ -1,10 +1,10 @@
 // The operations of VarnelKernel.h. They check pointers for null and forward to the kernel's parts,
 // which check handles.
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 #include <cstdlib>
 
-#include "Kernel.h"
+#include "varnel-kernel/Kernel.h"
 
 using varnel_kernel::Data;
 using varnel_kernel::Dictionary;

@@ -1,13 +1,13 @@
 // The operations of VarnelKernelHost.h. They are not traced.
-#include "VarnelKernelHost.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 #include <memory>
 #include <string>
 #include <utility>
 
-#include "Kernel.h"
-#include "PlugIns.h"
-#include "SharedLibrary.h"
+#include "platform/SharedLibrary.h"
+#include "varnel-kernel/Kernel.h"
+#include "varnel-kernel/PlugIns.h"
 
 using varnel_kernel::CatchAll;
 using varnel_kernel::FindPlugIn;

@@ -8,7 +8,7 @@
 #ifndef VARNEL_KERNEL_HOST_H
 #define VARNEL_KERNEL_HOST_H
 
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 #ifdef __cplusplus
 enum class VRKPlugIn : uint32_t {};

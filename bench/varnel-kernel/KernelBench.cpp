@@ -3,7 +3,7 @@
 
 #include <cstdlib>
 
-#include "VarnelKernelHost.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 namespace {
 

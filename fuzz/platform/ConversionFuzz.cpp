@@ -9,8 +9,8 @@
 #include <memory>
 #include <vector>
 
-#include "CodePage.h"
-#include "Input.h"
+#include "fuzz/Input.h"
+#include "platform/CodePage.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "CheckedCalls.h"
+#include "fuzz/varnel-kernel/CheckedCalls.h"
 
 #include <cstring>
 

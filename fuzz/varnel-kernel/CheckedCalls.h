@@ -9,11 +9,11 @@
 #include <utility>
 #include <vector>
 
-#include "AllocationMeter.h"
-#include "Choices.h"
-#include "Input.h"
-#include "KernelModel.h"
-#include "Runtime.h"
+#include "fuzz/Choices.h"
+#include "fuzz/Input.h"
+#include "fuzz/varnel-kernel/KernelModel.h"
+#include "tests/AllocationMeter.h"
+#include "tests/Runtime.h"
 
 // A handle that is passed, good or bad.
 struct Argument {

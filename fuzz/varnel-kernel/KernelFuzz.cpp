@@ -3,7 +3,7 @@
 #include <cstddef>
 #include <cstring>
 
-#include "CheckedCalls.h"
+#include "fuzz/varnel-kernel/CheckedCalls.h"
 
 namespace {
 

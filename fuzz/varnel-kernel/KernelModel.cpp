@@ -1,10 +1,10 @@
-#include "KernelModel.h"
+#include "fuzz/varnel-kernel/KernelModel.h"
 
 #include <algorithm>
 #include <cstring>
 #include <unordered_set>
 
-#include "Input.h"
+#include "fuzz/Input.h"
 
 namespace {
 

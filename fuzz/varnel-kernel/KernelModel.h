@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "VarnelKernelHost.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 using Handle = uint32_t;  // of any kind, a token, or any 32 bits
 using Key = uint64_t;     // a handle, or the number of a factory or coercion, which is larger

@@ -1,4 +1,4 @@
-#include "Arena.h"
+#include "kolvane/lib/Arena.h"
 
 #include <algorithm>
 #include <boost/smart_ptr/make_local_shared.hpp>
@@ -6,7 +6,7 @@
 #include <new>
 #include <utility>
 
-#include "Memory.h"
+#include "platform/Memory.h"
 
 namespace tovali_private {
 

@@ -1,16 +1,16 @@
-#include "BinaryLoader.h"
+#include "kolvane/lib/BinaryLoader.h"
 
 #include <algorithm>
 #include <limits>
 #include <optional>
 #include <utility>
 
-#include "ByteStreams.h"
-#include "Converters.h"
-#include "DictionaryReader.h"
-#include "DictionaryTable.h"
-#include "LittleEndian.h"
-#include "StoredGroups.h"
+#include "kolvane/lib/ByteStreams.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/DictionaryReader.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/LittleEndian.h"
+#include "kolvane/lib/StoredGroups.h"
 
 namespace tovali_private {
 namespace {

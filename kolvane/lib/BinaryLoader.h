@@ -13,7 +13,7 @@
 
 #include <string_view>
 
-#include "LoadStatus.h"
+#include "kolvane/lib/LoadStatus.h"
 
 class DictionaryTable;
 

@@ -1,9 +1,9 @@
-#include "Converters.h"
+#include "kolvane/lib/Converters.h"
 
 #include <limits>
 
-#include "CodePage.h"
-#include "OVErrException.h"
+#include "kolvane/lib/OVErrException.h"
+#include "platform/CodePage.h"
 
 namespace tovali_private {
 namespace {

@@ -10,7 +10,7 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "GrowableBuffer.h"
+#include "kolvane/lib/GrowableBuffer.h"
 
 namespace tovali_private {
 

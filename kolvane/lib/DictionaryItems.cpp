@@ -1,4 +1,4 @@
-#include "DictionaryItems.h"
+#include "kolvane/lib/DictionaryItems.h"
 
 #include <algorithm>
 #include <cstring>
@@ -6,8 +6,8 @@
 #include <memory>
 #include <vector>
 
-#include "Converters.h"
-#include "TextSyntax.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/TextSyntax.h"
 
 namespace tovali_private {
 namespace {

@@ -6,9 +6,9 @@
 #include <memory>
 #include <span>
 
-#include "Arena.h"
-#include "ByteStreams.h"
-#include "KolvaneString.h"
+#include "kolvane/lib/Arena.h"
+#include "kolvane/lib/ByteStreams.h"
+#include "kolvane/lib/KolvaneString.h"
 
 namespace tovali_private {
 

@@ -3,11 +3,11 @@
 #include <array>
 #include <utility>
 
-#include "BinaryLoader.h"
-#include "ByteStreams.h"
-#include "DictionaryReader.h"
-#include "DictionaryTable.h"
-#include "TextSyntax.h"
+#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/ByteStreams.h"
+#include "kolvane/lib/DictionaryReader.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/TextSyntax.h"
 
 using tovali_private::DictionaryReader;
 using tovali_private::InputStream;

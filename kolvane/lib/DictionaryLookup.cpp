@@ -4,10 +4,10 @@
 #include <cstring>
 #include <limits>
 
-#include "Converters.h"
-#include "DictionaryTable.h"
-#include "OVErrException.h"
-#include "TextSyntax.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/OVErrException.h"
+#include "kolvane/lib/TextSyntax.h"
 
 using tovali_private::ConvertToUnicode;
 using tovali_private::KeyedRun;

@@ -4,7 +4,7 @@
 #include <utility>
 #include <vector>
 
-#include "DictionaryTable.h"
+#include "kolvane/lib/DictionaryTable.h"
 
 using tovali_private::DictionaryEntry;
 using tovali_private::EntryMemory;

@@ -1,10 +1,10 @@
-#include "DictionaryReader.h"
+#include "kolvane/lib/DictionaryReader.h"
 
 #include <algorithm>
 
-#include "Converters.h"
-#include "LittleEndian.h"
-#include "Scan.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/LittleEndian.h"
+#include "kolvane/lib/Scan.h"
 
 namespace tovali_private {
 namespace {

@@ -6,9 +6,9 @@
 #include <span>
 #include <string_view>
 
-#include "ByteStreams.h"
-#include "GrowableBuffer.h"
-#include "LoadStatus.h"
+#include "kolvane/lib/ByteStreams.h"
+#include "kolvane/lib/GrowableBuffer.h"
+#include "kolvane/lib/LoadStatus.h"
 
 namespace tovali_private {
 

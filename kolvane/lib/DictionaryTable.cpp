@@ -1,4 +1,4 @@
-#include "DictionaryTable.h"
+#include "kolvane/lib/DictionaryTable.h"
 
 #include <utility>
 

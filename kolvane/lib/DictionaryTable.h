@@ -9,11 +9,11 @@
 #include <memory>
 #include <span>
 
-#include "DictionaryItems.h"
-#include "KeyIndex.h"
-#include "LoadStatus.h"
-#include "StoredGroups.h"
-#include "TranslatedString.h"
+#include "kolvane/lib/DictionaryItems.h"
+#include "kolvane/lib/KeyIndex.h"
+#include "kolvane/lib/LoadStatus.h"
+#include "kolvane/lib/StoredGroups.h"
+#include "kolvane/lib/TranslatedString.h"
 
 namespace tovali_private {
 class DictionaryReader;

@@ -1,4 +1,4 @@
-#include "DictionaryWriter.h"
+#include "kolvane/lib/DictionaryWriter.h"
 
 #include <algorithm>
 #include <ostream>
@@ -6,12 +6,12 @@
 #include <stdexcept>
 #include <string_view>
 
-#include "BinaryLoader.h"
-#include "ByteStreams.h"
-#include "Converters.h"
-#include "DictionaryTable.h"
-#include "LittleEndian.h"
-#include "StoredGroups.h"
+#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/ByteStreams.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/LittleEndian.h"
+#include "kolvane/lib/StoredGroups.h"
 
 namespace tovali_private {
 namespace {

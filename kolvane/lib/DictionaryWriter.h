@@ -6,7 +6,7 @@
 #include <iosfwd>
 #include <vector>
 
-#include "LoadStatus.h"
+#include "kolvane/lib/LoadStatus.h"
 
 class DictionaryTable;
 

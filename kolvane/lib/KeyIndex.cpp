@@ -1,4 +1,4 @@
-#include "KeyIndex.h"
+#include "kolvane/lib/KeyIndex.h"
 
 #include <algorithm>
 #include <cstring>
@@ -7,8 +7,8 @@
 #include <new>
 #include <utility>
 
-#include "Memory.h"
-#include "SeededHash.h"
+#include "platform/Memory.h"
+#include "platform/SeededHash.h"
 
 namespace tovali_private {
 namespace {

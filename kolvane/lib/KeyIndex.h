@@ -6,7 +6,7 @@
 #include <memory>
 #include <span>
 
-#include "DictionaryItems.h"
+#include "kolvane/lib/DictionaryItems.h"
 
 namespace tovali_private {
 

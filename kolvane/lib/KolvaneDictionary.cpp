@@ -1,7 +1,7 @@
-#include "KolvaneDictionary.h"
+#include "kolvane/lib/KolvaneDictionary.h"
 
-#include "ByteStreams.h"
-#include "DictionaryTable.h"
+#include "kolvane/lib/ByteStreams.h"
+#include "kolvane/lib/DictionaryTable.h"
 
 KolvaneDictionary::KolvaneDictionary() : table(std::make_unique<DictionaryTable>()) {}
 

@@ -6,8 +6,8 @@
 #include <memory>
 #include <span>
 
-#include "LoadStatus.h"
-#include "TranslatedString.h"
+#include "kolvane/lib/LoadStatus.h"
+#include "kolvane/lib/TranslatedString.h"
 
 class DictionaryTable;
 

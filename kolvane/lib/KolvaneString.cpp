@@ -1,4 +1,4 @@
-#include "KolvaneString.h"
+#include "kolvane/lib/KolvaneString.h"
 
 #include <algorithm>
 #include <limits>

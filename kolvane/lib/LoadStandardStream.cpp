@@ -5,9 +5,9 @@
 #include <limits>
 #include <streambuf>
 
-#include "ByteStreams.h"
-#include "DictionaryTable.h"
-#include "KolvaneDictionary.h"
+#include "kolvane/lib/ByteStreams.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/KolvaneDictionary.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "NamedCharacters.h"
+#include "kolvane/lib/NamedCharacters.h"
 
 #include <algorithm>
 #include <iterator>

@@ -1,8 +1,8 @@
-#include "StoredGroups.h"
+#include "kolvane/lib/StoredGroups.h"
 
 #include <utility>
 
-#include "LittleEndian.h"
+#include "kolvane/lib/LittleEndian.h"
 
 namespace tovali_private {
 

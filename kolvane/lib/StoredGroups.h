@@ -12,7 +12,7 @@
 #include <span>
 #include <vector>
 
-#include "DictionaryItems.h"
+#include "kolvane/lib/DictionaryItems.h"
 
 namespace tovali_private {
 

@@ -1,10 +1,10 @@
-#include "TextSyntax.h"
+#include "kolvane/lib/TextSyntax.h"
 
 #include <algorithm>
 #include <string_view>
 
-#include "NamedCharacters.h"
-#include "Scan.h"
+#include "kolvane/lib/NamedCharacters.h"
+#include "kolvane/lib/Scan.h"
 
 namespace tovali_private {
 namespace {

@@ -11,8 +11,8 @@
 #include <span>
 #include <vector>
 
-#include "KolvaneString.h"
-#include "Scan.h"
+#include "kolvane/lib/KolvaneString.h"
+#include "kolvane/lib/Scan.h"
 
 namespace tovali_private {
 

@@ -1,8 +1,8 @@
-#include "TranslatedString.h"
+#include "kolvane/lib/TranslatedString.h"
 
 #include <algorithm>
 
-#include "OVErrException.h"
+#include "kolvane/lib/OVErrException.h"
 
 void TranslatedString::CopyTo(uint16_t* buffer, uint32_t capacity, bool throwIfShort) const {
   if (capacity != 0) {

@@ -3,7 +3,7 @@
 
 #include <cstdint>
 
-#include "KolvaneString.h"
+#include "kolvane/lib/KolvaneString.h"
 
 // Holds on to the translation, whose text it shares with the dictionary and which outlives it, with
 // up to two megabytes of the dictionary's memory. Stays on the dictionary's thread.

@@ -1,10 +1,10 @@
-#include "VRKDefaultStringTranslator.h"
+#include "kolvane/source/VRKDefaultStringTranslator.h"
 
 #include <boost/smart_ptr/make_shared.hpp>
 #include <utility>
 
-#include "Exceptions.h"
-#include "VRKStringTranslatorImpl.h"
+#include "kolvane/source/VRKStringTranslatorImpl.h"
+#include "wrapper-framework/source/Exceptions.h"
 
 namespace Varnel::LocalizableStrings {
 namespace {

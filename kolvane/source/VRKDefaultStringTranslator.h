@@ -4,8 +4,8 @@
 #include <boost/shared_ptr.hpp>
 #include <boost/weak_ptr.hpp>
 
-#include "VRKStringTranslatorInterface.h"
-#include "Values.h"
+#include "kolvane/api/VRKStringTranslatorInterface.h"
+#include "wrapper-framework/source/Values.h"
 
 namespace Varnel::LocalizableStrings {
 

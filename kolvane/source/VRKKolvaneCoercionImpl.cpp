@@ -1,13 +1,13 @@
-#include "VRKKolvaneCoercionImpl.h"
+#include "kolvane/source/VRKKolvaneCoercionImpl.h"
 
 #include <string>
 #include <vector>
 
-#include "Data.h"
-#include "Exceptions.h"
-#include "ReportedCheck.h"
-#include "VRKDefaultStringTranslator.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "kolvane/source/VRKDefaultStringTranslator.h"
+#include "wrapper-framework/source/Data.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ReportedCheck.h"
 
 namespace Varnel::Kolvanes {
 namespace {

@@ -1,8 +1,8 @@
 // The coercion of keys into translated text.
 #pragma once
 
-#include "DataCoercion.h"
-#include "Tokens.h"
+#include "wrapper-framework/source/DataCoercion.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace Varnel::Kolvanes {
 

@@ -1,17 +1,17 @@
-#include "VRKKolvanes.h"
+#include "kolvane/source/VRKKolvanes.h"
 
 #include <memory>
 #include <utility>
 
-#include "Boundary.h"
-#include "Names.h"
-#include "ResultCodes.h"
-#include "VRKDefaultStringTranslator.h"
-#include "VRKKolvaneCoercionImpl.h"
-#include "VRKStringTranslatorClient.h"
-#include "VRKStringTranslatorFactory.h"
-#include "VRKStringTranslatorImpl.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorFactory.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "kolvane/source/VRKDefaultStringTranslator.h"
+#include "kolvane/source/VRKKolvaneCoercionImpl.h"
+#include "kolvane/source/VRKStringTranslatorImpl.h"
+#include "wrapper-framework/source/Boundary.h"
+#include "wrapper-framework/source/Names.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace {
 

@@ -9,7 +9,7 @@
 #ifndef VRK_KOLVANES_H
 #define VRK_KOLVANES_H
 
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 #if defined(_WIN32)
 #define VRK_KOLVANES_API /* VRKKolvanes.def exports them, at the ordinals 1 to 3 */

@@ -1,10 +1,10 @@
-#include "VRKStringTranslatorImpl.h"
+#include "kolvane/source/VRKStringTranslatorImpl.h"
 
 #include <cstring>
 
-#include "Exceptions.h"
-#include "TranslatedString.h"
-#include "VRKDefaultStringTranslator.h"
+#include "kolvane/lib/TranslatedString.h"
+#include "kolvane/source/VRKDefaultStringTranslator.h"
+#include "wrapper-framework/source/Exceptions.h"
 
 namespace Varnel::LocalizableStrings {
 namespace {

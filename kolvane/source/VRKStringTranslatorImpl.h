@@ -4,9 +4,9 @@
 #include <boost/shared_ptr.hpp>
 #include <boost/smart_ptr/enable_shared_from_this.hpp>
 
-#include "KolvaneDictionary.h"
-#include "VRKStringTranslatorInterface.h"
-#include "Values.h"
+#include "kolvane/api/VRKStringTranslatorInterface.h"
+#include "kolvane/lib/KolvaneDictionary.h"
+#include "wrapper-framework/source/Values.h"
 
 namespace Varnel::LocalizableStrings {
 

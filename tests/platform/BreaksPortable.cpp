@@ -1,6 +1,6 @@
 #include <csignal>
 
-#include "Breaks.h"
+#include "tests/platform/Breaks.h"
 
 namespace {
 

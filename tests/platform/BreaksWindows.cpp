@@ -1,6 +1,6 @@
 #include <windows.h>
 
-#include "Breaks.h"
+#include "tests/platform/Breaks.h"
 
 namespace {
 

@@ -1,10 +1,10 @@
-#include "ConversionResults.h"
+#include "tests/platform/ConversionResults.h"
 
 #include <algorithm>
 #include <cstdint>
 #include <random>
 
-#include "CodePage.h"
+#include "platform/CodePage.h"
 
 namespace {
 

@@ -4,8 +4,8 @@
 
 #include <fstream>
 
-#include "CodePage.h"
-#include "ConversionResults.h"
+#include "platform/CodePage.h"
+#include "tests/platform/ConversionResults.h"
 
 namespace {
 

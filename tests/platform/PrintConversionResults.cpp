@@ -1,7 +1,7 @@
 // Prints what this system's conversion makes of each case, for conversion-results.txt.
 #include <cstdio>
 
-#include "ConversionResults.h"
+#include "tests/platform/ConversionResults.h"
 
 int main() {
   for (const std::string& line : ConversionResults()) std::printf("%s\n", line.c_str());

@@ -6,7 +6,7 @@
 #include <stdlib.h>
 #include <string.h>
 
-#include "VRKKolvanes.h"
+#include "kolvane/source/VRKKolvanes.h"
 
 static VRKResult Step(const char* name) {
   const char* const chosen = getenv("STUBBORN");

@@ -3,7 +3,7 @@
 #include <chrono>
 #include <thread>
 
-#include "VarnelKernelHost.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 #if defined(_WIN32)
 #define EXPORTED extern "C" __declspec(dllexport)

@@ -13,10 +13,10 @@
 #include <thread>
 #include <vector>
 
-#include "AllocationMeter.h"
-#include "Runtime.h"
-#include "SharedLibrary.h"
-#include "VarnelKernelHost.h"
+#include "platform/SharedLibrary.h"
+#include "tests/AllocationMeter.h"
+#include "tests/Runtime.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 namespace {
 

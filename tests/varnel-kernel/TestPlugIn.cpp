@@ -2,7 +2,7 @@
 // `coercion` or `handler` that its terminate entry does not end.
 #include <string>
 
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 #if defined(_WIN32)
 #define EXPORTED extern "C" __declspec(dllexport)

@@ -4,12 +4,12 @@
 #include <stdexcept>
 #include <typeinfo>
 
-#include "Conversion.h"
-#include "Data.h"
-#include "Exceptions.h"
-#include "ResultCodes.h"
-#include "Support.h"
-#include "Tokens.h"
+#include "tests/wrapper-framework/Support.h"
+#include "wrapper-framework/source/Conversion.h"
+#include "wrapper-framework/source/Data.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace {
 

@@ -3,12 +3,12 @@
 
 #include <algorithm>
 
-#include "Breaks.h"
-#include "Conversion.h"
-#include "Data.h"
-#include "Exceptions.h"
-#include "Support.h"
-#include "Tokens.h"
+#include "tests/platform/Breaks.h"
+#include "tests/wrapper-framework/Support.h"
+#include "wrapper-framework/source/Conversion.h"
+#include "wrapper-framework/source/Data.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace {
 

@@ -1,10 +1,10 @@
 // The four holders, and what is done through them.
 #include <random>
 
-#include "Exceptions.h"
-#include "KernelRefs.h"
-#include "Support.h"
-#include "Tokens.h"
+#include "tests/wrapper-framework/Support.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/KernelRefs.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace {
 

@@ -1,9 +1,9 @@
-#include "Support.h"
+#include "tests/wrapper-framework/Support.h"
 
 #include <map>
 #include <utility>
 
-#include "Boundary.h"
+#include "wrapper-framework/source/Boundary.h"
 
 std::string Alive() {
   VRKHostLiveCounts live{};

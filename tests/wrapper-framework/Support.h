@@ -9,14 +9,14 @@
 #include <utility>
 #include <vector>
 
-#include "DataCoercion.h"
-#include "FaultSweep.h"
-#include "MessageHandler.h"
-#include "ObjectFactory.h"
-#include "Operations.h"
-#include "ResultCodes.h"
-#include "Runtime.h"
-#include "VarnelKernelHost.h"
+#include "tests/FaultSweep.h"
+#include "tests/Runtime.h"
+#include "tests/wrapper-framework/Operations.h"
+#include "varnel-kernel/VarnelKernelHost.h"
+#include "wrapper-framework/source/DataCoercion.h"
+#include "wrapper-framework/source/MessageHandler.h"
+#include "wrapper-framework/source/ObjectFactory.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 // What is alive in the kernel, by kind; empty when nothing is.
 std::string Alive();

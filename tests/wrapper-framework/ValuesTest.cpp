@@ -4,7 +4,7 @@
 #include <algorithm>
 #include <limits>
 
-#include "Values.h"
+#include "wrapper-framework/source/Values.h"
 
 namespace {
 

@@ -6,17 +6,12 @@
 #include <string_view>
 #include <vector>
 
-#include "CheckCommand.h"
-#include "CommandLine.h"
-#include "CompileCommand.h"
-#include "Console.h"
-#include "ConvertCommand.h"
-#include "DumpCommand.h"
-#include "Guard.h"
-#include "Messages.h"
-#include "StandardOutput.h"
-#include "StatsCommand.h"
-#include "TranslateCommand.h"
+#include "platform/Console.h"
+#include "tools/kolvane/cli/CommandLine.h"
+#include "tools/kolvane/cli/Diagnostics.h"
+#include "tools/kolvane/cli/ErrorBoundary.h"
+#include "tools/kolvane/cli/StandardOutput.h"
+#include "tools/kolvane/commands/Commands.h"
 
 namespace {
 

@@ -3,7 +3,7 @@
 
 #include <utility>
 
-#include "Exceptions.h"
+#include "wrapper-framework/source/Exceptions.h"
 
 namespace Varnel {
 

@@ -1,4 +1,4 @@
-#include "Conversion.h"
+#include "wrapper-framework/source/Conversion.h"
 
 #include <algorithm>
 #include <cstdint>
@@ -9,9 +9,9 @@
 #include <utility>
 #include <vector>
 
-#include "Data.h"
-#include "Exceptions.h"
-#include "Tokens.h"
+#include "wrapper-framework/source/Data.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace Varnel {
 namespace {

@@ -4,8 +4,8 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "KernelRefs.h"
-#include "Values.h"
+#include "wrapper-framework/source/KernelRefs.h"
+#include "wrapper-framework/source/Values.h"
 
 namespace Varnel {
 

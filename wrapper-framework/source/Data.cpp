@@ -1,12 +1,12 @@
-#include "Data.h"
+#include "wrapper-framework/source/Data.h"
 
 #include <bit>
 #include <limits>
 #include <stdexcept>
 
-#include "Exceptions.h"
-#include "ResultCodes.h"
-#include "Tokens.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace Varnel {
 namespace {

@@ -8,8 +8,8 @@
 #include <type_traits>
 #include <vector>
 
-#include "KernelRefs.h"
-#include "ReportedCheck.h"
+#include "wrapper-framework/source/KernelRefs.h"
+#include "wrapper-framework/source/ReportedCheck.h"
 
 namespace Varnel {
 

@@ -1,9 +1,9 @@
-#include "DataCoercion.h"
+#include "wrapper-framework/source/DataCoercion.h"
 
-#include "Boundary.h"
-#include "DestructionScope.h"
-#include "Exceptions.h"
-#include "ResultCodes.h"
+#include "wrapper-framework/source/Boundary.h"
+#include "wrapper-framework/source/DestructionScope.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace Varnel {
 

@@ -1,9 +1,9 @@
 // The base class of data coercions.
 #pragma once
 
-#include "KernelRefs.h"
-#include "Memory.h"
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/KernelRefs.h"
+#include "wrapper-framework/source/Memory.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace Varnel {
 

@@ -1,11 +1,11 @@
-#include "Exceptions.h"
+#include "wrapper-framework/source/Exceptions.h"
 
 #include <new>
 #include <stdexcept>
 #include <typeinfo>
 
-#include "KernelRefs.h"
-#include "ResultCodes.h"
+#include "wrapper-framework/source/KernelRefs.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace Varnel {
 namespace {

@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <exception>
 
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace Varnel {
 

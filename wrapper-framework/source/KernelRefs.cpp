@@ -1,6 +1,6 @@
-#include "KernelRefs.h"
+#include "wrapper-framework/source/KernelRefs.h"
 
-#include "ResultCodes.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace Varnel {
 

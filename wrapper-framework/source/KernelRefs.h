@@ -4,8 +4,8 @@
 
 #include <cstdint>
 
-#include "RefHandle.h"
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/RefHandle.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace Varnel {
 

@@ -1,8 +1,8 @@
-#include "Memory.h"
+#include "wrapper-framework/source/Memory.h"
 
 #include <cstdint>
 
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace Varnel {
 

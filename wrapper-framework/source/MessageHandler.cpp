@@ -1,10 +1,10 @@
-#include "MessageHandler.h"
+#include "wrapper-framework/source/MessageHandler.h"
 
-#include "Boundary.h"
-#include "DestructionScope.h"
-#include "Exceptions.h"
-#include "ResultCodes.h"
-#include "Tokens.h"
+#include "wrapper-framework/source/Boundary.h"
+#include "wrapper-framework/source/DestructionScope.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace Varnel {
 namespace {

@@ -3,9 +3,9 @@
 
 #include <cstdint>
 
-#include "KernelRefs.h"
-#include "Memory.h"
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/KernelRefs.h"
+#include "wrapper-framework/source/Memory.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace Varnel {
 

@@ -1,4 +1,4 @@
-#include "Names.h"
+#include "wrapper-framework/source/Names.h"
 
 #include <set>
 

@@ -1,11 +1,11 @@
-#include "ObjectFactory.h"
+#include "wrapper-framework/source/ObjectFactory.h"
 
 #include <utility>
 
-#include "Boundary.h"
-#include "DestructionScope.h"
-#include "Exceptions.h"
-#include "ResultCodes.h"
+#include "wrapper-framework/source/Boundary.h"
+#include "wrapper-framework/source/DestructionScope.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace Varnel {
 namespace {

@@ -1,7 +1,7 @@
-#include "ReportedCheck.h"
+#include "wrapper-framework/source/ReportedCheck.h"
 
-#include "Debugger.h"
-#include "VarnelKernel.h"
+#include "platform/Debugger.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace Varnel {
 

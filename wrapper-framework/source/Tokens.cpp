@@ -1,6 +1,6 @@
-#include "Tokens.h"
+#include "wrapper-framework/source/Tokens.h"
 
-#include "Exceptions.h"
+#include "wrapper-framework/source/Exceptions.h"
 
 namespace Varnel {
 

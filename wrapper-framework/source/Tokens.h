@@ -1,8 +1,8 @@
 // Kernel tokens, and the identifiers of the kernel's data types.
 #pragma once
 
-#include "Names.h"
-#include "VarnelKernel.h"
+#include "wrapper-framework/source/Names.h"
+#include "wrapper-framework/source/VarnelKernel.h"
 
 namespace Varnel {
 

@@ -1,4 +1,4 @@
-#include "Values.h"
+#include "wrapper-framework/source/Values.h"
 
 #include <algorithm>
 #include <cstddef>

@@ -12,7 +12,7 @@
 #include <utility>
 #include <vector>
 
-#include "Names.h"
+#include "wrapper-framework/source/Names.h"
 
 namespace orvane {
 

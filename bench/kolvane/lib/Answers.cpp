@@ -1,4 +1,4 @@
-#include "Answers.h"
+#include "bench/kolvane/lib/Answers.h"
 
 #include <stdexcept>
 #include <string>

@@ -4,9 +4,9 @@
 #include <cstddef>
 #include <span>
 
-#include "KeySet.h"
-#include "Queries.h"
-#include "Subject.h"
+#include "bench/kolvane/lib/KeySet.h"
+#include "bench/kolvane/lib/Queries.h"
+#include "bench/kolvane/lib/Subject.h"
 
 // Throws when the loaded subject answers any of the queries wrongly. Where the set lacks the key,
 // the default text is the right answer.

@@ -1,4 +1,4 @@
-#include "Apart.h"
+#include "bench/kolvane/lib/Apart.h"
 
 #include <sys/wait.h>
 #include <unistd.h>

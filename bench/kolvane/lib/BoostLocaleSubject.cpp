@@ -3,8 +3,8 @@
 #include <cstring>
 #include <optional>
 
-#include "PeerFiles.h"
-#include "Subjects.h"
+#include "bench/kolvane/lib/PeerFiles.h"
+#include "bench/kolvane/lib/Subjects.h"
 
 namespace {
 

@@ -5,8 +5,8 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "PeerFiles.h"
-#include "Subjects.h"
+#include "bench/kolvane/lib/PeerFiles.h"
+#include "bench/kolvane/lib/Subjects.h"
 
 namespace {
 

@@ -1,14 +1,14 @@
-#include "Images.h"
+#include "bench/kolvane/lib/Images.h"
 
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <fstream>
 #include <sstream>
 #include <stdexcept>
 
-#include "CodePage.h"
-#include "DictionaryTable.h"
-#include "DictionaryWriter.h"
-#include "Subjects.h"
+#include "bench/kolvane/lib/Subjects.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/DictionaryWriter.h"
+#include "platform/CodePage.h"
 
 namespace {
 

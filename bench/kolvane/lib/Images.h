@@ -4,7 +4,7 @@
 #include <filesystem>
 #include <string>
 
-#include "KeySet.h"
+#include "bench/kolvane/lib/KeySet.h"
 
 enum class ImageKind { kUTF16, kCodePage, kBinary };
 

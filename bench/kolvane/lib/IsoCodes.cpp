@@ -9,7 +9,7 @@
 #include <iterator>
 #include <stdexcept>
 
-#include "KeySet.h"
+#include "bench/kolvane/lib/KeySet.h"
 
 namespace {
 

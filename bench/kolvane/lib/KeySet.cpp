@@ -1,4 +1,4 @@
-#include "KeySet.h"
+#include "bench/kolvane/lib/KeySet.h"
 
 #include <fmt/format.h>
 

@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "PackedTexts.h"
+#include "bench/kolvane/lib/PackedTexts.h"
 
 struct KeySet {
   std::string name;

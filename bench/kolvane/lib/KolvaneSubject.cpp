@@ -1,10 +1,10 @@
 // The library itself, by the kinds of images that it loads.
 #include <boost/interprocess/streams/bufferstream.hpp>
 
-#include "Images.h"
-#include "KolvaneDictionary.h"
-#include "Subjects.h"
-#include "TranslatedString.h"
+#include "bench/kolvane/lib/Images.h"
+#include "bench/kolvane/lib/Subjects.h"
+#include "kolvane/lib/KolvaneDictionary.h"
+#include "kolvane/lib/TranslatedString.h"
 
 namespace {
 

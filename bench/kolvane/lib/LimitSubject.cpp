@@ -6,7 +6,7 @@
 #define XXH_INLINE_ALL
 #include <xxhash.h>
 
-#include "Subjects.h"
+#include "bench/kolvane/lib/Subjects.h"
 
 namespace {
 

@@ -8,10 +8,10 @@
 #include <filesystem>
 #include <fstream>
 
-#include "Apart.h"
-#include "KeySet.h"
-#include "Measures.h"
-#include "Subjects.h"
+#include "bench/kolvane/lib/Apart.h"
+#include "bench/kolvane/lib/KeySet.h"
+#include "bench/kolvane/lib/Measures.h"
+#include "bench/kolvane/lib/Subjects.h"
 
 namespace {
 

@@ -1,12 +1,12 @@
-#include "Measures.h"
+#include "bench/kolvane/lib/Measures.h"
 
 #include <boost/json.hpp>
 #include <chrono>
 #include <utility>
 
-#include "Answers.h"
-#include "Apart.h"
-#include "Memory.h"
+#include "bench/kolvane/lib/Answers.h"
+#include "bench/kolvane/lib/Apart.h"
+#include "bench/kolvane/lib/Memory.h"
 
 namespace {
 

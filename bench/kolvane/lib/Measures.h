@@ -6,8 +6,8 @@
 #include <string>
 #include <vector>
 
-#include "Results.h"
-#include "Subject.h"
+#include "bench/kolvane/lib/Results.h"
+#include "bench/kolvane/lib/Subject.h"
 
 // `hit` and `miss` are in nanoseconds a query, with the answer copied.
 // `load` is in milliseconds, and has `unload` beside it.

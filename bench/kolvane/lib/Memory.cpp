@@ -1,4 +1,4 @@
-#include "Memory.h"
+#include "bench/kolvane/lib/Memory.h"
 
 #include <malloc.h>
 

@@ -1,4 +1,4 @@
-#include "PeerFiles.h"
+#include "bench/kolvane/lib/PeerFiles.h"
 
 #include <unistd.h>
 

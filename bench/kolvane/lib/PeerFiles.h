@@ -6,7 +6,7 @@
 #include <iosfwd>
 #include <string>
 
-#include "KeySet.h"
+#include "bench/kolvane/lib/KeySet.h"
 
 // `FOLDER/de/LC_MESSAGES/bench.mo`, unless it is there, by msgfmt; for both that load such files.
 std::filesystem::path CatalogueFile(const KeySet& set, const std::filesystem::path& folder);

@@ -4,8 +4,8 @@
 #include <ostream>
 #include <stdexcept>
 
-#include "PeerFiles.h"
-#include "Subjects.h"
+#include "bench/kolvane/lib/PeerFiles.h"
+#include "bench/kolvane/lib/Subjects.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "Queries.h"
+#include "bench/kolvane/lib/Queries.h"
 
 #include <initializer_list>
 #include <numeric>

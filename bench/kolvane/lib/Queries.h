@@ -6,7 +6,7 @@
 #include <string_view>
 #include <vector>
 
-#include "KeySet.h"
+#include "bench/kolvane/lib/KeySet.h"
 
 struct Query {
   const char* text;  // `$$$/Key=Default text`

@@ -5,8 +5,8 @@
 
 #include <system_error>
 
-#include "Images.h"
-#include "Subjects.h"
+#include "bench/kolvane/lib/Images.h"
+#include "bench/kolvane/lib/Subjects.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "Results.h"
+#include "bench/kolvane/lib/Results.h"
 
 #include <algorithm>
 

@@ -7,7 +7,7 @@
 #include <utility>
 #include <vector>
 
-#include "Subject.h"
+#include "bench/kolvane/lib/Subject.h"
 
 class Results {
  public:

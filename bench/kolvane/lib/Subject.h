@@ -9,7 +9,7 @@
 #include <string>
 #include <vector>
 
-#include "Queries.h"
+#include "bench/kolvane/lib/Queries.h"
 
 enum class Yields : uint8_t { kUTF16, kUTF8, kNothing };
 

@@ -1,4 +1,4 @@
-#include "Subjects.h"
+#include "bench/kolvane/lib/Subjects.h"
 
 #include <fmt/format.h>
 #include <gnu/libc-version.h>

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "Subject.h"
+#include "bench/kolvane/lib/Subject.h"
 
 // Why a subject takes no part in a key set.
 class LeftOut : public std::runtime_error {

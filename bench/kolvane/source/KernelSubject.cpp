@@ -1,13 +1,13 @@
 // The library as hosts reach it: through an object kernel and the plug-in.
 #include <stdexcept>
 
-#include "Data.h"
-#include "Images.h"
-#include "Subjects.h"
-#include "VRKStringTranslatorClient.h"
-#include "VRKStringTranslatorProtocol.h"
-#include "VRKTranslationImage.h"
-#include "VarnelKernelHost.h"
+#include "bench/kolvane/lib/Images.h"
+#include "bench/kolvane/lib/Subjects.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKTranslationImage.h"
+#include "varnel-kernel/VarnelKernelHost.h"
+#include "wrapper-framework/source/Data.h"
 
 namespace {
 

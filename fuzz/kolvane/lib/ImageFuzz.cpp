@@ -1,9 +1,9 @@
 // Any bytes as images, loaded one after another; the first one also as the default dictionary.
 #include <algorithm>
 
-#include "Input.h"
-#include "SlowTwin.h"
-#include "Support.h"
+#include "fuzz/Input.h"
+#include "tests/kolvane/lib/SlowTwin.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

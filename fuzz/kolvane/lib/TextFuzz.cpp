@@ -1,8 +1,8 @@
 // Any units as lines of text, as values with their escapes, and as what is to be written.
-#include "Input.h"
-#include "SlowTwin.h"
-#include "Support.h"
-#include "TextSyntax.h"
+#include "fuzz/Input.h"
+#include "kolvane/lib/TextSyntax.h"
+#include "tests/kolvane/lib/SlowTwin.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

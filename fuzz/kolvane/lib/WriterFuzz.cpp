@@ -3,9 +3,9 @@
 #include <optional>
 #include <sstream>
 
-#include "DictionaryWriter.h"
-#include "Input.h"
-#include "Support.h"
+#include "fuzz/Input.h"
+#include "kolvane/lib/DictionaryWriter.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

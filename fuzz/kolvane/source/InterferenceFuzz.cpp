@@ -4,12 +4,12 @@
 #include <string_view>
 #include <utility>
 
-#include "Choices.h"
-#include "DataCoercion.h"
-#include "Messages.h"
-#include "Operations.h"
-#include "PlugInRun.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "fuzz/Choices.h"
+#include "fuzz/kolvane/source/PlugInRun.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "tests/kolvane/source/Messages.h"
+#include "tests/wrapper-framework/Operations.h"
+#include "wrapper-framework/source/DataCoercion.h"
 
 namespace {
 

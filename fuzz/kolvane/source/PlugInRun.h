@@ -4,9 +4,9 @@
 #include <cstring>
 #include <string>
 
-#include "Input.h"
-#include "SharedLibrary.h"
-#include "VarnelKernelHost.h"
+#include "fuzz/Input.h"
+#include "platform/SharedLibrary.h"
+#include "varnel-kernel/VarnelKernelHost.h"
 
 // How many handles, registrations and blocks are alive.
 inline VRKHostLiveCounts LiveCounts() {

@@ -1,7 +1,7 @@
 // Any bytes as the decisions of a walk over translator objects.
-#include "Input.h"
-#include "PlugInRun.h"
-#include "TranslatorWalk.h"
+#include "fuzz/Input.h"
+#include "fuzz/kolvane/source/PlugInRun.h"
+#include "fuzz/kolvane/source/TranslatorWalk.h"
 
 int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   const PlugInRun run;

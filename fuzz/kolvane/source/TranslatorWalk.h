@@ -8,15 +8,15 @@
 #include <sstream>
 #include <string>
 
-#include "Choices.h"
-#include "DataCoercion.h"
-#include "DictionaryTable.h"
-#include "DictionaryWriter.h"
-#include "Input.h"
-#include "Messages.h"
-#include "ResultCodes.h"
-#include "VRKStringTranslatorProtocol.h"
-#include "VarnelKernelHost.h"
+#include "fuzz/Choices.h"
+#include "fuzz/Input.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/DictionaryWriter.h"
+#include "tests/kolvane/source/Messages.h"
+#include "varnel-kernel/VarnelKernelHost.h"
+#include "wrapper-framework/source/DataCoercion.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 // The model of a translator.
 struct ModelTranslator {

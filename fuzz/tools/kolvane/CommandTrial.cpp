@@ -1,5 +1,5 @@
 // Any bytes as the files of `kolvane check`, `compile`, `convert`, `dump` and `stats`.
-#include "CommandTrial.h"
+#include "fuzz/tools/kolvane/CommandTrial.h"
 
 #include <algorithm>
 #include <array>
@@ -8,17 +8,13 @@
 #include <map>
 #include <random>
 
-#include "CheckCommand.h"
-#include "CompileCommand.h"
-#include "ConvertCommand.h"
-#include "DictionaryFile.h"
-#include "DumpCommand.h"
-#include "FileKind.h"
-#include "Guard.h"
-#include "Input.h"
-#include "StandardOutput.h"
-#include "StatsCommand.h"
-#include "UTF8.h"
+#include "fuzz/Input.h"
+#include "tools/kolvane/cli/ErrorBoundary.h"
+#include "tools/kolvane/cli/StandardOutput.h"
+#include "tools/kolvane/commands/Commands.h"
+#include "tools/kolvane/dictionary/DictionaryFile.h"
+#include "tools/kolvane/dictionary/FileKind.h"
+#include "tools/kolvane/text/UTF8.h"
 
 namespace {
 

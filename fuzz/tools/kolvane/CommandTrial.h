@@ -8,10 +8,10 @@
 #include <string_view>
 #include <vector>
 
-#include "Choices.h"
-#include "ImageFile.h"
-#include "Messages.h"
-#include "Support.h"
+#include "fuzz/Choices.h"
+#include "tests/kolvane/lib/Support.h"
+#include "tools/kolvane/cli/Diagnostics.h"
+#include "tools/kolvane/dictionary/ImageFile.h"
 
 using Words = std::vector<std::string>;
 

@@ -2,11 +2,11 @@
 #include <algorithm>
 #include <nlohmann/json.hpp>
 
-#include "CommandTrial.h"
-#include "DictionaryReader.h"
-#include "Input.h"
-#include "Text.h"
-#include "UTF8.h"
+#include "fuzz/Input.h"
+#include "fuzz/tools/kolvane/CommandTrial.h"
+#include "kolvane/lib/DictionaryReader.h"
+#include "tools/kolvane/text/UTF8.h"
+#include "tools/kolvane/text/Unicode.h"
 
 namespace {
 

@@ -3,12 +3,12 @@
 #include <nlohmann/json.hpp>
 #include <sstream>
 
-#include "CommandTrial.h"
-#include "DictionaryWriter.h"
-#include "Input.h"
-#include "Rules.h"
-#include "Statistics.h"
-#include "UTF8.h"
+#include "fuzz/Input.h"
+#include "fuzz/tools/kolvane/CommandTrial.h"
+#include "kolvane/lib/DictionaryWriter.h"
+#include "tools/kolvane/lint/Rules.h"
+#include "tools/kolvane/stats/Statistics.h"
+#include "tools/kolvane/text/UTF8.h"
 
 namespace {
 

@@ -1,8 +1,8 @@
-#include "VRKStringTranslatorClient.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
 
-#include "Data.h"
-#include "Tokens.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "wrapper-framework/source/Data.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace Varnel {
 namespace {

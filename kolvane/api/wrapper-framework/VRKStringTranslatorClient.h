@@ -3,8 +3,8 @@
 
 #include <boost/shared_ptr.hpp>
 
-#include "KernelRefs.h"
-#include "VRKStringTranslatorInterface.h"
+#include "kolvane/api/VRKStringTranslatorInterface.h"
+#include "wrapper-framework/source/KernelRefs.h"
 
 namespace Varnel {
 

@@ -1,11 +1,11 @@
-#include "VRKStringTranslatorFactory.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorFactory.h"
 
 #include <memory>
 #include <utility>
 
-#include "Conversion.h"
-#include "Tokens.h"
-#include "VRKStringTranslatorHandler.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorHandler.h"
+#include "wrapper-framework/source/Conversion.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace Varnel {
 

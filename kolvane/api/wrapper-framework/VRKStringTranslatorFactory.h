@@ -4,10 +4,10 @@
 #include <boost/function.hpp>
 #include <boost/shared_ptr.hpp>
 
-#include "Names.h"
-#include "ObjectFactory.h"
-#include "VRKStringTranslatorInterface.h"
-#include "Values.h"
+#include "kolvane/api/VRKStringTranslatorInterface.h"
+#include "wrapper-framework/source/Names.h"
+#include "wrapper-framework/source/ObjectFactory.h"
+#include "wrapper-framework/source/Values.h"
 
 namespace Varnel {
 

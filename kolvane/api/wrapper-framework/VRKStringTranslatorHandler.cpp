@@ -1,17 +1,17 @@
-#include "VRKStringTranslatorHandler.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorHandler.h"
 
 #include <boost/array.hpp>
 #include <string>
 #include <utility>
 #include <vector>
 
-#include "Data.h"
-#include "DestructionScope.h"
-#include "Exceptions.h"
-#include "ReportedCheck.h"
-#include "ResultCodes.h"
-#include "Tokens.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "wrapper-framework/source/Data.h"
+#include "wrapper-framework/source/DestructionScope.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ReportedCheck.h"
+#include "wrapper-framework/source/ResultCodes.h"
+#include "wrapper-framework/source/Tokens.h"
 
 namespace Varnel {
 namespace {

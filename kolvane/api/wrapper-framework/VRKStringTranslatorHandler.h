@@ -3,8 +3,8 @@
 
 #include <boost/shared_ptr.hpp>
 
-#include "MessageHandler.h"
-#include "VRKStringTranslatorInterface.h"
+#include "kolvane/api/VRKStringTranslatorInterface.h"
+#include "wrapper-framework/source/MessageHandler.h"
 
 namespace Varnel {
 

@@ -1,4 +1,4 @@
-#include "VRKTranslationImage.h"
+#include "kolvane/api/wrapper-framework/VRKTranslationImage.h"
 
 #include <cstring>
 #include <utility>

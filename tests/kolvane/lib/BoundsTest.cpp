@@ -10,11 +10,11 @@
 #include <limits>
 #include <streambuf>
 
-#include "AllocationMeter.h"
-#include "Converters.h"
-#include "OVErrException.h"
-#include "Support.h"
-#include "TextSyntax.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/OVErrException.h"
+#include "kolvane/lib/TextSyntax.h"
+#include "tests/AllocationMeter.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

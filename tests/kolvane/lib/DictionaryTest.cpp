@@ -3,8 +3,8 @@
 
 #include <fstream>
 
-#include "OVErrException.h"
-#include "Support.h"
+#include "kolvane/lib/OVErrException.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

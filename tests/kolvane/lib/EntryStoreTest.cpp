@@ -1,10 +1,10 @@
 // Strings, items, and the table with its chains and index.
 #include <gtest/gtest.h>
 
-#include "Converters.h"
-#include "DictionaryTable.h"
-#include "OVErrException.h"
-#include "Support.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/OVErrException.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

@@ -11,12 +11,12 @@
 #include <stdexcept>
 #include <streambuf>
 
-#include "Converters.h"
-#include "DictionaryReader.h"
-#include "FaultSweep.h"
-#include "OVErrException.h"
-#include "SlowTwin.h"
-#include "Support.h"
+#include "kolvane/lib/Converters.h"
+#include "kolvane/lib/DictionaryReader.h"
+#include "kolvane/lib/OVErrException.h"
+#include "tests/FaultSweep.h"
+#include "tests/kolvane/lib/SlowTwin.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

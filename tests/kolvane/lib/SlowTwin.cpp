@@ -1,7 +1,7 @@
-#include "SlowTwin.h"
+#include "tests/kolvane/lib/SlowTwin.h"
 
-#include "CodePage.h"
-#include "NamedCharacters.h"
+#include "kolvane/lib/NamedCharacters.h"
+#include "platform/CodePage.h"
 
 namespace {
 

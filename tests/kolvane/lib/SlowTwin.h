@@ -7,7 +7,7 @@
 #include <utility>
 #include <vector>
 
-#include "Support.h"
+#include "tests/kolvane/lib/Support.h"
 
 class SlowTwin {
  public:

@@ -1,9 +1,9 @@
-#include "Support.h"
+#include "tests/kolvane/lib/Support.h"
 
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <memory>
 
-#include "DictionaryWriter.h"
+#include "kolvane/lib/DictionaryWriter.h"
 
 namespace {
 

@@ -8,7 +8,7 @@
 #include <utility>
 #include <vector>
 
-#include "DictionaryTable.h"
+#include "kolvane/lib/DictionaryTable.h"
 
 // A text image with its byte-order mark.
 std::string LittleEndianImage(const std::u16string& text);

@@ -1,9 +1,9 @@
 // The grammar as tables of cases.
 #include <gtest/gtest.h>
 
-#include "NamedCharacters.h"
-#include "Support.h"
-#include "TextSyntax.h"
+#include "kolvane/lib/NamedCharacters.h"
+#include "kolvane/lib/TextSyntax.h"
+#include "tests/kolvane/lib/Support.h"
 
 namespace {
 

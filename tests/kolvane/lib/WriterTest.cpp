@@ -3,9 +3,9 @@
 
 #include <sstream>
 
-#include "DictionaryWriter.h"
-#include "Support.h"
-#include "TextSyntax.h"
+#include "kolvane/lib/DictionaryWriter.h"
+#include "kolvane/lib/TextSyntax.h"
+#include "tests/kolvane/lib/Support.h"
 
 using namespace tovali_private;
 

@@ -4,10 +4,10 @@
 #include <string>
 #include <vector>
 
-#include "Data.h"
-#include "Tokens.h"
-#include "VRKStringTranslatorInterface.h"
-#include "VRKTranslationImage.h"
+#include "kolvane/api/VRKStringTranslatorInterface.h"
+#include "kolvane/api/wrapper-framework/VRKTranslationImage.h"
+#include "wrapper-framework/source/Data.h"
+#include "wrapper-framework/source/Tokens.h"
 
 inline Varnel::DataRef DataOf(const char* type, const std::string& bytes) {
   return Varnel::MakeData(type, bytes.data(), static_cast<uint32_t>(bytes.size()));

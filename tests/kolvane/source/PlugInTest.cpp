@@ -1,16 +1,16 @@
 // The built plug-in, in a kernel, as a host sees it.
-#include "PlugInTest.h"
+#include "tests/kolvane/source/PlugInTest.h"
 
 #include <boost/interprocess/streams/bufferstream.hpp>
 #include <map>
 #include <sstream>
 
-#include "DictionaryTable.h"
-#include "DictionaryWriter.h"
-#include "Exceptions.h"
-#include "Messages.h"
-#include "VRKStringTranslatorClient.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "kolvane/lib/DictionaryTable.h"
+#include "kolvane/lib/DictionaryWriter.h"
+#include "tests/kolvane/source/Messages.h"
+#include "wrapper-framework/source/Exceptions.h"
 
 namespace {
 

@@ -3,8 +3,8 @@
 
 #include <string>
 
-#include "SharedLibrary.h"
-#include "Support.h"
+#include "platform/SharedLibrary.h"
+#include "tests/wrapper-framework/Support.h"
 
 struct EntryPoints {
   EntryPoints() { EXPECT_NE(library, nullptr) << reason; }

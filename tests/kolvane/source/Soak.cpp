@@ -8,9 +8,9 @@
 #include <cstdio>
 #include <fstream>
 
-#include "PlugInRun.h"
-#include "TranslatorWalk.h"
-#include "VRKStringTranslatorClient.h"
+#include "fuzz/kolvane/source/PlugInRun.h"
+#include "fuzz/kolvane/source/TranslatorWalk.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
 
 namespace {
 

@@ -6,12 +6,12 @@
 #include <thread>
 #include <vector>
 
-#include "Exceptions.h"
-#include "Messages.h"
-#include "ResultCodes.h"
-#include "VRKStringTranslatorClient.h"
-#include "VRKStringTranslatorProtocol.h"
-#include "VarnelKernelHost.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "tests/kolvane/source/Messages.h"
+#include "varnel-kernel/VarnelKernelHost.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace {
 

@@ -1,12 +1,12 @@
 // The plug-in's translators and its coercion, apart from its entry points.
-#include "Exceptions.h"
-#include "Messages.h"
-#include "ResultCodes.h"
-#include "Support.h"
-#include "VRKDefaultStringTranslator.h"
-#include "VRKKolvaneCoercionImpl.h"
-#include "VRKStringTranslatorImpl.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "kolvane/source/VRKDefaultStringTranslator.h"
+#include "kolvane/source/VRKKolvaneCoercionImpl.h"
+#include "kolvane/source/VRKStringTranslatorImpl.h"
+#include "tests/kolvane/source/Messages.h"
+#include "tests/wrapper-framework/Support.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace {
 

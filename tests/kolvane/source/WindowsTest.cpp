@@ -3,8 +3,8 @@
 
 #include <cstddef>
 
-#include "PlugInTest.h"
-#include "VRKStringTranslatorClient.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
+#include "tests/kolvane/source/PlugInTest.h"
 
 namespace {
 

@@ -2,8 +2,8 @@
 
 #include <string_view>
 
-#include "StandardOutput.h"
-#include "StatisticsReport.h"
+#include "tools/kolvane/cli/StandardOutput.h"
+#include "tools/kolvane/stats/StatisticsReport.h"
 
 namespace {
 

@@ -4,11 +4,11 @@
 #include <array>
 #include <string_view>
 
-#include "Messages.h"
-#include "PageStyle.h"
-#include "StandardOutput.h"
-#include "StatisticsReport.h"
-#include "Text.h"
+#include "tools/kolvane/cli/Diagnostics.h"
+#include "tools/kolvane/cli/StandardOutput.h"
+#include "tools/kolvane/stats/PageStyle.h"
+#include "tools/kolvane/stats/StatisticsReport.h"
+#include "tools/kolvane/text/Unicode.h"
 
 namespace {
 

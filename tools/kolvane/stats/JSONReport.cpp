@@ -1,5 +1,5 @@
-#include "JSONOutput.h"
-#include "StatisticsReport.h"
+#include "tools/kolvane/cli/JSON.h"
+#include "tools/kolvane/stats/StatisticsReport.h"
 
 namespace {
 

@@ -1,10 +1,10 @@
-#include "Statistics.h"
+#include "tools/kolvane/stats/Statistics.h"
 
 #include <algorithm>
 #include <cmath>
 
-#include "Comparison.h"
-#include "Words.h"
+#include "tools/kolvane/lint/Comparison.h"
+#include "tools/kolvane/text/Words.h"
 
 using tovali_private::DictionaryEntry;
 using tovali_private::HashItem;

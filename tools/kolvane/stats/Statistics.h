@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <vector>
 
-#include "DictionaryTable.h"
+#include "kolvane/lib/DictionaryTable.h"
 
 // A key is what a lookup finds. Entries that no lookup finds, because another one of their key
 // stands before them or their bucket is not their key's, are no keys; they lengthen chains.

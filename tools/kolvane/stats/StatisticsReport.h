@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "Statistics.h"
+#include "tools/kolvane/stats/Statistics.h"
 
 struct FileStatistics {
   std::string name;  // as the user gave it

@@ -2,12 +2,12 @@
 
 #include <algorithm>
 
-#include "Characters.h"
-#include "DisplayWidth.h"
-#include "Messages.h"
-#include "StandardOutput.h"
-#include "StatisticsReport.h"
-#include "Text.h"
+#include "tools/kolvane/cli/Diagnostics.h"
+#include "tools/kolvane/cli/StandardOutput.h"
+#include "tools/kolvane/stats/StatisticsReport.h"
+#include "tools/kolvane/text/Characters.h"
+#include "tools/kolvane/text/DisplayWidth.h"
+#include "tools/kolvane/text/Unicode.h"
 
 namespace {
 

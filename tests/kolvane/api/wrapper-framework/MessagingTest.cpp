@@ -3,14 +3,14 @@
 #include <boost/smart_ptr/make_shared.hpp>
 #include <memory>
 
-#include "Exceptions.h"
-#include "Messages.h"
-#include "ResultCodes.h"
-#include "Support.h"
-#include "VRKStringTranslatorClient.h"
-#include "VRKStringTranslatorFactory.h"
-#include "VRKStringTranslatorHandler.h"
-#include "VRKStringTranslatorProtocol.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorClient.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorFactory.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorHandler.h"
+#include "kolvane/api/wrapper-framework/VRKStringTranslatorProtocol.h"
+#include "tests/kolvane/source/Messages.h"
+#include "tests/wrapper-framework/Support.h"
+#include "wrapper-framework/source/Exceptions.h"
+#include "wrapper-framework/source/ResultCodes.h"
 
 namespace {
 

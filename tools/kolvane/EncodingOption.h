@@ -1,9 +1,0 @@
-// The option that says how text files are encoded, which all commands take that read dictionaries.
-#pragma once
-
-#include <CLI/CLI.hpp>
-
-#include "ImageFile.h"
-
-// Adds `--encoding` to the group `Dictionaries`; `encoding` outlives the parsing.
-void AddEncodingOption(CLI::App& options, FileEncoding& encoding);
