@@ -1,4 +1,4 @@
-// What a kernel call costs: alone, and with a second thread calling at the same time.
+// The cost of kernel calls, alone and while a second thread calls too.
 #include <benchmark/benchmark.h>
 
 #include <cstdlib>
@@ -67,7 +67,7 @@ void SetGetEntry(benchmark::State& state) {
   VRKDictionaryRelease(dictionary);
 }
 
-// Two calls: the coercion, and the release of what it made.
+// Two calls: the coercion and the release of its result.
 void Coerce(benchmark::State& state, const char* toType) {
   const VRKToken to = Token(toType);
   VRKData text{}, coerced{};

@@ -15,8 +15,8 @@ bool AnswersRight(Subject& subject, const KeySet& set, const Query& query) {
 
 size_t AnswerLength(const Subject& subject, const KeySet& set, const Query& query) {
   if (query.number >= set.Size()) return query.defaultLength;
-  return subject.yields == Yields::kUTF16 ? set.values[query.number].size()
-                                          : set.valuesInUTF8[query.number].size();
+  return subject.encoding == AnswerEncoding::kUTF16 ? set.values[query.number].size()
+                                                    : set.valuesInUTF8[query.number].size();
 }
 
 }  // namespace

@@ -1,4 +1,4 @@
-// Whether subjects answer as they should.
+// Checks of the subjects' answers.
 #pragma once
 
 #include <cstddef>
@@ -8,12 +8,12 @@
 #include "bench/kolvane/lib/Queries.h"
 #include "bench/kolvane/lib/Subject.h"
 
-// Throws when the loaded subject answers any of the queries wrongly. Where the set lacks the key,
-// the default text is the right answer.
+// Throws if the loaded subject answers a query wrongly. The right answer for a missing key is its
+// default text.
 void CheckEach(Subject& subject, const KeySet& set, std::span<const Query> queries);
 
-// How long the subject's answers to the queries are together.
+// Returns the total length of the subject's answers to the queries.
 size_t AnswersLength(const Subject& subject, const KeySet& set, std::span<const Query> queries);
 
-// For timed loops: asks, and throws when the answers are not that long.
+// For timed loops: asks the queries and throws if the total length differs.
 void AskAllOf(Subject& subject, std::span<const Query> queries, size_t answersLength);

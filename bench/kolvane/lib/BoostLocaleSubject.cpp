@@ -1,4 +1,4 @@
-// Boost.Locale's messages, of the same catalogues as gettext's.
+// Boost.Locale's messages, with the catalogues of gettext.
 #include <boost/locale.hpp>
 #include <cstring>
 #include <optional>

@@ -12,8 +12,8 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// A catalogue is never unloaded, and each translation that was found is kept besides. So a new load
-// is one of another domain, whose catalogue is the same file by another name.
+// gettext never unloads a catalogue and caches each translation. Each load therefore uses a new
+// domain, whose catalogue is the same file under another name.
 class GettextSubject final : public AskedSubject<GettextSubject, char> {
  public:
   GettextSubject(const KeySet& set, fs::path workFolder)
@@ -22,10 +22,10 @@ class GettextSubject final : public AskedSubject<GettextSubject, char> {
         catalogue(CatalogueFile(set, folder)) {
     if (std::setlocale(LC_ALL, "C.UTF-8") == nullptr) throw LeftOut("there is no C.UTF-8");
     setenv("LANGUAGE", "de", 1);
-    Renew();
+    PrepareReload();
   }
 
-  // The first question loads.
+  // The first query loads the catalogue.
   void Load() override {
     bindtextdomain(domain.c_str(), folder.c_str());
     bind_textdomain_codeset(domain.c_str(), "UTF-8");
@@ -34,7 +34,7 @@ class GettextSubject final : public AskedSubject<GettextSubject, char> {
 
   void Unload() override {}
 
-  void Renew() override { domain = OneMoreName(catalogue); }
+  void PrepareReload() override { domain = OneMoreName(catalogue); }
 
   void Ask(const Query& query, std::vector<char>& answer) {
     const char* const text = dgettext(domain.c_str(), query.key);

@@ -13,7 +13,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// genrb keeps a table in a sorted list, which it searches from the front.
+// genrb inserts into a sorted list, which takes quadratic time.
 std::vector<size_t> DescendingByKey(const KeySet& set) {
   std::vector<size_t> order(set.Size());
   std::iota(order.begin(), order.end(), size_t{0});
@@ -30,8 +30,7 @@ void FillBundle(std::ostream& stream, const KeySet& set) {
   stream << "}\n";
 }
 
-// A bundle stays in ICU's cache when it is closed. So a new load is one of another bundle, the same
-// file by another name.
+// ICU caches closed bundles. Each load therefore uses the same file under another name.
 class ICUSubject final : public AskedSubject<ICUSubject, uint16_t> {
  public:
   ICUSubject(const KeySet& set, fs::path workFolder)
@@ -40,7 +39,7 @@ class ICUSubject final : public AskedSubject<ICUSubject, uint16_t> {
     WriteSource(source, [&](std::ostream& stream) { FillBundle(stream, set); });
     RunCompiler(GENRB " -q -e UTF-8 -d " + folder.string() + " " + source.string());
     remove(source);
-    Renew();
+    PrepareReload();
   }
 
   void Load() override {
@@ -51,7 +50,7 @@ class ICUSubject final : public AskedSubject<ICUSubject, uint16_t> {
 
   void Unload() override { ures_close(bundle); }
 
-  void Renew() override { bundleName = OneMoreName(folder / "bench.res"); }
+  void PrepareReload() override { bundleName = OneMoreName(folder / "bench.res"); }
 
   void Ask(const Query& query, std::vector<uint16_t>& answer) {
     UErrorCode error = U_ZERO_ERROR;

@@ -21,7 +21,7 @@ void AppendUnits(std::string& image, std::u16string_view text) {
   for (const char16_t unit : text) AppendUnit(image, unit);
 }
 
-// As translators write it.
+// The text form of a definition.
 std::u16string Escaped(std::u16string_view value) {
   std::u16string escaped;
   for (const char16_t unit : value) {

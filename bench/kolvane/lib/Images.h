@@ -1,4 +1,4 @@
-// A key set as the images that the library loads.
+// Dictionary images of a key set.
 #pragma once
 
 #include <filesystem>
@@ -8,8 +8,8 @@
 
 enum class ImageKind { kUTF16, kCodePage, kBinary };
 
-// Writes the image into the folder, unless it is there, and returns its path. Throws LeftOut where
-// an image of that kind cannot hold the set.
+// Writes the image into the folder, unless it exists, and returns its path. Throws: LeftOut if an
+// image of that kind cannot hold the set.
 std::filesystem::path ImageFile(ImageKind kind, const KeySet& set,
                                 const std::filesystem::path& folder);
 

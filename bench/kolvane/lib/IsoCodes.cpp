@@ -1,5 +1,5 @@
-// The real translations among the key sets: the German ones of Debian's iso-codes, whose messages
-// are made into keys.
+// The key set of real translations: the German ones of Debian's iso-codes, with keys made from the
+// messages.
 #include <fmt/format.h>
 
 #include <algorithm>
@@ -28,13 +28,13 @@ uint32_t ReadWord(const std::string& catalogue, size_t offset) {
   return word;
 }
 
-// What row `row` of the table at `table` points to.
+// Returns the text that row `row` of the table at `table` points to.
 std::string_view ReadText(const std::string& catalogue, size_t table, size_t row) {
   const uint32_t length = ReadWord(catalogue, table + 8 * row);
   return std::string_view(catalogue).substr(ReadWord(catalogue, table + 8 * row + 4), length);
 }
 
-// Every peer can hold these bytes in a key.
+// The bytes that every library allows in a key.
 bool StaysInKey(char byte) {
   constexpr std::string_view kPunctuation = " '(),-./:;_";
   const bool isLetter = (byte >= 'a' && byte <= 'z') || (byte >= 'A' && byte <= 'Z');

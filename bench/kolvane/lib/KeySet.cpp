@@ -36,7 +36,7 @@ constexpr std::string_view kFrench[] = {
     "maintenant", "créer",      "à",        "partir",      "modèle",     "français",
     "été",        "paramètres", "réseau",   "œuvre",       "déjà"};
 
-// Not uniform_int_distribution, whose results differ between libraries; the bias is of no account.
+// Not uniform_int_distribution, whose results differ between libraries. The bias is negligible.
 size_t Draw(Random& random, size_t low, size_t high) {
   return low + random() % (high - low + 1);
 }
@@ -45,7 +45,7 @@ std::string_view DrawWord(Random& random, std::span<const std::string_view> word
   return words[Draw(random, 0, words.size() - 1)];
 }
 
-// Words until there are `length` bytes.
+// Appends words until there are `length` bytes.
 std::string DrawText(Random& random, std::span<const std::string_view> words, size_t length) {
   std::string text(DrawWord(random, words));
   while (text.size() < length) {
@@ -75,8 +75,7 @@ PackedTexts<char> MixedPaths(Random& random, size_t count) {
   return paths;
 }
 
-// The digits lie between the bytes that the library's hash samples, so that all keys belong to one
-// bucket.
+// The digits are between the bytes that the format's hash samples, so all keys have one bucket.
 PackedTexts<char> OnePattern(size_t count) {
   PackedTexts<char> keys;
   for (size_t i = 0; i < count; ++i) {
@@ -85,7 +84,7 @@ PackedTexts<char> OnePattern(size_t count) {
   return keys;
 }
 
-// Leaves out keys all along, so that those which a dictionary lacks lie between those it has.
+// Takes missing keys from the whole range, so that they sort between the others.
 void AddSyntheticEntries(KeySet& set, const PackedTexts<char>& keys, size_t size, Random& random) {
   const size_t all = keys.Count(), missing = all - size;
   for (size_t i = 0; i < all; ++i) {

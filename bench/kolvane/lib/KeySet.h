@@ -1,4 +1,4 @@
-// What the benchmark translates: keys that a dictionary has, keys that it lacks, and translations.
+// The test data: keys in a dictionary, missing keys, and translations.
 #pragma once
 
 #include <cstddef>
@@ -12,7 +12,7 @@ struct KeySet {
   PackedTexts<char> keys;             // `/Path/Of/Key`, all different
   PackedTexts<char16_t> values;       // one for each key
   PackedTexts<char> valuesInUTF8;     // the same
-  PackedTexts<char> missingKeys;      // of the same kind, none of them in `keys`
+  PackedTexts<char> missingKeys;      // of the same form, none of them in `keys`
   PackedTexts<char> defaultTexts;     // ASCII without escapes, one for each key
   PackedTexts<char> missingDefaults;  // one for each missing key
 
@@ -21,10 +21,10 @@ struct KeySet {
 
 const std::vector<std::string>& KeySetNames();
 
-// The sets are the same in every run and on every machine. `iso-codes` has a size of its own and
-// ignores the one given; it is empty where the package is not installed.
+// Returns the same set in every run and on every machine. `iso-codes` has a fixed size and ignores
+// `size`; it is empty if the package is not installed.
 KeySet MakeKeySet(const std::string& name, size_t size);
 
-// How the sets are put together; for MakeKeySet and IsoCodes.cpp.
+// Builds a set; for MakeKeySet and IsoCodes.cpp.
 void AddEntry(KeySet& set, std::string_view key, std::string_view valueInUTF8);
 void AddIsoCodes(KeySet& set);

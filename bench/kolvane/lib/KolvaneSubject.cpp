@@ -1,4 +1,4 @@
-// The library itself, by the kinds of images that it loads.
+// The dictionary library, with each kind of image.
 #include <boost/interprocess/streams/bufferstream.hpp>
 
 #include "bench/kolvane/lib/Images.h"

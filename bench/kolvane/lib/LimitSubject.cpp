@@ -1,5 +1,5 @@
-// What a map can do that has nothing to parse, to decode or to own: the yardstick for lookups. Once
-// with the map's own hash of strings, once with a faster one.
+// A flat hash map that parses, decodes and owns nothing: the lower bound for lookups, with the
+// map's own string hash and with a faster one.
 #include <boost/unordered/unordered_flat_map.hpp>
 #include <cstring>
 

@@ -1,4 +1,4 @@
-// dictionary-bench: what lookups and loads cost, beside what others have for the same purpose.
+// dictionary-bench: measures lookups and loads of Kolvane and comparable libraries.
 #include <fmt/format.h>
 
 #include <CLI/CLI.hpp>
@@ -8,10 +8,10 @@
 #include <filesystem>
 #include <fstream>
 
-#include "bench/kolvane/lib/Apart.h"
 #include "bench/kolvane/lib/KeySet.h"
 #include "bench/kolvane/lib/Measures.h"
 #include "bench/kolvane/lib/Subjects.h"
+#include "bench/kolvane/lib/Subprocess.h"
 
 namespace {
 
@@ -43,7 +43,7 @@ bool Contains(const std::vector<std::string>& names, const std::string& name) {
   return std::find(names.begin(), names.end(), name) != names.end();
 }
 
-// A folder for what the subjects load, gone afterwards.
+// A temporary folder for the files that the subjects load.
 class Folder {
  public:
   Folder() {
@@ -84,7 +84,7 @@ json::object MeasureSet(const Options& options, const std::string& name, size_t 
   Measures measures(set, subjects, options.rounds);
   measures.CheckAnswers();
   Results results;
-  // Lookups come last: some subjects remember for good what they were asked.
+  // Lookups come last, because some subjects cache every answer.
   for (const char* measure : {"first-use", "load", "miss", "hit"}) {
     if (Contains(options.measures, measure)) measures.Run(measure, results);
   }
@@ -96,7 +96,7 @@ json::object MeasureSet(const Options& options, const std::string& name, size_t 
           {"results", results.Records()}};
 }
 
-// A line for each subject, a column for each measure.
+// Prints a line for each subject and a column for each measure.
 void Print(const json::object& measured) {
   fmt::print("\n{:18}", fmt::format("{} {}", measured.at("set").as_string().c_str(),
                                     measured.at("size").to_number<size_t>()));
@@ -121,7 +121,8 @@ json::array MeasureAll(const Options& options) {
   for (const std::string& name : options.sets) {
     const bool hasOwnSize = name == "iso-codes";
     for (const size_t size : hasOwnSize ? std::vector<size_t>{0} : options.sizes) {
-      const std::string text = RunApart([&] { return serialize(MeasureSet(options, name, size)); });
+      const std::string text =
+          RunInChild([&] { return serialize(MeasureSet(options, name, size)); });
       const json::object measured = json::parse(text).as_object();
       if (measured.empty()) continue;
       Print(measured);

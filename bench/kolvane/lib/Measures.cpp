@@ -5,8 +5,8 @@
 #include <utility>
 
 #include "bench/kolvane/lib/Answers.h"
-#include "bench/kolvane/lib/Apart.h"
 #include "bench/kolvane/lib/Memory.h"
+#include "bench/kolvane/lib/Subprocess.h"
 
 namespace {
 
@@ -22,17 +22,17 @@ double Time(const Work& work) {
 constexpr size_t kFewEntries = 20'000;
 constexpr size_t kManyEntries = 200'000;
 
-// What takes little time needs more rounds to meet an undisturbed one, and can afford them.
+// Short measures get more rounds, so that at least one of them is undisturbed.
 int Repeats(const KeySet& set) {
   if (set.Size() <= kFewEntries) return 5;
   return set.Size() <= kManyEntries ? 2 : 1;
 }
 
-// Loads are compared with what they cost a process that has done it before.
+// The first load warms caches and the allocator; it is not measured.
 void WarmUp(Subject& subject) {
   subject.Load();
   subject.Unload();
-  subject.Renew();
+  subject.PrepareReload();
 }
 
 struct FirstUseRecord {
@@ -80,14 +80,14 @@ Measures::Measures(const KeySet& keySet, std::vector<std::unique_ptr<Subject>>& 
       hits(set.keys, set.defaultTexts, 0),
       misses(set.missingKeys, set.missingDefaults, set.Size()) {
   for (const auto& subject : subjects) {
-    if (subject->yields != Yields::kNothing) askable.push_back(subject.get());
+    if (subject->encoding != AnswerEncoding::kNothing) askable.push_back(subject.get());
   }
 }
 
-// Apart, for a subject may remember whatever it was ever asked.
+// In a child process, because some subjects cache every answer.
 void Measures::CheckAnswers() {
   for (Subject* const subject : askable) {
-    RunApart([&] {
+    RunInChild([&] {
       subject->Load();
       CheckEach(*subject, set, hits.Once());
       CheckEach(*subject, set, misses.Once());
@@ -112,14 +112,15 @@ void Measures::Ask(const std::string& measure, const Queries& queries, Results& 
   }
   for (int round = 0; round < rounds * Repeats(set); ++round) {
     for (size_t i = 0; i < askable.size(); ++i) {
-      if (set.Size() <= kManyEntries) askable[i]->AskAll(queries.Once());  // others had the caches
+      if (set.Size() <= kManyEntries)
+        askable[i]->AskAll(queries.Once());  // refills the caches after other subjects
       const double time = Time<std::nano>([&] { AskAllOf(*askable[i], many, lengths[i]); });
       results.Note(*askable[i], measure, time / static_cast<double>(many.size()));
     }
   }
   for (Subject* const subject : askable) {
     subject->Unload();
-    subject->Renew();
+    subject->PrepareReload();
   }
 }
 
@@ -130,12 +131,12 @@ void Measures::Load(Results& results) {
       TrimMemory();
       results.Note(*subject, "load", Time<std::milli>([&] { subject->Load(); }));
       results.Note(*subject, "unload", Time<std::milli>([&] { subject->Unload(); }));
-      subject->Renew();
+      subject->PrepareReload();
     }
   }
 }
 
-// Of many entries there are fewer rounds: they take longest of all, and agree.
+// Fewer rounds for many entries: they take longest and vary least.
 void Measures::FirstUse(Results& results) {
   const auto once = hits.Once();
   const double entries = static_cast<double>(set.Size());
@@ -144,7 +145,7 @@ void Measures::FirstUse(Results& results) {
     for (Subject* const subject : askable) {
       const size_t length = AnswersLength(*subject, set, once);
       const auto record =
-          FromText(RunApart([&] { return ToText(MeasureFirstUse(*subject, once, length)); }));
+          FromText(RunInChild([&] { return ToText(MeasureFirstUse(*subject, once, length)); }));
       results.Note(*subject, "first-use", record.time);
       results.Note(*subject, "memory-loaded", record.memoryLoaded / entries);
       results.Note(*subject, "memory-used", record.memoryUsed / entries);

@@ -1,5 +1,5 @@
-// The measures, of all subjects of one key set. Rounds of the subjects take turns, so that what
-// disturbs the machine disturbs them all.
+// Measures all subjects with one key set. Their rounds alternate, so that a disturbance of the
+// machine affects all of them.
 #pragma once
 
 #include <memory>
@@ -9,20 +9,20 @@
 #include "bench/kolvane/lib/Results.h"
 #include "bench/kolvane/lib/Subject.h"
 
-// `hit` and `miss` are in nanoseconds a query, with the answer copied.
-// `load` is in milliseconds, and has `unload` beside it.
-// `first-use` is the milliseconds of a load and every key once, in a process of its own. Beside it,
-// in bytes an entry, are the peaks after the load and in the end: `memory-loaded`, `memory-used`.
+// `hit` and `miss`: nanoseconds a query, including the copy of the answer.
+// `load` and `unload`: milliseconds.
+// `first-use`: milliseconds of a load and one query for each key, in a child process.
+// `memory-loaded` and `memory-used`: its peak memory after the load and at the end, bytes an entry.
 const std::vector<std::string>& MeasureNames();
 
-// The measures and what is beside them.
+// The measures.
 const std::vector<std::string>& ResultNames();
 
 class Measures {
  public:
   Measures(const KeySet& keySet, std::vector<std::unique_ptr<Subject>>& compared, int roundCount);
 
-  // Throws when a subject gives a wrong answer to any query.
+  // Throws if a subject answers a query wrongly.
   void CheckAnswers();
 
   void Run(const std::string& measure, Results& results);
@@ -34,7 +34,7 @@ class Measures {
 
   const KeySet& set;
   std::vector<std::unique_ptr<Subject>>& subjects;
-  std::vector<Subject*> askable;  // those of them that yield anything
+  std::vector<Subject*> askable;  // the subjects that give answers
   const int rounds;
   const Queries hits;
   const Queries misses;

@@ -1,12 +1,12 @@
-// How much memory the process takes.
+// Memory use of the process.
 #pragma once
 
 #include <cstddef>
 
-// Gives what was freed back to the system: what is allocated next is fresh.
+// Returns freed memory to the system, so that later allocations are fresh.
 void TrimMemory();
 
-// The peak since its construction, on top of what there was then. One at a time.
+// Measures the peak since its construction, relative to the use then. One object at a time.
 class PeakMeter {
  public:
   PeakMeter();

@@ -1,4 +1,4 @@
-// Many texts in one block, as a program has its literals and an image its entries.
+// Many texts in one block of memory, like a program's literals or an image's entries.
 #pragma once
 
 #include <cstddef>

@@ -1,4 +1,4 @@
-// A key set as the files that the peers load, made by the peers' own compilers.
+// The files that peers load, made from a key set by the peers' own compilers.
 #pragma once
 
 #include <filesystem>
@@ -8,18 +8,18 @@
 
 #include "bench/kolvane/lib/KeySet.h"
 
-// `FOLDER/de/LC_MESSAGES/bench.mo`, unless it is there, by msgfmt; for both that load such files.
+// Makes `FOLDER/de/LC_MESSAGES/bench.mo` with msgfmt, unless it exists. Two subjects load it.
 std::filesystem::path CatalogueFile(const KeySet& set, const std::filesystem::path& folder);
 
-// Fills a source file.
+// Writes a source file.
 void WriteSource(const std::filesystem::path& path, const std::function<void(std::ostream&)>& fill);
 
-// Gives the file one more name in its folder, and returns that without the extension: for peers
-// that load a file only once.
+// Links the file under a new name in its folder and returns that name without the extension: for
+// peers that load a file only once.
 std::string OneMoreName(const std::filesystem::path& file);
 
-// Runs a program and its arguments, parted by spaces; throws when it fails.
+// Runs a command line, split at spaces. Throws if it fails.
 void RunCompiler(const std::string& command);
 
-// With a backslash before each backslash and quote.
+// Returns the text with a backslash before each backslash and quote.
 std::string InQuotes(std::string_view text);

@@ -27,7 +27,7 @@ Queries::Queries(const PackedTexts<char>& keys, const PackedTexts<char>& default
   std::iota(order.begin(), order.end(), 0u);
   ShuffleAll(order, random);
 
-  // Blocks that never move, since queries point into them.
+  // The blocks never move, because queries point into them.
   texts.reserve(keys.Block().size() + defaultTexts.Block().size() + keyCount * 5);
   bareKeys.reserve(keys.Block().size() + keyCount);
   for (const uint32_t i : order) {

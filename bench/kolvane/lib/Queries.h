@@ -1,4 +1,4 @@
-// Questions to a dictionary, laid out in the order in which they are asked first.
+// Queries to a dictionary, laid out in memory in the order of the first pass.
 #pragma once
 
 #include <cstdint>
@@ -13,7 +13,7 @@ struct Query {
   const char* key;   // `/Key`, terminated
   uint32_t keyLength;
   uint32_t defaultLength;
-  uint32_t number;  // of the key; those that the set lacks are numbered after those it has
+  uint32_t number;  // of the key; missing keys are numbered after the others
 
   std::string_view Key() const { return {key, keyLength}; }
   uint32_t TextLength() const { return 3 + keyLength + 1 + defaultLength; }
@@ -27,8 +27,8 @@ class Queries {
   // Every key once, in random order.
   std::span<const Query> Once() const { return {queries.data(), keyCount}; }
 
-  // Every key equally often and kLeast queries at least, each time round in another random order:
-  // no processor learns so many by heart.
+  // At least kLeast queries, every key equally often, each pass in another random order: too many
+  // for a branch predictor to learn.
   std::span<const Query> Many() const { return queries; }
 
  private:

@@ -1,4 +1,4 @@
-// Reading an image's file into fresh memory: the yardstick for loads.
+// Reads an image's file into fresh memory: the lower bound for loads.
 #include <fcntl.h>
 #include <sys/mman.h>
 #include <unistd.h>
@@ -17,7 +17,9 @@ namespace {
 class ReadSubject final : public Subject {
  public:
   ReadSubject(const char* subjectName, const std::filesystem::path& imagePath)
-      : Subject(subjectName, Yields::kNothing), path(imagePath), size(file_size(imagePath)) {}
+      : Subject(subjectName, AnswerEncoding::kNothing),
+        path(imagePath),
+        size(file_size(imagePath)) {}
 
   void Load() override {
     memory = mmap(nullptr, size, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);

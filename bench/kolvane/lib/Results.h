@@ -1,4 +1,4 @@
-// What was measured of one key set.
+// The measurements of one key set.
 #pragma once
 
 #include <boost/json/object.hpp>
@@ -11,12 +11,12 @@
 
 class Results {
  public:
-  // One more round of a measure.
+  // Adds a round of a measure.
   void Note(const Subject& subject, const std::string& measure, double value) {
     rounds[{subject.name, measure}].push_back(value);
   }
 
-  // By subject and measure, the least and the median of the rounds.
+  // The minimum and the median of the rounds, by subject and measure.
   boost::json::object Records() const;
 
  private:

@@ -1,4 +1,4 @@
-// What the benchmark compares, behind one interface.
+// The interface of everything that the benchmark compares.
 #pragma once
 
 #include <algorithm>
@@ -11,41 +11,43 @@
 
 #include "bench/kolvane/lib/Queries.h"
 
-enum class Yields : uint8_t { kUTF16, kUTF8, kNothing };
+enum class AnswerEncoding : uint8_t { kUTF16, kUTF8, kNothing };
 
-// Made with a key set, which it has turned into whatever it loads.
+// Constructed with a key set, from which it has made the file or image that it loads.
 class Subject {
  public:
-  Subject(std::string subjectName, Yields kind) : name(std::move(subjectName)), yields(kind) {}
+  Subject(std::string subjectName, AnswerEncoding kind)
+      : name(std::move(subjectName)), encoding(kind) {}
   Subject(const Subject&) = delete;
   Subject& operator=(const Subject&) = delete;
   virtual ~Subject() = default;
 
-  // Load makes the keys ready to be asked for, Unload undoes it. Both are timed.
+  // Load makes the keys ready for queries; Unload undoes it. Both are timed.
   virtual void Load() = 0;
   virtual void Unload() = 0;
 
-  // What must happen before it can be loaded once more; not timed.
-  virtual void Renew() {}
+  // Prepares another load. Not timed.
+  virtual void PrepareReload() {}
 
-  // Asks the queries one after the other, copies each answer over the one before, and returns how
-  // many units they had together. A subject that yields nothing is never asked.
+  // Asks the queries in order, copies each answer over the previous one, and returns their total
+  // length in units. Not called for kNothing.
   virtual size_t AskAll(std::span<const Query>) { return 0; }
 
-  // Whether it answers the query with the text, of which it is given both forms.
+  // Whether the subject's answer to the query is the text, given as UTF-16 and UTF-8.
   virtual bool Answers(const Query&, std::u16string_view, std::string_view) { return true; }
 
   const std::string name;
-  const Yields yields;
+  const AnswerEncoding encoding;
 };
 
-// A subject whose class has `void Ask(const Query&, std::vector<Unit>& answer)`, which is compiled
+// The base of subjects with `void Ask(const Query&, std::vector<Unit>& answer)`, which is inlined
 // into the loop.
 template <class Derived, class Unit>
 class AskedSubject : public Subject {
  public:
   explicit AskedSubject(std::string subjectName)
-      : Subject(std::move(subjectName), sizeof(Unit) == 2 ? Yields::kUTF16 : Yields::kUTF8) {}
+      : Subject(std::move(subjectName),
+                sizeof(Unit) == 2 ? AnswerEncoding::kUTF16 : AnswerEncoding::kUTF8) {}
 
   size_t AskAll(std::span<const Query> queries) final {
     size_t total = 0;
@@ -69,7 +71,7 @@ class AskedSubject : public Subject {
   std::vector<Unit> latest;
 };
 
-// The answer of a host whose library has none: the default text that stands in the query.
+// Answers with the query's default text, as a host does if its library has no translation.
 template <class Unit>
 void AnswerDefault(const Query& query, std::vector<Unit>& answer) {
   const std::string_view text = query.DefaultText();

@@ -1,4 +1,4 @@
-// All that the benchmark can compare.
+// The list of subjects.
 #pragma once
 
 #include <memory>
@@ -8,7 +8,7 @@
 
 #include "bench/kolvane/lib/Subject.h"
 
-// Why a subject takes no part in a key set.
+// Thrown by a subject that cannot take part in a key set; says why.
 class LeftOut : public std::runtime_error {
  public:
   using std::runtime_error::runtime_error;
@@ -16,13 +16,13 @@ class LeftOut : public std::runtime_error {
 
 struct SubjectKind {
   std::string name;
-  // Puts what the subject loads into the folder. Null for a set that the subject is not meant for;
-  // throws LeftOut.
+  // Creates the subject and the files that it loads, in the folder. Null if the set is not meant
+  // for the subject. Throws: LeftOut.
   std::unique_ptr<Subject> (*make)(const KeySet& set, const std::filesystem::path& folder);
-  std::string library;  // its name and version, of a subject that is not ours
+  std::string library;  // name and version of a peer's library
 };
 
-// Those whose libraries were found.
+// The subjects whose libraries were found.
 const std::vector<SubjectKind>& SubjectKinds();
 
 std::unique_ptr<Subject> MakeKolvaneUTF16(const KeySet&, const std::filesystem::path&);

@@ -1,4 +1,4 @@
-// The library as hosts reach it: through an object kernel and the plug-in.
+// Kolvane through the kernel and the plug-in, as hosts use it: by message and by coercion.
 #include <stdexcept>
 
 #include "bench/kolvane/lib/Images.h"
@@ -60,7 +60,7 @@ class MessageSubject final : public KernelSubject<MessageSubject> {
   }
 };
 
-// Keys are data that a host keeps.
+// The host keeps its keys as kernel data.
 class CoercionSubject final : public KernelSubject<CoercionSubject> {
  public:
   CoercionSubject(const char* subjectName, std::string imageBytes, const KeySet& set)
@@ -91,7 +91,7 @@ class CoercionSubject final : public KernelSubject<CoercionSubject> {
   std::vector<Varnel::DataRef> keys;
 };
 
-// What the road adds to a lookup does not depend on the dictionary.
+// Only one size: the overhead does not depend on the dictionary.
 bool IsMeasured(const KeySet& set) {
   return set.name == "mixed-paths" && set.Size() <= 1000;
 }

@@ -1,4 +1,4 @@
-#include "bench/kolvane/lib/Apart.h"
+#include "bench/kolvane/lib/Subprocess.h"
 
 #include <sys/wait.h>
 #include <unistd.h>
@@ -28,7 +28,7 @@ std::string ReadToEnd(int pipeEnd) {
   }
 }
 
-// Ends the process without the destructors and exit handlers that are its parent's.
+// Ends the child without running the parent's destructors and exit handlers.
 [[noreturn]] void RunAsChild(const std::function<std::string()>& work, int pipeEnd) {
   int status = 1;
   try {
@@ -43,7 +43,7 @@ std::string ReadToEnd(int pipeEnd) {
 
 }  // namespace
 
-std::string RunApart(const std::function<std::string()>& work) {
+std::string RunInChild(const std::function<std::string()>& work) {
   int ends[2];
   if (pipe(ends) != 0) throw std::system_error(errno, std::generic_category(), "pipe");
   std::fflush(nullptr);
