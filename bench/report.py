@@ -21,53 +21,75 @@ SET_TITLES = {
 }
 
 INTRODUCTION = """\
-# What lookups and loads cost
+# Performance
 
 ![Time of a lookup by number of keys](performance.svg)
 
-This page is written by `scripts/bench`, which installs what is missing, builds, measures, and takes some
-ten minutes. `scripts/bench --sizes 1000,100000 --subjects kolvane-binary,limit`, or any other
-options of `dictionary-bench`, measures that much only and writes nothing.
+This page shows the time and memory that lookups and loads take, compared with other libraries.
+
+`scripts/bench` writes this page. It installs missing packages, builds, and measures for about ten minutes.
+With options of `dictionary-bench`, such as `scripts/bench --sizes 1000,100000 --subjects kolvane-binary,limit`,
+it measures only what the options select, and writes nothing.
 """
 
 ROWS = """\
-## What is compared
+## Subjects
 
-| Row | What it is | Text it gives |
+| Row | Subject | Text returned |
 |---|---|---|
-| kolvane, binary image | `KolvaneDictionary`, loaded from a binary image of version 1.5 with UTF-16 values | UTF-16 |
+| kolvane, binary image | `KolvaneDictionary`, loaded from a binary dictionary of version 1.5 with UTF-16 values | UTF-16 |
 | kolvane, UTF-16 text | the same, loaded from a text dictionary in UTF-16 | UTF-16 |
 | kolvane, code-page text | the same, loaded from a text dictionary in windows-1252 | UTF-16 |
-| kolvane, message | the UTF-16 text in a translator object, asked by messages through the kernel | UTF-16 |
-| kolvane, coercion | the same, asked by letting the kernel coerce keys that are kept as data | UTF-16 |
-| limit | `boost::unordered_flat_map` of views into one block; its load copies two arrays and fills the reserved map: \
-nothing is parsed, decoded or checked | UTF-16 |
-| limit, XXH3 | the same with XXH3 for the map's own hash of strings | UTF-16 |
-| ICU | a resource bundle by `genrb`, `ures_openDirect` and `ures_getStringByKey` | UTF-16 |
-| Qt | `QTranslator` with a catalogue by `lrelease` | UTF-16 |
-| gettext | the C library's `dgettext` with a catalogue by `msgfmt` | UTF-8 |
-| Boost.Locale | its message catalogue, of the same file as gettext's | UTF-8 |
-| read | the image's file, read with `read` into fresh memory, from the system's cache | none |
+| kolvane, message | a translator object that has loaded the UTF-16 text, queried by messages through the kernel | UTF-16 |
+| kolvane, coercion | the same object, queried by coercion: the kernel converts keys that are stored as data | UTF-16 |
+| limit | a yardstick: `boost::unordered_flat_map` of views into one block. Its load copies two arrays and fills the reserved map; \
+it parses, decodes and checks nothing | UTF-16 |
+| limit, XXH3 | the same, with XXH3 instead of the map's own string hash | UTF-16 |
+| ICU | a resource bundle made by `genrb`, read by `ures_openDirect` and `ures_getStringByKey` | UTF-16 |
+| Qt | `QTranslator` with a catalogue made by `lrelease` | UTF-16 |
+| gettext | the C library's `dgettext` with a catalogue made by `msgfmt` | UTF-8 |
+| Boost.Locale | its message catalogue, loaded from the same file as gettext's | UTF-8 |
+| read | no lookup: reads the dictionary file with `read`, from the system's cache into fresh memory | none |
 
-Everyone has the same keys and translations, gets a key and leaves the answer in the caller's reused
-vector; where there is none, the default text that came with the key. Kolvane gets a terminated
-`$$$/Key=Default text`, the others the bare key. Before anything is timed each one answers every key of
-the set, and up to 100,000 that it lacks, and each answer is checked; while lookups are timed the total
-length of the answers is.
+All subjects have the same keys and translations. Each is given a key and copies the answer to the caller's
+reused vector. If there is no translation, the answer is the default text that came with the key. Kolvane is
+given a terminated `$$$/Key=Default text`, the other subjects the bare key.
 
-* **Mixed paths** are paths of two to five words and a number, 25 to 60 bytes; **one pattern** is
-  `/App/Section/Item0000123/Dialog/Headline`, whose digits lie between the bytes by which a dictionary is
-  divided into buckets. Their translations are words of French, of 28 units on average. **iso-codes** are
-  the German names of languages, countries and currencies of that package.
-* A **hit** is a lookup of one of the keys in random order, in nanoseconds; a **miss** one of a key of the
-  same kind that the dictionary lacks.
-* **Load** is in milliseconds. ICU, Qt and gettext map their files and read what they are asked for, so
-  that **load and ask**, a load and then every key once, says more.
-* **Peak memory** is in bytes an entry, on top of what the process took before. The image that Kolvane
-  loads is the host's and is not counted; the files that others map are.
-* Subjects take turns round by round, and the fastest round of each counts: {rounds} rounds at least.
-* 100,000 keys and their translations are about what the last cache holds. Where other machines share it,
-  figures there differ by up to a factor of two from one set or run to the next.
+Before timing, each subject looks up every key of the set and up to 100,000 missing keys, and each answer is
+checked. During timing, the total length of the answers is checked.
+
+Key sets:
+
+* **Mixed paths**: paths of two to five words and a number, 25 to 60 bytes long.
+* **One pattern**: paths such as `/App/Section/Item0000123/Dialog/Headline`. The bucket hash samples none of
+  the digits, so that all keys share one bucket.
+* **iso-codes**: the German names of languages, countries and currencies from the package of that name.
+
+In the first two sets, translations are French words, 28 units long on average.
+
+Measures:
+
+* **Hit**: the time to look up a key of the set, in random order, in nanoseconds. **Miss**: the same for a key
+  of the same kind that the dictionary lacks.
+* **Load**: the time to load a dictionary, in milliseconds. ICU, Qt and gettext map their files and read only
+  the parts that lookups need. Therefore **load and ask**, a load followed by one lookup of every key, is a
+  fairer comparison.
+* **Peak memory**: bytes per entry, beyond what the process used before. The dictionary's bytes that Kolvane
+  loads belong to the host and are not counted. Files that other subjects map are counted.
+
+Subjects take turns, round by round. The fastest of at least {rounds} rounds counts.
+
+About 100,000 keys with their translations just fit into the last-level cache. If other machines share this cache,
+figures at that size vary by up to a factor of two between sets and between runs.
+"""
+
+TARGETS = """\
+## Targets
+
+Kolvane is measured with three images, that is, dictionary files: binary, UTF-16 text and code-page text. A target
+that names no image is judged by the slowest of them. Peers are the libraries that return UTF-16. The number before
+a colon is the number of keys.
+
 """
 
 
@@ -116,20 +138,20 @@ class SetTables:
             ours = self.results.slowest(self.set_name, size, measure)
             peer, least = self.results.fastest_peer(self.set_name, size, measure)
             cells.append(f"{number(least / ours)} ({SUBJECTS[peer].title})" if ours and peer else "–")
-        return ["*the fastest UTF-16 peer, times the slowest kolvane row*"] + cells
+        return ["*fastest UTF-16 peer, as a multiple of the slowest kolvane image*"] + cells
 
     def lookups(self, measure):
         subjects = [name for name in SUBJECTS if not name.startswith("read-")]
         lines = list(self.lines(subjects, measure, lambda _: "limit")) + [self.peer_line(measure)]
-        return table(["ns, and in brackets times the limit"] + self.header, lines)
+        return table(["ns (multiple of the limit)"] + self.header, lines)
 
     def loads(self):
         lines = self.lines(SUBJECTS, "load", lambda subject: OURS.get(subject))
-        return table(["ms, and in brackets times the read of the same image"] + self.header, lines)
+        return table(["ms (multiple of the read of the same file)"] + self.header, lines)
 
     def first_use(self):
         lines = list(self.lines(SUBJECTS, "first-use", lambda _: "limit")) + [self.peer_line("first-use")]
-        return table(["ms, and in brackets times the limit"] + self.header, lines)
+        return table(["ms (multiple of the limit)"] + self.header, lines)
 
     def destruction(self):
         return table(["ms"] + self.header, self.lines(OURS, "unload"))
@@ -145,8 +167,8 @@ class SetTables:
                 lines.append([SUBJECTS[subject].title] +
                              ["–" if None in pair else "{:.0f} / {:.0f}".format(*pair) for pair in pairs])
         size_line = ["*keys and values*"] + [f"{self.results.payload(self.set_name, size):.0f}" for size in sizes]
-        return table(["bytes an entry, loaded / all asked"] + [f"{size:,} keys" for size in sizes],
-                     [size_line] + lines) if sizes else ""
+        unit = "bytes per entry, after the load / after a lookup of every key"
+        return table([unit] + [f"{size:,} keys" for size in sizes], [size_line] + lines) if sizes else ""
 
 
 def set_chapter(results, set_name):
@@ -167,8 +189,7 @@ def targets_chapter(results):
     lines = [[target.text, target.measured, target.verdict] for target in targets.judge(results)]
     head = "| Target | Measured | Met |\n|---|---|---|\n"
     body = "".join("| " + " | ".join(line) + " |\n" for line in lines)
-    return ("## Against its targets\n\nOf Kolvane's three images the worst counts, of the peers those that give "
-            "UTF-16. Sizes stand before the colons.\n\n" + head + body)
+    return TARGETS + head + body
 
 
 def page(results):
