@@ -1,5 +1,5 @@
-# What others wrote. Where the target is not the machine that builds, the same packages give their
-# headers, and GoogleTest its sources.
+# External libraries. A cross build uses the headers of the build machine's packages, and compiles GoogleTest from
+# its sources.
 if(CMAKE_CROSSCOMPILING)
   set(headers ${PROJECT_BINARY_DIR}/headers)
   file(MAKE_DIRECTORY ${headers})

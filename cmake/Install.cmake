@@ -1,7 +1,7 @@
-# What is installed, where, and under which names others link it: the same in this tree as with
-# find_package(Kolvane). Files find each other by relative paths, so that a prefix can be moved.
+# What is installed and where. Targets have the same names in this tree as after find_package(Kolvane). Installed
+# files refer to each other by relative paths, so that the prefix can be moved.
 
-# Debian's folder for libraries, whatever the prefix: the package is like any other installation.
+# Debian's library folder for every prefix, so that the package has the same layout as any other installation.
 if(EXISTS /etc/debian_version AND CMAKE_LIBRARY_ARCHITECTURE)
   set(CMAKE_INSTALL_LIBDIR lib/${CMAKE_LIBRARY_ARCHITECTURE} CACHE PATH "Libraries")
 endif()
@@ -10,14 +10,14 @@ include(GNUInstallDirs)
 include(CMakePackageConfigHelpers)
 
 set(headers ${CMAKE_INSTALL_INCLUDEDIR}/kolvane)
-set(package lib/cmake/Kolvane)  # where projects without a language look, too
+set(package lib/cmake/Kolvane)  # found by projects without a language, too
 if(WIN32)
   set(loaded ${CMAKE_INSTALL_BINDIR})
 else()
   set(loaded ${CMAKE_INSTALL_LIBDIR})
 endif()
 
-# Others know `target` as Kolvane::`name`.
+# Installs `target` under the name Kolvane::`name`.
 function(install_target target name)
   if(name STREQUAL kolvane)
     add_executable(Kolvane::${name} ALIAS ${target})
@@ -95,7 +95,7 @@ foreach(name kolvane kolvane-dictionary varnel-kernel)
   install(FILES ${PROJECT_BINARY_DIR}/${name}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
 endforeach()
 
-# What people read.
+# Documentation, examples and completions.
 install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR})
 install(FILES docs/dictionaries.md docs/host-guide.md DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs)
 if(NOT WIN32)
@@ -105,7 +105,7 @@ if(NOT WIN32)
     COMMAND ${GZIP} -9nc ${PROJECT_SOURCE_DIR}/docs/kolvane.1 > ${manual}
     DEPENDS docs/kolvane.1 VERBATIM)
   add_custom_target(kolvane_manual DEPENDS ${manual})
-  add_dependencies(kolvane kolvane_manual)  # building the command builds all that is installed
+  add_dependencies(kolvane kolvane_manual)  # so that the target `kolvane` builds everything that is installed
   install(FILES ${manual} DESTINATION ${CMAKE_INSTALL_MANDIR}/man1)
   install(FILES tools/kolvane/completions/kolvane.bash RENAME kolvane
     DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions)

@@ -1,5 +1,5 @@
 #[[
-Compiles dictionaries as part of a build.
+Compiles dictionaries during a build.
 
   kolvane_add_dictionary(<target> SOURCES <file>...
     [OUTPUT <file>]
@@ -7,29 +7,30 @@ Compiles dictionaries as part of a build.
     [VALUES utf-16|utf-8|code-page]
     [ENCODING auto|image|utf-8])
 
-Adds a target, built by default, that makes one binary dictionary of the sources, with `kolvane
-compile` and its options of these names. Sources are looked for from the current source folder. OUTPUT
-is meant from the current binary folder and must lie in the build folder; `<target>.kdict` if not
-given. Its full path is the target's property KOLVANE_DICTIONARY, for whoever installs or copies it:
+Adds a target, built by default, that compiles the sources into one binary dictionary. FORMAT, VALUES
+and ENCODING are passed to `kolvane compile` as the options of these names. Relative SOURCES are in the
+current source folder. A relative OUTPUT (default: `<target>.kdict`) is in the current binary folder.
+OUTPUT must be inside the build folder. The target's property KOLVANE_DICTIONARY is the full path of
+OUTPUT, for example to install it:
 
   install(FILES $<TARGET_PROPERTY:<target>,KOLVANE_DICTIONARY> DESTINATION share/example)
 
-The build fails, and OUTPUT stays as it is, where a source is damaged, holds malformed UTF-8, lacks the
-byte-order mark of UTF-16 or is no dictionary. ENCODING image takes text for UTF-16 with its mark or the
-system's code page, whatever it looks like.
+The build fails and leaves OUTPUT unchanged if a source is damaged, contains malformed UTF-8, is UTF-16
+without a byte-order mark, or is no dictionary. ENCODING image never detects UTF-8: it decodes text as
+UTF-16 if there is a byte-order mark of UTF-16, otherwise in the system's code page.
 
-The command is the one that comes with this file, or the one that the variable KOLVANE_COMMAND names.
-In a cross build, CMAKE_CROSSCOMPILING_EMULATOR runs the former; without an emulator, one of the
-machine that builds is looked for on the PATH.
+The variable KOLVANE_COMMAND selects the command. By default, it is the one installed with this file. In
+a cross build, CMAKE_CROSSCOMPILING_EMULATOR runs that one. Without an emulator, a command for the build
+machine is searched for on the PATH.
 ]]
 
-# A command line, and the file or target that it depends on.
+# Returns the command line of the command, and the file or target that it depends on.
 function(_kolvane_find_command outCommand outDepends)
   if(CMAKE_CROSSCOMPILING AND NOT CMAKE_CROSSCOMPILING_EMULATOR)
     find_program(KOLVANE_COMMAND kolvane PATHS ENV PATH NO_DEFAULT_PATH NO_CMAKE_FIND_ROOT_PATH
-      DOC "The kolvane command of the machine that builds")
+      DOC "The kolvane command of the build machine")
     if(NOT KOLVANE_COMMAND)
-      message(FATAL_ERROR "There is no kolvane command that the machine that builds can run. "
+      message(FATAL_ERROR "No kolvane command found that the build machine can run. "
         "Set KOLVANE_COMMAND to one.")
     endif()
   endif()
@@ -45,7 +46,7 @@ function(_kolvane_find_command outCommand outDepends)
   endif()
 endfunction()
 
-# Sources stay as they are, and nothing is written among them.
+# Ensures that the build never overwrites a source or writes into the source tree.
 function(_kolvane_check_output output sources)
   cmake_path(IS_PREFIX CMAKE_BINARY_DIR ${output} isInBuild)
   if(NOT isInBuild OR output IN_LIST sources)
@@ -81,7 +82,7 @@ function(kolvane_add_dictionary target)
     endif()
   endforeach()
 
-  # The command leaves an output that is right untouched: the stamp tells that it was asked.
+  # The command leaves an up-to-date output untouched, so a stamp file records that the command has run.
   set(stamp ${CMAKE_CURRENT_BINARY_DIR}/CMakeFiles/${target}.stamp)
   cmake_path(GET output PARENT_PATH folder)
   _kolvane_find_command(command commandDepends)

@@ -1,5 +1,5 @@
-# Moves the symbols of a Windows program or library into a file beside it, `<file>.debug`, which debuggers find
-# by the link that is left. They take as much room as the code. On other systems packages strip them.
+# Moves the symbols of a Windows program or library, which are as large as its code, into `<file>.debug` beside it.
+# Debuggers find that file by a link that stays in the binary. On other systems, packaging strips the symbols.
 function(separate_symbols target)
   if(NOT MINGW)
     return()
