@@ -97,7 +97,7 @@ endforeach()
 
 # Documentation, examples and completions.
 install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR})
-install(FILES docs/dictionaries.md docs/host-guide.md DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs)
+install(FILES docs/dictionaries.md docs/host-guide.md docs/security.md DESTINATION ${CMAKE_INSTALL_DOCDIR}/docs)
 if(NOT WIN32)
   find_program(GZIP gzip REQUIRED)
   set(manual ${PROJECT_BINARY_DIR}/kolvane.1.gz)

@@ -8,13 +8,12 @@ set(CPACK_PACKAGE_NAME kolvane)
 set(CPACK_PACKAGE_CONTACT "Kolvane developers <kolvane@example.org>")
 set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "localised strings for a host application")
 set(CPACK_PACKAGE_DESCRIPTION
-"A program carries keys with their own default text, and Kolvane answers with
-the translation that a dictionary has for the key, or else with the default
-text.
+"A program carries its texts as keys with default texts. Kolvane returns the
+dictionary's translation of a key, or the default text if there is none.
 .
-This package holds the kolvane command, which translates with dictionaries and
-compiles them, the plug-in and the kernel that hosts load, and what it takes to
-build hosts: headers, static libraries, and files for CMake and pkg-config.")
+This package contains the kolvane command, which checks, compiles and queries
+dictionaries; the plug-in and the kernel that hosts load; and the headers,
+static libraries, CMake files and pkg-config files for building hosts.")
 set(CPACK_STRIP_FILES ON)
 set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
 set(CPACK_INSTALL_DEFAULT_DIRECTORY_PERMISSIONS
