@@ -33,7 +33,7 @@ it measures only what the options select, and writes nothing.
 """
 
 ROWS = """\
-## Subjects
+## Subjects and measures
 
 | Row | Subject | Text returned |
 |---|---|---|
@@ -88,7 +88,7 @@ TARGETS = """\
 
 Kolvane is measured with three images, that is, dictionary files: binary, UTF-16 text and code-page text. A target
 that names no image is judged by the slowest of them. Peers are the libraries that return UTF-16. The number before
-a colon is the number of keys.
+a colon is the number of keys. [Subjects and measures](#subjects-and-measures) explains the other terms.
 
 """
 
