@@ -1,6 +1,5 @@
-# Headers are included by their path from the root. A target's users see its own headers and those of
-# the targets it links, each through a link below the target's folder of the build tree, so that an
-# include of anything else does not compile.
+# Headers are included by their path from the root. A target sees its own headers and those of the targets it links,
+# through links in a folder of the build tree. An include of any other header does not compile.
 
 # add_headers(target PUBLIC|PRIVATE|INTERFACE header...)
 function(add_headers target scope)
@@ -15,9 +14,8 @@ function(add_headers target scope)
   target_include_directories(${target} ${scope} $<BUILD_INTERFACE:${root}>)
 endfunction()
 
-# add_public_headers(path...): copies headers, with their paths from the root, into
-# PUBLIC_HEADERS_FOLDER. There, as in an installation, all are in one folder and include each other
-# by name.
+# add_public_headers(path...): copies headers, given by their paths from the root, into PUBLIC_HEADERS_FOLDER. There,
+# as in an installation, all headers are in one folder, and include each other by file name.
 set(PUBLIC_HEADERS_FOLDER ${PROJECT_BINARY_DIR}/public)
 function(add_public_headers)
   foreach(path ${ARGN})

@@ -42,7 +42,7 @@ install_target(varnel_framework VarnelFramework)
 install_target(kolvane_lib Dictionary)
 install_target(kolvane_platform Platform)
 
-# The headers that programs may include, each with those that it includes itself.
+# The headers that programs may include, and the headers that these include.
 add_public_headers(
   # Kolvane::VarnelKernel
   wrapper-framework/source/VarnelKernel.h
