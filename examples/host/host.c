@@ -1,4 +1,4 @@
-/* The minimal host in plain C, on the kernel's two headers alone.
+/* The minimal host in plain C. It needs only the kernel's two headers.
  *
  *   host PLUG-IN DICTIONARY KEY
  */
@@ -11,7 +11,7 @@
 
 #define TRANSLATOR "orvane.localizable-strings."
 
-/* Ends the host where a call fails. */
+/* Exits if a call fails. */
 static void Check(VRKResult result, const char* what) {
   if (result == 0) return;
   fprintf(stderr, "host: %s (result %u)\n", what, result);
@@ -24,7 +24,7 @@ static VRKToken Token(const char* text) {
   return token;
 }
 
-/* A file of less than a mebibyte, in units of two bytes: an odd last byte is followed by a 0. */
+/* Reads a file of less than 1 MiB into 16-bit units. A 0 follows an odd last byte. */
 static char* ReadUnits(const char* name, uint32_t* outByteCount) {
   static char bytes[1 << 20];
   FILE* const file = fopen(name, "rb");
@@ -35,7 +35,7 @@ static char* ReadUnits(const char* name, uint32_t* outByteCount) {
   return bytes;
 }
 
-/* Sends a message with one parameter, or none. Returns the parameters, which hold the answer. */
+/* Sends a message with at most one parameter. Returns the parameters, which hold the result. */
 static VRKDictionary Send(VRKObject object, const char* message, const char* parameter,
                           VRKData data) {
   VRKDictionary parameters;
@@ -71,12 +71,12 @@ static void Translate(VRKObject translator, const char* dictionary, const char* 
   VRKDictionary parameters;
   VRKData data, result;
 
-  /* The dictionary goes over as it is, in units. */
+  /* The dictionary is sent byte for byte, as units. */
   data = NewData("type:orvane.vrk.utf16", image, byteCount);
   VRKDictionaryRelease(Send(translator, "message:" TRANSLATOR "set-translations",
                             "parameter:" TRANSLATOR "translations", data));
 
-  /* A message to the object. The translation ends in a 0 unit. */
+  /* By message. The translation ends in a 0 unit. */
   data = NewData("type:orvane.vrk.utf8", key, keyLength);
   parameters = Send(translator, "message:" TRANSLATOR "translate-string",
                     "parameter:" TRANSLATOR "translation-key", data);
@@ -85,7 +85,7 @@ static void Translate(VRKObject translator, const char* dictionary, const char* 
   Print("message", result);
   VRKDictionaryRelease(parameters);
 
-  /* The coercion of a key, wherever data is read as text. The default translator translates it. */
+  /* By coercion: reading key data as text translates it with the default translator. */
   VRKDictionaryRelease(Send(translator, "message:" TRANSLATOR "make-default", NULL, 0));
   data = NewData("type:" TRANSLATOR "locale-independent-utf8", key, keyLength);
   Print("coercion", data);

@@ -1,5 +1,5 @@
 // A minimal host: runs the embedded kernel with the plug-in, loads a dictionary, and translates a
-// key in the two ways there are. Ends with status 0 when all went well and nothing was left alive.
+// key by message and by coercion. Exits with 0 if everything succeeded and nothing leaked.
 //
 //   host PLUG-IN DICTIONARY KEY
 
@@ -34,21 +34,21 @@ uint32_t Count(size_t count) {
 }
 
 void Print(const char* way, const std::string& translation) {
-  std::cout << way << ": " << translation.c_str() << '\n';  // without the 0 that ends it
+  std::cout << way << ": " << translation.c_str() << '\n';  // without the terminating 0
 }
 
 void Translate(const std::string& dictionary, const std::string& key) {
-  // A translator object, which dies with the client. The dictionary goes over as it is.
+  // A translator object, owned by the client. The dictionary is sent byte for byte.
   const auto translator = Varnel::CreateStringTranslator();
   const auto image = Varnel::PackTranslationImage(dictionary.data(), Count(dictionary.size()));
   translator->SetTranslations(image.units.get(), image.unitCount);
 
-  // A message to the object. The translation ends in a 0 unit.
+  // By message. The translation ends in a 0 unit.
   std::vector<uint16_t> units;
   translator->TranslateString(key.data(), Count(key.size()), units);
   Print("message", Varnel::GetUTF8(Varnel::MakeUTF16LEData(units.data(), Count(units.size()))));
 
-  // The coercion of a key, wherever data is read as text. The default translator translates it.
+  // By coercion: reading key data as text translates it with the default translator.
   translator->MakeDefault();
   const Varnel::DataRef data =
       Varnel::MakeData(Varnel::kTypeLocaleIndependentUTF8, key.data(), Count(key.size()));
