@@ -52,9 +52,9 @@ VRK_API VRKResult VRK_CALL VRKHostGetLiveCounts(VRKHostLiveCounts* outLive);
  * library that lacks one is unloaded again, unless it has installed callbacks or its code is
  * running.
  *
- * Requires: no callback of the kernel makes this call while another thread loads or unloads a
- * library that calls the kernel. The callback holds the kernel's lock, so each would wait for the
- * other. */
+ * Do not call this from a callback unless no other thread can be loading or unloading a library
+ * meanwhile. A callback runs under the kernel's lock, and loading takes the system's loader lock; a
+ * library that calls the kernel as it is loaded takes them in the opposite order. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefix,
                                              VRKPlugIn* outPlugIn);
 
@@ -62,9 +62,10 @@ VRK_API VRKResult VRK_CALL VRKHostPlugInLoad(const char* path, const char* prefi
  * empty text; cut after 4,095 bytes. Valid until the thread's next VRKHostPlugInLoad. */
 VRK_API const char* VRK_CALL VRKHostLoadError(void);
 
-/* Call the entry points and return their results. The kernel retains objects whose creation
- * succeeds while a plug-in initialises, and releases them when VRKHostPlugInTerminate returns.
- * kVRKInUse: code of the plug-in is running; nothing happened. */
+/* Call the entry points and return their results. While Initialize runs, the kernel retains each
+ * object that is created successfully; it releases these objects after VRKHostPlugInTerminate or
+ * before VRKHostPlugInUnload, also if Initialize failed. kVRKInUse: code of the plug-in is running;
+ * nothing happened. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInInitialize(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInTerminate(VRKPlugIn plugIn);
 VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outVersion);
@@ -72,10 +73,12 @@ VRK_API VRKResult VRK_CALL VRKHostPlugInVersion(VRKPlugIn plugIn, uint32_t* outV
 /* Unloads the library, whether it was terminated or not. Objects that the kernel retains for it are
  * released first. kVRKInUse: one of its callbacks is still installed, including the trace hook and
  * the reporter, or its code is running; the library stays. Code in other libraries that it loaded
- * is not considered. Requires: as VRKHostPlugInLoad. */
+ * is not considered. For calls from a
+ * callback, see VRKHostPlugInLoad. */
 VRK_API VRKResult VRK_CALL VRKHostPlugInUnload(VRKPlugIn plugIn);
 
-/* Lists, and data that holds handles. Outs are owned by the caller. */
+/* Lists, and data that holds a handle (as VRKDataCreate with the handle as payload). Outs are owned
+ * by the caller. */
 
 VRK_API VRKResult VRK_CALL VRKHostListCreate(VRKList* outList);
 
@@ -119,10 +122,11 @@ typedef struct VRKHostTraceCall {
 } VRKHostTraceCall;
 
 /* Called before and after each operation of VarnelKernel.h except VRKTokenGetString, which is not
- * traced. A result other than 0 before the operation runs becomes the operation's result, and the
- * operation does not run. The result after it is ignored. VRKRuntimeError has no result code: its
- * result in the trace is 0, and it returns 0 if it did not run. Calls that the hook makes itself
- * are not traced. No exception may leave the hook. */
+ * traced: on the calling thread, under the kernel's lock. A result other than 0 before the
+ * operation runs becomes the operation's result, and the operation does not run. The result after
+ * it is ignored. VRKRuntimeError has no result code: its result in the trace is 0, and it returns 0
+ * if it did not run. `call` and its pointers are valid during the call only. Calls that the hook
+ * makes itself are not traced. No exception may leave the hook. */
 typedef VRKResult(VRK_CALL* VRKHostTraceHook)(const VRKHostTraceCall* call, void* context);
 
 /* Replaces the trace hook. Null removes it. */
@@ -130,7 +134,9 @@ VRK_API VRKResult VRK_CALL VRKHostSetTraceHook(VRKHostTraceHook hook, void* cont
 
 /* Error reports */
 
-/* Called by VRKRuntimeError, which returns its result. */
+/* Called by VRKRuntimeError, which returns its result: on the calling thread, under the kernel's
+ * lock. `domain` names the component that reports. Texts are valid during the call only. No
+ * exception may leave the reporter. */
 typedef uint32_t(VRK_CALL* VRKHostErrorReporter)(uint32_t severity, const char* domain,
                                                  const char* expression, const char* sourceFile,
                                                  uint32_t line, const char* function,

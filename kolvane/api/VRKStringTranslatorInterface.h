@@ -19,10 +19,13 @@ class StringTranslatorInterface {
   // a key replaces an earlier one. A damaged image adds the entries before the damage and is no
   // failure. The buffer is borrowed for the call.
   //
-  // Bytes: the plug-in's translator takes the image itself; a client takes UTF-8 text. With a count
-  // of 0 and a pointer that is not null, the plug-in's translator reads up to the first 0 byte.
-  // Units: the bytes of the image, two in each unit, in memory's byte order; PackTranslationImage
-  // (VRKTranslationImage.h) makes them of any image.
+  // The units overload behaves the same in every implementation: it takes the bytes of any image,
+  // two in each unit, in memory's byte order. PackTranslationImage (VRKTranslationImage.h) makes
+  // them.
+  //
+  // The bytes overload depends on the implementation. A client sends the bytes as UTF-8 text. The
+  // plug-in's translator takes them as the image; with a count of 0 and a pointer that is not null
+  // it reads up to the first 0 byte. A null pointer requires a count of 0.
   virtual void SetTranslations(const char* bytes, uint32_t byteCount) = 0;
   virtual void SetTranslations(const uint16_t* units, uint32_t unitCount) = 0;
 
@@ -35,8 +38,9 @@ class StringTranslatorInterface {
   virtual ~StringTranslatorInterface() = default;
 };
 
-// Appends a terminating NUL, unless the key is empty or has one: the form that TranslateString
-// requires of an implementation that reads up to the NUL.
+// Appends a NUL to a key that does not end in one; an empty key stays empty. The plug-in's
+// translator ignores `keyLength` and reads up to the NUL, so the code that calls it passes its key
+// through this.
 inline std::string WithTerminator(std::string key) {
   if (!key.empty() && key.back() != '\0') key.push_back('\0');
   return key;

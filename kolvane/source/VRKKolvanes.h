@@ -26,8 +26,9 @@ extern "C" {
  * plug-in is terminated, because the default translator dies with its object.
  *
  * If registering the classes fails, neither stays registered. If installing the coercion fails, the
- * classes stay until VRKKolvanesTerminate. A second call without VRKKolvanesTerminate replaces
- * everything; if registering the classes fails then, the first call's coercion stays. */
+ * classes stay until VRKKolvanesTerminate. A second call without VRKKolvanesTerminate registers the
+ * classes again, creates another default translator and replaces the coercion; if registering fails
+ * then, no class stays registered and the old coercion stays installed. */
 VRK_KOLVANES_API VRKResult VRK_CALL VRKKolvanesInitialize(uint32_t reserved);
 
 /* Unregisters the classes and removes the coercion. Translators stay, including the default one.

@@ -32,7 +32,8 @@ class Exception : public std::exception, public ResultCodeException {
   uint32_t resultCode;
 };
 
-// Violated contracts of an input, of a result that must exist, and of internal state.
+// Violated contracts of an input (code 13), of a result that must exist (14), and of internal state
+// (15).
 
 class InputContractViolation : public Exception {
  public:

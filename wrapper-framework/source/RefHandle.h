@@ -38,8 +38,8 @@ class RefHandle {
   Handle Get() const noexcept { return handle; }
   explicit operator bool() const noexcept { return handle != Handle{}; }
 
-  // Takes ownership of the caller's reference and releases the old one. If that release fails, the
-  // caller's reference is released instead.
+  // Takes ownership of the caller's reference, also if it throws, and releases the old one. If that
+  // release fails, the holder keeps the old reference and releases the caller's.
   void Adopt(Handle owned) {
     const Handle old = std::exchange(handle, owned);
     const VRKResult result = Traits::Release(old);

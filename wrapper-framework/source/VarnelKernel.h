@@ -68,9 +68,11 @@ typedef uint32_t VRKList;
 typedef uint32_t VRKDictionary;
 #endif
 
-/* Callbacks. `context` is the pointer that was registered with the callback; the pair of both
- * pointers identifies the registration. Handles passed in are borrowed. No exception may leave a
- * callback.
+/* Callbacks. `context` is the pointer that was registered with the callback. The pair of callback
+ * and context identifies a factory or a coercion handler; a message handler is identified by its
+ * registration. Handles passed in are borrowed. No exception may leave a callback. Once an
+ * operation that removes a callback has returned, the callback is not called again, and its context
+ * may be freed unless the callback is running on the same thread.
  */
 
 /* Creates an object of the requested class and stores it in *outObject, owned by the caller.
@@ -99,13 +101,14 @@ VRK_API VRKResult VRK_CALL VRKObjectCreate(VRKToken objectClass, VRKDictionary p
                                            VRKObject* outObject);
 
 /* Calls the object's handlers that asked for the message, newest first, until one returns a code
- * other than kVRKNotHandled, which becomes the result. `parameters` may be null; `flags` is 0 or 1.
- */
+ * other than kVRKNotHandled, which becomes the result. `parameters` may be null. `flags` is 0 or 1;
+ * the embedded kernel ignores it. */
 VRK_API VRKResult VRK_CALL VRKObjectDeliverMessage(VRKObject object, VRKToken message,
                                                    VRKDictionary parameters, uint32_t flags);
 
 /* Null is accepted and does nothing. When an object's last reference is released, those of its
  * handlers that asked for "message:orvane.vrk.object-died" receive it, each exactly once. The
+ * handle is valid until they return, and retaining it does not keep the object alive. Then the
  * registrations of all its handlers end. */
 VRK_API VRKResult VRK_CALL VRKObjectRetain(VRKObject object);
 VRK_API VRKResult VRK_CALL VRKObjectRelease(VRKObject object);
@@ -143,10 +146,11 @@ VRK_API VRKResult VRK_CALL VRKMessageHandlerRemove(VRKMessageHandler registratio
 
 /* Tokens */
 
-/* Stores the token of a text, which is never null. Equal texts have equal tokens; different texts
- * have different ones. A token and its text are valid until the process ends, also across a
- * shut-down and restart of the kernel. `flag` is 0, or 1 if the text stays valid as long as the
- * calling library. */
+/* Stores the token of a text, which is never null. The kernel copies the text. Equal texts have
+ * equal tokens; different texts have different ones. A token and the kernel's copy of its text are
+ * valid until the process ends, also across a shut-down and restart of the kernel. `flag` is 1 if
+ * the caller's text stays valid while its library is loaded, else 0; the embedded kernel ignores
+ * it. */
 VRK_API VRKResult VRK_CALL VRKTokenCreate(const char* text, uint32_t flag, VRKToken* outToken);
 
 /* Returns the token's text, or null if there is no such token. */
@@ -191,11 +195,13 @@ VRK_API VRKResult VRK_CALL VRKDataCoercionHandlerRemove(VRKDataCoercionCallback 
 /* Stores an empty dictionary, owned by the caller. */
 VRK_API VRKResult VRK_CALL VRKDictionaryCreate(uint32_t reserved, VRKDictionary* outDictionary);
 
-/* Stores the data under a key, borrowed from the dictionary. kVRKNotFound: there is none. */
+/* Stores a key's data in *outData, borrowed: valid until the entry is replaced or the dictionary is
+ * destroyed. kVRKNotFound: the key has none. */
 VRK_API VRKResult VRK_CALL VRKDictionaryGetEntry(VRKDictionary dictionary, VRKToken key,
                                                  VRKData* outData);
 
-/* Stores data under a key and replaces what was there. The dictionary retains the data. */
+/* Sets or replaces a key's data, which must not be null. The dictionary retains the data. Entries
+ * cannot be removed. */
 VRK_API VRKResult VRK_CALL VRKDictionarySetEntry(VRKDictionary dictionary, VRKToken key,
                                                  VRKData data);
 

@@ -8,9 +8,9 @@
 
 namespace Varnel {
 
-// Sends each operation as a message to a translator object, to which it and each of its copies hold
-// a reference. If the object does not handle the message, nothing happens, except that
-// TranslateString throws the kernel's code for a missing entry.
+// Sends each operation as a message to its translator object. Each copy of a client holds its own
+// reference to the object. If no handler takes the message, MakeDefault and SetTranslations do
+// nothing, and TranslateString throws Exception with kVRKNotFound.
 //
 // Throws: Exception with the kernel's code, or that of the object's handler.
 //
@@ -39,7 +39,8 @@ class StringTranslatorClient : public StringTranslatorInterface {
   ObjectRef object;
 };
 
-// Returns a client of a new translator object with its own translator.
+// Creates an object of class kClassStringTranslator and returns a client that holds it; never null.
+// Throws: Exception with kVRKNotFound if the plug-in is not initialised, std::bad_alloc.
 boost::shared_ptr<StringTranslatorInterface> CreateStringTranslator();
 
 }  // namespace Varnel

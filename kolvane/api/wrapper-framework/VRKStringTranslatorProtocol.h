@@ -1,7 +1,9 @@
-// The message protocol of translator objects: two classes and three messages. Parameters and
-// results are entries of the dictionary that is delivered with the message. A delivery returns 0 if
-// the message was handled, kVRKNotHandled if no translator handled it, and otherwise a failure
-// code; a failed message stores no result.
+// The message protocol of translator objects: two classes and three messages. A translator object
+// is the kernel object that receives the messages; a translator is the plug-in's C++ object behind
+// it. Parameters and results are entries of the message's parameter dictionary (VRKDictionary). A
+// delivery returns 0 if the message was handled, kVRKNotHandled if no translator handled it, and
+// otherwise a failure code; a failed message stores no result. A missing parameter fails with
+// kVRKNotFound, and one that cannot be coerced with kResultInputContractViolation.
 #pragma once
 
 namespace Varnel {
