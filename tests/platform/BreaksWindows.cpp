@@ -6,10 +6,18 @@ namespace {
 
 int gBreaks = 0;
 
+auto& InstructionPointer(CONTEXT& context) {
+#ifdef _WIN64
+  return context.Rip;
+#else
+  return context.Eip;
+#endif
+}
+
 LONG CALLBACK GoOn(EXCEPTION_POINTERS* exception) {
   if (exception->ExceptionRecord->ExceptionCode != EXCEPTION_BREAKPOINT) return EXCEPTION_CONTINUE_SEARCH;
   ++gBreaks;
-  ++exception->ContextRecord->Eip;  // past the instruction of one byte
+  ++InstructionPointer(*exception->ContextRecord);  // past the instruction of one byte
   return EXCEPTION_CONTINUE_EXECUTION;
 }
 
