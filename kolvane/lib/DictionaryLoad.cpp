@@ -3,14 +3,18 @@
 #include <array>
 #include <utility>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/ByteStreams.h"
 #include "kolvane/lib/DictionaryReader.h"
 #include "kolvane/lib/DictionaryTable.h"
 #include "kolvane/lib/TextSyntax.h"
 
+using tovali_private::ConvertedImage;
+using tovali_private::Damage;
 using tovali_private::DictionaryReader;
 using tovali_private::InputStream;
+using tovali_private::ParsedImage;
+using tovali_private::StoredImage;
 
 namespace {
 
@@ -27,24 +31,19 @@ Recognised Recognise(InputStream& image) {
   return std::ranges::equal(head, kBinaryMagic) ? Recognised::kBinary : Recognised::kText;
 }
 
-// Whether a text image, whose last line has been read, ended there and ended well.
-void CheckTextEnd(InputStream& image, TextEncoding encoding, LoadStatus& status) {
+// Returns the damage at the end of a text image whose last line has been read.
+Damage DamageAtTextEnd(InputStream& image, TextEncoding encoding) {
   const uint64_t unitSize = encoding == TextEncoding::kCodePage ? 1 : 2;
   const uint64_t left = image.SkipToEnd();
-  if (image.HasFailed()) return;  // the load stays interrupted
-  status.damage = LoadDamage::kNone;
-  if (left != 0) {
-    status.damage = LoadDamage::kZeroCharacter;
-    status.damageOffset = image.Size() - left - unitSize;
-  } else if (image.Size() % unitSize != 0) {
-    status.damage = LoadDamage::kHalfUnit;
-    status.damageOffset = image.Size() - 1;
-  }
+  if (image.HasFailed()) return {LoadDamage::kInterrupted};
+  if (left != 0) return {LoadDamage::kZeroCharacter, image.Size() - left - unitSize};
+  if (image.Size() % unitSize != 0) return {LoadDamage::kHalfUnit, image.Size() - 1};
+  return {};
 }
 
 }  // namespace
 
-// Also where a load throws.
+// Compacts on scope exit, exceptions included.
 class DictionaryTable::MoveAtEnd {
  public:
   explicit MoveAtEnd(DictionaryTable& loadedTable) noexcept : table(loadedTable) {}
@@ -57,13 +56,11 @@ class DictionaryTable::MoveAtEnd {
 };
 
 void DictionaryTable::Load(InputStream& image) {
-  lastLoad = {};
-  ++loadNumber;
-  lastLoad.damage = LoadDamage::kInterrupted;  // until the load has come to an end
+  lastLoad.Begin();
   const auto reader = DictionaryReader::Create(&image);
   switch (Recognise(image)) {
     case Recognised::kTooShort:
-      if (!image.HasFailed()) lastLoad.damage = LoadDamage::kTooShort;
+      if (!image.HasFailed()) lastLoad.End({LoadDamage::kTooShort});
       break;
     case Recognised::kText: {
       const MoveAtEnd moving(*this);
@@ -71,31 +68,43 @@ void DictionaryTable::Load(InputStream& image) {
       break;
     }
     case Recognised::kBinary:
-      tovali_private::LoadBinary(*this, image, lastLoad);
-      if (image.HasFailed()) lastLoad.damage = LoadDamage::kInterrupted;
+      LoadBinary(image);
       break;
   }
 }
 
 void DictionaryTable::LoadText(InputStream& image, DictionaryReader& reader) {
-  lastLoad.format = ImageFormat::kText;
-  lastLoad.encoding = reader.Encoding();
+  lastLoad.SetFormat(ImageFormat::kText, reader.Encoding());
   memory.Expect(image.Size());
   while (const uint16_t* line = reader.GetNextLine()) {
-    if (line[0] == 0) continue;
-    switch (StoreLine({line, reader.LineLength()})) {
-      case StoredLine::kDropped:
-        ++lastLoad.linesDropped;
-        break;
-      case StoredLine::kReplaced:
-        ++lastLoad.entriesReplaced;
-        [[fallthrough]];
-      case StoredLine::kAdded:
-        ++lastLoad.entriesAdded;
-        break;
-    }
+    if (line[0] != 0) lastLoad.Count(StoreLine({line, reader.LineLength()}));
   }
-  CheckTextEnd(image, reader.Encoding(), lastLoad);
+  lastLoad.End(DamageAtTextEnd(image, reader.Encoding()));
+}
+
+void DictionaryTable::LoadBinary(InputStream& image) {
+  ParsedImage parsed = tovali_private::ParseBinary(image);
+  lastLoad.SetFormat(parsed.format, parsed.encoding);
+  if (parsed.encoding == TextEncoding::kUTF16LE) {
+    Adopt(std::move(parsed.stored));
+  } else {
+    ConvertedImage converted = tovali_private::ConvertValues(parsed.stored);
+    Adopt(std::move(converted.stored));
+    if (converted.failure != nullptr) {
+      lastLoad.SetInterruption(converted.failureOffset);
+      std::rethrow_exception(converted.failure);
+    }
+    if (parsed.damage.kind == LoadDamage::kNone) parsed.damage = converted.misfiled;
+  }
+  if (image.HasFailed()) parsed.damage.kind = LoadDamage::kInterrupted;
+  lastLoad.End(parsed.damage);
+}
+
+// Queues the groups, in their order, in front of their buckets' entries. Groups of buckets that
+// the table lacks are dropped; entries in another bucket than their key's are never found.
+void DictionaryTable::Adopt(StoredImage&& image) {
+  image.load = lastLoad.Number();
+  lastLoad.CountAdded(waiting.Add(std::move(image)));
 }
 
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {

@@ -8,19 +8,6 @@ using tovali_private::StoredEntry;
 using tovali_private::StoredGroup;
 using tovali_private::StoredImage;
 
-namespace {
-
-// Entries are met in the order in which they are asked for; the one that counts is the image's
-// first.
-void NoteWrongBucket(LoadStatus& status, uint64_t offset) {
-  const bool isBefore = status.damage == LoadDamage::kWrongBucket && offset < status.damageOffset;
-  if (status.damage != LoadDamage::kNone && !isBefore) return;
-  status.damage = LoadDamage::kWrongBucket;
-  status.damageOffset = offset;
-}
-
-}  // namespace
-
 DictionaryTable::~DictionaryTable() {
   if (defaultDictionary == this) defaultDictionary = nullptr;
   DestroyEntries();
@@ -70,14 +57,9 @@ void DictionaryTable::MakeRoom(uint32_t bucket) {
   index.ReserveOne();
 }
 
-void DictionaryTable::Defer(StoredImage&& image) {
-  image.load = loadNumber;
-  lastLoad.entriesAdded += waiting.Add(std::move(image));
-}
-
 const LoadStatus& DictionaryTable::LastLoad() {
   for (uint32_t bucket = 0; waiting.Any() && bucket < kBucketCount; ++bucket) Settle(bucket);
-  return lastLoad;
+  return lastLoad.Status();
 }
 
 const HashItem* DictionaryTable::Bucket(uint32_t bucket) {
@@ -102,9 +84,9 @@ void DictionaryTable::SettleLastOf(StoredGroup& group) {
   if (canBeFound) index.ReserveOne();
   const bool hides = LinkAtHead(group.bucket, std::move(entry), canBeFound);
   image.DropLastOf(group);
-  if (image.load != loadNumber) return;
-  if (hides) ++lastLoad.entriesReplaced;
-  if (!canBeFound && !image.keysChecked) NoteWrongBucket(lastLoad, stored.offset);
+  if (image.load != lastLoad.Number()) return;
+  if (hides) lastLoad.CountReplaced();
+  if (!canBeFound && !image.keysChecked) lastLoad.NoteWrongBucket(stored.offset);
 }
 
 void DictionaryTable::Clear() noexcept {

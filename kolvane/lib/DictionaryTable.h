@@ -11,7 +11,7 @@
 
 #include "kolvane/lib/DictionaryItems.h"
 #include "kolvane/lib/KeyIndex.h"
-#include "kolvane/lib/LoadStatus.h"
+#include "kolvane/lib/LoadRecord.h"
 #include "kolvane/lib/StoredGroups.h"
 #include "kolvane/lib/TranslatedString.h"
 
@@ -19,9 +19,6 @@ namespace tovali_private {
 class DictionaryReader;
 class InputStream;
 }  // namespace tovali_private
-
-// What became of a text line.
-enum class StoredLine : uint8_t { kDropped, kAdded, kReplaced };
 
 // Owns its entries. Not for concurrent use: even a lookup writes to the table, and values are
 // shared with plain reference counts. The memory of an entry that is replaced comes back with that
@@ -88,11 +85,6 @@ class DictionaryTable {
   // The first item of a bucket's chain, or null.
   const tovali_private::HashItem* Bucket(uint32_t bucket);
 
-  // Puts the image's groups, each with its entries in their order, in front of what their buckets
-  // hold, or drops those whose bucket is not the table's. An entry whose key belongs to another
-  // bucket is owned but never found.
-  void Defer(tovali_private::StoredImage&& image);
-
   // Destroys every entry.
   void Clear() noexcept;
 
@@ -111,6 +103,8 @@ class DictionaryTable {
   void MoveChain(tovali_private::HashItem*& head);
   static void ReplaceByMoved(tovali_private::HashItem*& head) noexcept;
   void LoadText(tovali_private::InputStream& image, tovali_private::DictionaryReader& reader);
+  void LoadBinary(tovali_private::InputStream& image);
+  void Adopt(tovali_private::StoredImage&& image);
 
   tovali_private::EntryMemory memory;
   uint64_t liveBytes = 0;  // what the entries take
@@ -121,8 +115,7 @@ class DictionaryTable {
   tovali_private::WaitingGroups waiting;
   tovali_private::KeyIndex index;
 
-  LoadStatus lastLoad;
-  uint64_t loadNumber = 0;  // of the latest load
+  tovali_private::LoadRecord lastLoad;
 
   static DictionaryTable* defaultDictionary;  // owned by whoever owns the table
 };

@@ -6,7 +6,7 @@
 #include <stdexcept>
 #include <string_view>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/ByteStreams.h"
 #include "kolvane/lib/Converters.h"
 #include "kolvane/lib/DictionaryTable.h"

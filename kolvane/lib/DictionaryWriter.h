@@ -1,4 +1,4 @@
-// Dictionaries out: a table as an image in the Kolvane Binary Format (BinaryLoader.h).
+// Dictionaries out: a table as an image in the Kolvane Binary Format (BinaryParser.h).
 #pragma once
 
 #include <cstddef>

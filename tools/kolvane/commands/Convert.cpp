@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/Converters.h"
 #include "kolvane/lib/DictionaryReader.h"
 #include "tools/kolvane/cli/ChoiceOption.h"

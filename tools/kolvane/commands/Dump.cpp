@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/DictionaryWriter.h"
 #include "kolvane/lib/TextSyntax.h"
 #include "tools/kolvane/cli/CommandLine.h"

@@ -2,7 +2,7 @@
 
 #include <unordered_set>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/ByteStreams.h"
 #include "kolvane/lib/TextSyntax.h"
 #include "tools/kolvane/dictionary/TextLines.h"
@@ -42,10 +42,7 @@ void FindLines(const ImageFile& file, FoundOnce& found) {
 
 void FindStored(const ImageFile& file, FoundOnce& found) {
   tovali_private::MemoryInput stream(file.bytes);
-  tovali_private::StoredImage image;
-  LoadStatus status;
-  tovali_private::ParseBinary(stream, image, status);
-  image.ForEachEntry(
+  tovali_private::ParseBinary(stream).stored.ForEachEntry(
       [&](const auto&, const tovali_private::StoredEntry& entry) { found.Find(entry.Key()); });
 }
 

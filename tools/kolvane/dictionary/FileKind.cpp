@@ -7,7 +7,7 @@
 #include <nlohmann/json.hpp>
 #include <string>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/Converters.h"
 #include "kolvane/lib/DictionaryReader.h"
 #include "tools/kolvane/cli/Diagnostics.h"

@@ -9,7 +9,7 @@
 #include <string_view>
 #include <utility>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/DictionaryReader.h"
 #include "kolvane/lib/LoadStatus.h"
 #include "platform/File.h"

@@ -7,7 +7,7 @@
 #include <tuple>
 #include <utility>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/DictionaryTable.h"
 #include "tools/kolvane/cli/Diagnostics.h"
 #include "tools/kolvane/dictionary/DictionaryFile.h"

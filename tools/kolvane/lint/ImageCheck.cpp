@@ -9,7 +9,7 @@
 #include <unordered_map>
 #include <utility>
 
-#include "kolvane/lib/BinaryLoader.h"
+#include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/ByteStreams.h"
 #include "kolvane/lib/DictionaryTable.h"
 #include "kolvane/lib/StoredGroups.h"
@@ -23,7 +23,6 @@ namespace {
 
 using tovali_private::StoredEntry;
 using tovali_private::StoredGroup;
-using tovali_private::StoredImage;
 using Bytes = std::span<const uint8_t>;
 
 struct DamageRule {
@@ -77,9 +76,9 @@ class ImageCheck {
 
   Definitions Run() {
     tovali_private::MemoryInput stream(file.bytes);
-    tovali_private::ParseBinary(stream, image, status);
+    parsed = tovali_private::ParseBinary(stream);
     CheckDamage();
-    image.ForEachEntry(
+    parsed.stored.ForEachEntry(
         [this](const StoredGroup& group, const StoredEntry& entry) { CheckEntry(group, entry); });
     return std::move(definitions);
   }
@@ -87,9 +86,10 @@ class ImageCheck {
  private:
   void CheckDamage() {
     for (const DamageRule& each : kDamageRules) {
-      if (each.damage != status.damage) continue;
-      Report(*each.rule, Place{.file = file.name, .hasOffset = true, .offset = status.damageOffset},
-             "", each.message);
+      if (each.damage != parsed.damage.kind) continue;
+      Report(*each.rule,
+             Place{.file = file.name, .hasOffset = true, .offset = parsed.damage.offset}, "",
+             each.message);
     }
   }
 
@@ -98,9 +98,9 @@ class ImageCheck {
     if (group.bucket >= DictionaryTable::kBucketCount) return;
     const std::string key(AsText(entry.key));
     CheckKey(key, entry);
-    if (const auto bad = BadCharacterIn(entry.value, status.encoding)) {
+    if (const auto bad = BadCharacterIn(entry.value, parsed.encoding)) {
       Place place = PlaceOf(entry);
-      place.offset += entry.key.size() + image.lengthsBetween / 2 + bad->at;
+      place.offset += entry.key.size() + parsed.stored.lengthsBetween / 2 + bad->at;
       Report(rules::kMalformedInput, std::move(place), key, bad->message);
     }
     const uint32_t due = entry.Key().Hash(DictionaryTable::kBucketCount);
@@ -143,8 +143,8 @@ class ImageCheck {
   }
 
   std::vector<uint16_t> ValueOf(const StoredEntry& entry) const {
-    if (status.encoding == TextEncoding::kUTF16LE) return UnitsOf(entry.value);
-    return FromMultiByte(AsText(entry.value), tovali_private::SelectorFor(status.encoding));
+    if (parsed.encoding == TextEncoding::kUTF16LE) return UnitsOf(entry.value);
+    return FromMultiByte(AsText(entry.value), tovali_private::SelectorFor(parsed.encoding));
   }
 
   Place PlaceOf(const StoredEntry& entry) const {
@@ -162,8 +162,7 @@ class ImageCheck {
 
   const ImageFile& file;
   std::vector<Finding>& findings;
-  StoredImage image;
-  LoadStatus status;
+  tovali_private::ParsedImage parsed;
   Definitions definitions;
   std::unordered_map<std::string, const StoredGroup*, platform::SeededHash> definingGroups;
   size_t number = 0;
