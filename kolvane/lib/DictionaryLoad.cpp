@@ -110,12 +110,14 @@ void DictionaryTable::Adopt(StoredImage&& image) {
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
   const auto split = tovali_private::SplitKolvane(tovali_private::EntryText(line));
   if (!split) return StoredLine::kDropped;
-  const auto narrowed = tovali_private::NarrowKey(split->key);
-  const ByteRunKey key(narrowed.data(), static_cast<uint32_t>(narrowed.size()), false);
-  index.Prepare(key.Bytes());
-  auto entry = DictionaryEntry::Create(memory, key, split->value);
-  MakeRoom(key.Hash(kBucketCount));
-  const bool replaces = Detach(key) != nullptr;
-  Insert(std::move(entry));
-  return replaces ? StoredLine::kReplaced : StoredLine::kAdded;
+  const auto bytes = tovali_private::NarrowKey(split->key);
+  const ByteRunKey probe(bytes.data(), static_cast<uint32_t>(bytes.size()), false);
+  const KeyHashes key = HashesOf(probe);
+  index.Prepare(key.inIndex);
+  auto created = DictionaryEntry::Create(memory, probe, split->value);
+  MakeRoom(key.bucket);
+  DictionaryEntry& entry = LinkAtHead(key.bucket, std::move(created));
+  if (!MakeFindable(entry, key.inIndex)) return StoredLine::kAdded;
+  DestroyHidden(entry);
+  return StoredLine::kReplaced;
 }

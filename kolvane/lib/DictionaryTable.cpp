@@ -13,6 +13,10 @@ DictionaryTable::~DictionaryTable() {
   DestroyEntries();
 }
 
+DictionaryTable::KeyHashes DictionaryTable::HashesOf(const ByteRunKey& key) const noexcept {
+  return {index.HashOf(key.Bytes()), key.Hash(kBucketCount)};
+}
+
 KeyedRun* DictionaryTable::FindRun(std::span<const uint8_t> key) {
   if (waiting.Any()) {
     const ByteRunKey probe(key.data(), static_cast<uint32_t>(key.size()), false);
@@ -30,26 +34,26 @@ std::unique_ptr<DictionaryTable::DictionaryEntry> DictionaryTable::Detach(const 
   std::unique_ptr<DictionaryEntry> found(Find(key));
   if (found == nullptr) return nullptr;
   if (const DictionaryEntry* const next = std::exchange(found->hidden, nullptr)) {
-    index.Put(next->Run());
+    index.Put(next->Run(), index.HashOf(key.Bytes()));
   } else {
     index.Remove(found->Run());
   }
-  liveBytes -= found->MemorySize();
   Unlink(*found);
   return found;
 }
 
-void DictionaryTable::Unlink(HashItem& item) noexcept {
-  HashItem* const after = std::exchange(item.next, nullptr);
-  HashItem* const before = std::exchange(item.previous, nullptr);
-  (before != nullptr ? before->next : buckets[item.Hash(kBucketCount)]) = after;
+void DictionaryTable::Unlink(DictionaryEntry& entry) noexcept {
+  liveBytes -= entry.MemorySize();
+  HashItem* const after = std::exchange(entry.next, nullptr);
+  HashItem* const before = std::exchange(entry.previous, nullptr);
+  (before != nullptr ? before->next : buckets[entry.Hash(kBucketCount)]) = after;
   if (after != nullptr) after->previous = before;
 }
 
 void DictionaryTable::Insert(std::unique_ptr<DictionaryEntry> entry) {
-  const uint32_t bucket = entry->Hash(kBucketCount);
-  MakeRoom(bucket);
-  LinkAtHead(bucket, std::move(entry), true);
+  const KeyHashes key = HashesOf(*entry);
+  MakeRoom(key.bucket);
+  MakeFindable(LinkAtHead(key.bucket, std::move(entry)), key.inIndex);
 }
 
 void DictionaryTable::MakeRoom(uint32_t bucket) {
@@ -80,9 +84,11 @@ void DictionaryTable::SettleLastOf(StoredGroup& group) {
   const StoredImage& image = *group.image;
   const StoredEntry stored = image.LastOf(group);
   auto entry = DictionaryEntry::Create(memory, stored.Key(), stored.value);
-  const bool canBeFound = entry->Hash(kBucketCount) == group.bucket;
+  const KeyHashes key = HashesOf(*entry);
+  const bool canBeFound = key.bucket == group.bucket;
   if (canBeFound) index.ReserveOne();
-  const bool hides = LinkAtHead(group.bucket, std::move(entry), canBeFound);
+  DictionaryEntry& linked = LinkAtHead(group.bucket, std::move(entry));
+  const bool hides = canBeFound && MakeFindable(linked, key.inIndex);
   image.DropLastOf(group);
   if (image.load != lastLoad.Number()) return;
   if (hides) lastLoad.CountReplaced();
@@ -105,16 +111,25 @@ void DictionaryTable::DestroyEntries() noexcept {
   liveBytes = 0;
 }
 
-// Returns whether the entry hides another one of its key.
-bool DictionaryTable::LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry,
-                                 bool canBeFound) noexcept {
+DictionaryTable::DictionaryEntry& DictionaryTable::LinkAtHead(
+    uint32_t bucket, std::unique_ptr<DictionaryEntry> entry) noexcept {
   DictionaryEntry* const item = entry.release();
   item->next = buckets[bucket];
   if (item->next != nullptr) item->next->previous = item;
   buckets[bucket] = item;
   liveBytes += item->MemorySize();
-  const KeyedRun* const before = canBeFound ? index.Put(item->Run()) : nullptr;
-  if (before == nullptr) return false;
-  item->hidden = before->entry;
-  return true;
+  return *item;
+}
+
+// Indexes a linked entry. Returns whether it hides an older one of its key.
+bool DictionaryTable::MakeFindable(DictionaryEntry& entry, uint32_t hash) noexcept {
+  const KeyedRun* const older = index.Put(entry.Run(), hash);
+  if (older != nullptr) entry.hidden = older->entry;
+  return older != nullptr;
+}
+
+void DictionaryTable::DestroyHidden(DictionaryEntry& entry) noexcept {
+  const std::unique_ptr<DictionaryEntry> older(entry.hidden);
+  entry.hidden = older->hidden;
+  Unlink(*older);
 }

@@ -91,14 +91,22 @@ class DictionaryTable {
  private:
   class MoveAtEnd;
 
+  // Both hashes of a key, computed once for all steps of a change.
+  struct KeyHashes {
+    uint32_t inIndex;
+    uint32_t bucket;
+  };
+
+  KeyHashes HashesOf(const ByteRunKey& key) const noexcept;
   tovali_private::KeyedRun* FindRun(std::span<const uint8_t> key);
   void Settle(uint32_t bucket);
   void MakeRoom(uint32_t bucket);
   void DestroyEntries() noexcept;
   void SettleLastOf(tovali_private::StoredGroup& group);
-  bool LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry,
-                  bool canBeFound) noexcept;
-  void Unlink(tovali_private::HashItem& item) noexcept;
+  DictionaryEntry& LinkAtHead(uint32_t bucket, std::unique_ptr<DictionaryEntry> entry) noexcept;
+  bool MakeFindable(DictionaryEntry& entry, uint32_t hash) noexcept;
+  void DestroyHidden(DictionaryEntry& entry) noexcept;
+  void Unlink(DictionaryEntry& entry) noexcept;
   void MoveFromMostlyDeadMemory() noexcept;
   void MoveChain(tovali_private::HashItem*& head);
   static void ReplaceByMoved(tovali_private::HashItem*& head) noexcept;

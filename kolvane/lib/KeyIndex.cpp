@@ -20,7 +20,7 @@ constexpr uint32_t MostRuns(uint32_t slotCount) noexcept {
   return slotCount / 4 * 3;
 }
 
-// Whoever has found the run copies its bytes next: they are on their way while keys are compared.
+// Prefetches the value's next cache lines, because a hit is copied next.
 bool HasKey(const KeyedRun& run, std::span<const uint8_t> key) noexcept {
   const auto* const start = reinterpret_cast<const char*>(&run);
   __builtin_prefetch(start + 64);
@@ -51,16 +51,15 @@ KeyIndex::KeyIndex()
       most(MostRuns(kFirstSlots)),
       slots(MakeSlots(kFirstSlots)) {}
 
-void KeyIndex::Prepare(std::span<const uint8_t> key) const noexcept {
-  __builtin_prefetch(&slots[HashOf(key) & mask]);
+void KeyIndex::Prepare(uint32_t hash) const noexcept {
+  __builtin_prefetch(&slots[hash & mask]);
 }
 
 KeyedRun* KeyIndex::Find(std::span<const uint8_t> key) const noexcept {
   return slots[SlotFor(HashOf(key), key)].run;
 }
 
-KeyedRun* KeyIndex::Put(KeyedRun& run) noexcept {
-  const uint32_t hash = HashOf(run.Key());
+KeyedRun* KeyIndex::Put(KeyedRun& run, uint32_t hash) noexcept {
   Slot& slot = slots[SlotFor(hash, run.Key())];
   if (slot.run == nullptr) ++runCount;
   slot.hash = hash;
@@ -72,14 +71,14 @@ void KeyIndex::Replace(const KeyedRun& run, KeyedRun& other) noexcept {
   if (slot.run == &run) slot.run = &other;
 }
 
-// Closes the gap: each run behind it, up to the next empty slot, moves into it unless it is to be
-// looked for only from behind the gap on.
+// Backward-shift deletion: fills the gap with later entries whose home slot is not after it. No
+// tombstones are left, so probes stay short.
 void KeyIndex::Remove(const KeyedRun& run) noexcept {
   uint32_t gap = SlotFor(HashOf(run.Key()), run.Key());
   for (uint32_t next = Behind(gap); slots[next].run != nullptr; next = Behind(next)) {
-    const uint32_t fromItsFirst = (next - slots[next].hash) & mask;
+    const uint32_t fromHome = (next - slots[next].hash) & mask;
     const uint32_t fromGap = (next - gap) & mask;
-    if (fromItsFirst < fromGap) continue;
+    if (fromHome < fromGap) continue;
     slots[gap] = slots[next];
     gap = next;
   }
@@ -97,7 +96,8 @@ uint32_t KeyIndex::HashOf(std::span<const uint8_t> key) const noexcept {
   return static_cast<uint32_t>(hash({reinterpret_cast<const char*>(key.data()), key.size()}));
 }
 
-// The slot of the run with this key, or else the empty one where it would go.
+// Returns the key's slot, or the empty slot where the key would be inserted. Comparing the stored
+// hash first avoids a cache miss for most other keys on the way.
 uint32_t KeyIndex::SlotFor(uint32_t hash, std::span<const uint8_t> key) const noexcept {
   uint32_t at = hash & mask;
   while (slots[at].run != nullptr && !(slots[at].hash == hash && HasKey(*slots[at].run, key))) {

@@ -1,4 +1,4 @@
-// Finds what has a key in constant time, whatever the keys look like.
+// Hash index from key to value; O(1) expected, for hostile keys too.
 #pragma once
 
 #include <cstddef>
@@ -10,38 +10,40 @@
 
 namespace tovali_private {
 
-// A hash table over whole keys that knows at most one run for each. Its hash is seeded anew in
-// every process, so that no image can be made to crowd its slots. It owns no runs.
+// Open addressing, linear probing, load factor 3/4, seeded per process. Holds at most one run for
+// each key. Borrows its runs.
 class KeyIndex {
  public:
   KeyIndex();
   KeyIndex(const KeyIndex&) = delete;
   KeyIndex& operator=(const KeyIndex&) = delete;
 
-  // Makes room for one more key; Put needs it. Throws std::bad_alloc, and has then done nothing.
+  // Makes room for one more key, which Put requires. Throws: std::bad_alloc, without effect.
   void ReserveOne() {
     if (runCount == most) Grow();
   }
 
-  // Has what the key's operations need fetched meanwhile.
-  void Prepare(std::span<const uint8_t> key) const noexcept;
+  uint32_t HashOf(std::span<const uint8_t> key) const noexcept;
 
-  // The run with this key, or null.
+  // Prefetches the slot of a key with this hash.
+  void Prepare(uint32_t hash) const noexcept;
+
+  // Returns the run with this key, or null.
   KeyedRun* Find(std::span<const uint8_t> key) const noexcept;
 
-  // Makes the run the one that is found by its key. Returns the one that was, or null.
-  KeyedRun* Put(KeyedRun& run) noexcept;
+  // Indexes the run by its key, whose hash is given. Returns the run that it replaces, or null.
+  KeyedRun* Put(KeyedRun& run, uint32_t hash) noexcept;
 
-  // Has a run found no longer, if it was, but another one of its key.
+  // If `run` is indexed, replaces it by `other`, which has the same key.
   void Replace(const KeyedRun& run, KeyedRun& other) noexcept;
 
-  // Forgets a run that Find finds.
+  // Removes a run. Requires: the run is indexed.
   void Remove(const KeyedRun& run) noexcept;
 
   void Clear() noexcept;
 
  private:
-  // Slots are looked through from the one that the hash names onwards, up to an empty one.
+  // Probes from hash & mask to the first empty slot.
   struct Slot {
     uint32_t hash = 0;
     KeyedRun* run = nullptr;
@@ -54,14 +56,13 @@ class KeyIndex {
   using Slots = std::unique_ptr<Slot[], FreeSlots>;
 
   static Slots MakeSlots(size_t count);
-  uint32_t HashOf(std::span<const uint8_t> key) const noexcept;
   uint32_t SlotFor(uint32_t hash, std::span<const uint8_t> key) const noexcept;
   uint32_t Behind(uint32_t slot) const noexcept { return (slot + 1) & mask; }
   void Grow();
 
   uint64_t seed;
-  uint32_t mask;  // one less than the number of slots, which is a power of two
-  uint32_t most;  // runs, for lookups to stay short
+  uint32_t mask;  // number of slots - 1; the number is a power of two
+  uint32_t most;  // number of runs at which the index grows
   uint32_t runCount = 0;
   Slots slots;
 };
