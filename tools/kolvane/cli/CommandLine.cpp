@@ -2,8 +2,8 @@
 
 #include <fmt/format.h>
 
+#include <CLI/CLI.hpp>
 #include <algorithm>
-#include <memory>
 #include <string_view>
 #include <utility>
 
@@ -52,24 +52,101 @@ void RefuseEmptyValues(int argc, const char* const* argv) {
 
 }  // namespace
 
+// The only class that knows the parser library.
+class CommandLine::Parser {
+ public:
+  Parser(std::string name, std::string operands, std::string about) : app(std::move(about), name) {
+    app.formatter(std::make_shared<HelpFormatter>(std::move(name), std::move(operands)));
+    app.allow_extras();
+    app.get_option("--help")->description("Print this help and exit");
+  }
+
+  void BeginGroup(std::string heading) { group = std::move(heading); }
+
+  void AddFlag(const Option& option, bool& isGiven) {
+    app.add_flag(option.names, isGiven, option.text)->group(group);
+  }
+
+  void AddFlag(const Option& option, std::function<void()> whenGiven) {
+    app.add_flag_callback(option.names, std::move(whenGiven), option.text)->group(group);
+  }
+
+  template <class Target>
+  CLI::Option* Add(const Option& option, Target& target) {
+    return Describe(option, app.add_option(option.names, target, option.text));
+  }
+
+  void AddWord(const Option& option, std::vector<std::string> words,
+               std::function<void(size_t)> whenChosen) {
+    const auto choose = [words, whenChosen](const std::string& word) {
+      whenChosen(static_cast<size_t>(std::ranges::find(words, word) - words.begin()));
+    };
+    Describe(option, app.add_option_function<std::string>(option.names, choose, option.text))
+        ->check(CLI::IsMember(std::move(words)));
+  }
+
+  std::vector<std::string> Parse(int argc, const char* const* argv) {
+    RefuseEmptyValues(argc, argv);
+    try {
+      app.parse(argc, argv);
+    } catch (const CLI::CallForHelp&) {
+      WriteOutput(app.help());
+      throw HelpPrinted();
+    } catch (const CLI::ParseError& error) {
+      throw UsageError(Printable(error.what()));
+    }
+    return Operands(app.remaining());
+  }
+
+ private:
+  CLI::Option* Describe(const Option& option, CLI::Option* added) {
+    return added->type_name(option.value)->required(option.isRequired)->group(group);
+  }
+
+  CLI::App app;
+  std::string group;
+};
+
 CommandLine::CommandLine(std::string name, std::string operands, std::string about)
-    : app(std::move(about), name) {
-  app.formatter(std::make_shared<HelpFormatter>(std::move(name), std::move(operands)));
-  app.allow_extras();
-  app.get_option("--help")->description("Print this help and exit");
+    : parser(std::make_unique<Parser>(std::move(name), std::move(operands), std::move(about))) {}
+
+CommandLine::~CommandLine() = default;
+
+void CommandLine::BeginGroup(std::string heading) {
+  parser->BeginGroup(std::move(heading));
+}
+
+void CommandLine::AddFlag(const Option& option, bool& isGiven) {
+  parser->AddFlag(option, isGiven);
+}
+
+void CommandLine::AddFlag(const Option& option, std::function<void()> whenGiven) {
+  parser->AddFlag(option, std::move(whenGiven));
+}
+
+void CommandLine::AddValue(const Option& option, std::string& value) {
+  parser->Add(option, value);
+}
+
+void CommandLine::AddValue(const Option& option, std::optional<std::string>& value) {
+  parser->Add(option, value);
+}
+
+void CommandLine::AddValue(const Option& option, std::optional<double>& number) {
+  parser->Add(option, number);
+}
+
+void CommandLine::AddValues(const Option& option, std::vector<std::string>& values) {
+  parser->Add(option, values)->allow_extra_args(false);
+}
+
+void CommandLine::AddWord(const Option& option, std::vector<std::string> words,
+                          std::function<void(size_t)> whenChosen) {
+  parser->AddWord(option, std::move(words), std::move(whenChosen));
 }
 
 std::vector<std::string> CommandLine::Parse(int argc, const char* const* argv) {
-  RefuseEmptyValues(argc, argv);
-  try {
-    app.parse(argc, argv);
-  } catch (const CLI::CallForHelp&) {
-    WriteOutput(app.help());
-    throw HelpPrinted();
-  } catch (const CLI::ParseError& error) {
-    throw UsageError(Printable(error.what()));
-  }
-  return Operands(app.remaining());
+  return parser->Parse(argc, argv);
 }
 
 void CheckFiles(const std::vector<std::string>& files) {

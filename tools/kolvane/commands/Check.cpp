@@ -1,15 +1,13 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <map>
 #include <new>
 #include <optional>
 #include <string>
 #include <utility>
 #include <vector>
 
-#include "tools/kolvane/cli/ChoiceOption.h"
-#include "tools/kolvane/cli/ColourChoice.h"
+#include "tools/kolvane/cli/Colour.h"
 #include "tools/kolvane/cli/CommandLine.h"
 #include "tools/kolvane/cli/StandardOutput.h"
 #include "tools/kolvane/commands/Commands.h"
@@ -52,62 +50,52 @@ struct Request {
   bool listRules = false;
 };
 
-void AddDictionaryOptions(CLI::App& options, Request& request) {
-  options
-      .add_option("--reference", request.reference,
-                  "Compare each FILE, as a translation, with this dictionary")
-      ->type_name("FILE")
-      ->group("Dictionaries");
-  AddEncodingOption(options, request.encoding);
+void AddDictionaryOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Dictionaries");
+  commandLine.AddValue({.names = "--reference",
+                        .text = "Compare each FILE, as a translation, with this dictionary",
+                        .value = "FILE"},
+                       request.reference);
+  AddEncodingOption(commandLine, request.encoding);
 }
 
-void AddFindingOptions(CLI::App& options, Request& request) {
-  constexpr const char* kGroup = "Findings";
-  static const std::map<std::string, Severity> kSeverities = {
-      {"error", Severity::kError}, {"warning", Severity::kWarning}, {"info", Severity::kInfo}};
-  options.add_option("--disable", request.disabledRules, "Leave out what RULE finds")
-      ->type_name("RULE")
-      ->allow_extra_args(false)
-      ->group(kGroup);
-  options
-      .add_option("--baseline", request.baseline,
-                  "Leave out what FILE has, an earlier report in JSON")
-      ->type_name("FILE")
-      ->group(kGroup);
-  options.add_flag("--info", request.info, "Show cosmetic findings too")->group(kGroup);
-  AddChoice(options, "--fail-on", kSeverities, request.failOn,
-            "The least that counts as failure (error, unless told)")
-      ->type_name("SEVERITY")
-      ->group(kGroup);
-  options
-      .add_flag_callback(
-          "-W", [&] { request.failOn = std::min(request.failOn, Severity::kWarning); },
-          "The same as --fail-on=warning")
-      ->group(kGroup);
+void AddFindingOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Findings");
+  commandLine.AddValues(
+      {.names = "--disable", .text = "Leave out what RULE finds", .value = "RULE"},
+      request.disabledRules);
+  commandLine.AddValue({.names = "--baseline",
+                        .text = "Leave out what FILE has, an earlier report in JSON",
+                        .value = "FILE"},
+                       request.baseline);
+  commandLine.AddFlag({.names = "--info", .text = "Show cosmetic findings too"}, request.info);
+  commandLine.AddChoice<Severity>(
+      {.names = "--fail-on",
+       .text = "The least that counts as failure (error, unless told)",
+       .value = "SEVERITY"},
+      {{"error", Severity::kError}, {"warning", Severity::kWarning}, {"info", Severity::kInfo}},
+      request.failOn);
+  commandLine.AddFlag({.names = "-W", .text = "The same as --fail-on=warning"},
+                      [&] { request.failOn = std::min(request.failOn, Severity::kWarning); });
 }
 
-void AddReportOptions(CLI::App& options, Request& request) {
-  constexpr const char* kGroup = "Report";
-  static const std::map<std::string, ReportFormat> kFormats = {{"text", ReportFormat::kText},
-                                                               {"json", ReportFormat::kJSON},
-                                                               {"sarif", ReportFormat::kSARIF},
-                                                               {"github", ReportFormat::kGitHub}};
-  static const std::map<std::string, ColourChoice> kColours = {{"auto", ColourChoice::kAuto},
-                                                               {"always", ColourChoice::kAlways},
-                                                               {"never", ColourChoice::kNever}};
-  AddChoice(options, "--format", kFormats, request.format,
-            "How findings are written (text, unless told)")
-      ->type_name("FORMAT")
-      ->group(kGroup);
-  options
-      .add_flag("--no-snippet", request.noSnippet, "Leave out the lines that findings are about")
-      ->group(kGroup);
-  AddChoice(options, "--color", kColours, request.colour,
-            "When the text has colours (auto, unless told)")
-      ->type_name("WHEN")
-      ->group(kGroup);
-  options.add_flag("-q", request.quiet, "Leave out the counts")->group(kGroup);
-  options.add_flag("--list-rules", request.listRules, "Print all rules and exit")->group(kGroup);
+void AddReportOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Report");
+  commandLine.AddChoice<ReportFormat>({.names = "--format",
+                                       .text = "How findings are written (text, unless told)",
+                                       .value = "FORMAT"},
+                                      {{"text", ReportFormat::kText},
+                                       {"json", ReportFormat::kJSON},
+                                       {"sarif", ReportFormat::kSARIF},
+                                       {"github", ReportFormat::kGitHub}},
+                                      request.format);
+  commandLine.AddFlag(
+      {.names = "--no-snippet", .text = "Leave out the lines that findings are about"},
+      request.noSnippet);
+  AddColourOption(commandLine, request.colour);
+  commandLine.AddFlag({.names = "-q", .text = "Leave out the counts"}, request.quiet);
+  commandLine.AddFlag({.names = "--list-rules", .text = "Print all rules and exit"},
+                      request.listRules);
 }
 
 void RequireRules(const std::vector<std::string>& names) {
@@ -243,9 +231,9 @@ ExitStatus Check(const Request& request) {
 ExitStatus RunCheck(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane check", "FILE...", kAbout);
-  AddDictionaryOptions(commandLine.Options(), request);
-  AddFindingOptions(commandLine.Options(), request);
-  AddReportOptions(commandLine.Options(), request);
+  AddDictionaryOptions(commandLine, request);
+  AddFindingOptions(commandLine, request);
+  AddReportOptions(commandLine, request);
   request.files = commandLine.Parse(argc, argv);
   RequireRules(request.disabledRules);
   if (request.listRules) {

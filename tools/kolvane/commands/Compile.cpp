@@ -1,14 +1,12 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <map>
 #include <sstream>
 #include <string>
 #include <vector>
 
 #include "kolvane/lib/DictionaryTable.h"
 #include "kolvane/lib/DictionaryWriter.h"
-#include "tools/kolvane/cli/ChoiceOption.h"
 #include "tools/kolvane/cli/CommandLine.h"
 #include "tools/kolvane/cli/OutputFile.h"
 #include "tools/kolvane/cli/Paths.h"
@@ -43,26 +41,27 @@ struct Request {
   FileEncoding encoding = FileEncoding::kAuto;
 };
 
-void AddOptions(CLI::App& options, Request& request) {
-  static const std::map<std::string, BinaryVersion> kVersions = {{"1.0", BinaryVersion::k1_0},
-                                                                 {"1.5", BinaryVersion::k1_5}};
-  static const std::map<std::string, TextEncoding> kValues = {
-      {"utf-16", TextEncoding::kUTF16LE},
-      {"utf-8", TextEncoding::kUTF8},
-      {"code-page", TextEncoding::kCodePage}};
-  options.add_option("-o,--output", request.output, "Write the image to FILE")
-      ->required()
-      ->type_name("FILE")
-      ->group("Image");
-  AddChoice(options, "--format", kVersions, request.version,
-            "Its version of the binary format, else 1.5")
-      ->type_name("VERSION")
-      ->group("Image");
-  AddChoice(options, "--values", kValues, request.values,
-            "The encoding of its translations, else utf-16")
-      ->type_name("ENCODING")
-      ->group("Image");
-  AddEncodingOption(options, request.encoding);
+void AddOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Image");
+  commandLine.AddValue({.names = "-o,--output",
+                        .text = "Write the image to FILE",
+                        .value = "FILE",
+                        .isRequired = true},
+                       request.output);
+  commandLine.AddChoice<BinaryVersion>({.names = "--format",
+                                        .text = "Its version of the binary format, else 1.5",
+                                        .value = "VERSION"},
+                                       {{"1.5", BinaryVersion::k1_5}, {"1.0", BinaryVersion::k1_0}},
+                                       request.version);
+  commandLine.AddChoice<TextEncoding>({.names = "--values",
+                                       .text = "The encoding of its translations, else utf-16",
+                                       .value = "ENCODING"},
+                                      {{"utf-16", TextEncoding::kUTF16LE},
+                                       {"utf-8", TextEncoding::kUTF8},
+                                       {"code-page", TextEncoding::kCodePage}},
+                                      request.values);
+  commandLine.BeginGroup("Dictionaries");
+  AddEncodingOption(commandLine, request.encoding);
 }
 
 // Returns whether the file could be read and is whole, and says what is wrong with it.
@@ -126,7 +125,7 @@ ExitStatus Compile(const Request& request) {
 ExitStatus RunCompile(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane compile", "INPUT... -o OUT", kAbout);
-  AddOptions(commandLine.Options(), request);
+  AddOptions(commandLine, request);
   request.inputs = commandLine.Parse(argc, argv);
   CheckFiles(request.inputs);
   return Compile(request);

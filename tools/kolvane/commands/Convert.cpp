@@ -1,7 +1,6 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <map>
 #include <span>
 #include <string>
 #include <vector>
@@ -9,7 +8,6 @@
 #include "kolvane/lib/BinaryParser.h"
 #include "kolvane/lib/Converters.h"
 #include "kolvane/lib/DictionaryReader.h"
-#include "tools/kolvane/cli/ChoiceOption.h"
 #include "tools/kolvane/cli/CommandLine.h"
 #include "tools/kolvane/cli/OutputFile.h"
 #include "tools/kolvane/commands/Commands.h"
@@ -42,21 +40,20 @@ struct Request {
   FileEncoding encoding = FileEncoding::kAuto;
 };
 
-void AddOptions(CLI::App& options, Request& request) {
-  static const std::map<std::string, TextEncoding> kTargets = {
-      {"utf-8", TextEncoding::kUTF8},
-      {"utf-16le", TextEncoding::kUTF16LE},
-      {"utf-16be", TextEncoding::kUTF16BE},
-      {"code-page", TextEncoding::kCodePage}};
-  options.add_option("-o,--output", request.output, "Write to FILE")
-      ->required()
-      ->type_name("FILE")
-      ->group("Output");
-  AddChoice(options, "--to", kTargets, request.target, "The encoding to write")
-      ->required()
-      ->type_name("ENCODING")
-      ->group("Output");
-  AddEncodingOption(options, request.encoding);
+void AddOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Output");
+  commandLine.AddValue(
+      {.names = "-o,--output", .text = "Write to FILE", .value = "FILE", .isRequired = true},
+      request.output);
+  commandLine.AddChoice<TextEncoding>(
+      {.names = "--to", .text = "The encoding to write", .value = "ENCODING", .isRequired = true},
+      {{"utf-8", TextEncoding::kUTF8},
+       {"utf-16le", TextEncoding::kUTF16LE},
+       {"utf-16be", TextEncoding::kUTF16BE},
+       {"code-page", TextEncoding::kCodePage}},
+      request.target);
+  commandLine.BeginGroup("Dictionaries");
+  AddEncodingOption(commandLine, request.encoding);
 }
 
 // With its line end, which CR LF is one of.
@@ -129,10 +126,7 @@ std::string BytesOf(Units units, bool isBigEndian) {
 class Encoder {
  public:
   Encoder(const std::string& fileName, TextEncoding targetEncoding)
-      : name(Printable(fileName)), target(targetEncoding) {
-    if (target == TextEncoding::kUTF16LE) text = "\xFF\xFE";
-    if (target == TextEncoding::kUTF16BE) text = "\xFE\xFF";
-  }
+      : name(Printable(fileName)), target(targetEncoding), text(UTF16Mark(targetEncoding)) {}
 
   void Append(Units line) {
     ++lineNumber;
@@ -195,7 +189,7 @@ ExitStatus Convert(const Request& request) {
 ExitStatus RunConvert(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane convert", "INPUT -o OUT --to ENCODING", kAbout);
-  AddOptions(commandLine.Options(), request);
+  AddOptions(commandLine, request);
   request.input = OneFile(commandLine.Parse(argc, argv));
   return Convert(request);
 }

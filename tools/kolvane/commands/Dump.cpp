@@ -43,12 +43,14 @@ struct Request {
   bool utf16 = false;
 };
 
-void AddOptions(CLI::App& options, Request& request) {
-  options.add_flag("--sort", request.sort, "In the order of the keys, not of the file")
-      ->group("Output");
-  options.add_flag("--utf-16", request.utf16, "In UTF-16, not UTF-8")->group("Output");
-  options.add_flag("--json", request.json, "As JSON, in UTF-8")->group("Output");
-  AddEncodingOption(options, request.encoding);
+void AddOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Output");
+  commandLine.AddFlag({.names = "--sort", .text = "In the order of the keys, not of the file"},
+                      request.sort);
+  commandLine.AddFlag({.names = "--utf-16", .text = "In UTF-16, not UTF-8"}, request.utf16);
+  commandLine.AddFlag({.names = "--json", .text = "As JSON, in UTF-8"}, request.json);
+  commandLine.BeginGroup("Dictionaries");
+  AddEncodingOption(commandLine, request.encoding);
 }
 
 Entries EntriesOf(const Request& request, DictionaryTable& table, const ImageFile& file) {
@@ -105,7 +107,7 @@ class TextDump {
   static constexpr size_t kLeastUnits = tovali_private::kBinaryMagic.size();
 
   void Write(const std::vector<uint16_t>& units) {
-    if (utf16 && unitCount == 0) WriteOutput("\xFF\xFE");
+    if (utf16 && unitCount == 0) WriteOutput(UTF16Mark(TextEncoding::kUTF16LE));
     unitCount += units.size();
     utf16 ? WriteOutput({reinterpret_cast<const char*>(units.data()), units.size() * 2})
           : WriteOutput(ToUTF8(units));
@@ -177,7 +179,7 @@ ExitStatus Dump(const Request& request) {
 ExitStatus RunDump(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane dump", "IMAGE", kAbout);
-  AddOptions(commandLine.Options(), request);
+  AddOptions(commandLine, request);
   request.file = OneFile(commandLine.Parse(argc, argv));
   if (request.json && request.utf16) throw UsageError("--json is in UTF-8");
   return Dump(request);

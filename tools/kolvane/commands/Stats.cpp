@@ -1,13 +1,11 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <map>
 #include <optional>
 #include <string>
 #include <utility>
 #include <vector>
 
-#include "tools/kolvane/cli/ChoiceOption.h"
 #include "tools/kolvane/cli/CommandLine.h"
 #include "tools/kolvane/commands/Commands.h"
 #include "tools/kolvane/commands/EncodingOption.h"
@@ -47,23 +45,26 @@ struct Request {
   Format format = WriteTextReport;
 };
 
-void AddOptions(CLI::App& options, Request& request) {
-  static const std::map<std::string, Format> kFormats = {{"text", WriteTextReport},
-                                                         {"json", WriteJSONReport},
-                                                         {"csv", WriteCSVReport},
-                                                         {"html", WriteHTMLReport}};
-  options.add_option("--reference", request.reference, "Compare with FILE, the original texts")
-      ->type_name("FILE")
-      ->group("Comparison");
-  options
-      .add_option("--fail-under", request.failUnder,
-                  "Status 1 where less than PERCENT is translated; identical texts count as not")
-      ->type_name("PERCENT")
-      ->group("Comparison");
-  AddChoice(options, "--format", kFormats, request.format, "The form of the report, else text")
-      ->type_name("FORMAT")
-      ->group("Output");
-  AddEncodingOption(options, request.encoding);
+void AddOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Comparison");
+  commandLine.AddValue(
+      {.names = "--reference", .text = "Compare with FILE, the original texts", .value = "FILE"},
+      request.reference);
+  commandLine.AddValue(
+      {.names = "--fail-under",
+       .text = "Status 1 where less than PERCENT is translated; identical texts count as not",
+       .value = "PERCENT"},
+      request.failUnder);
+  commandLine.BeginGroup("Output");
+  commandLine.AddChoice<Format>(
+      {.names = "--format", .text = "The form of the report, else text", .value = "FORMAT"},
+      {{"text", WriteTextReport},
+       {"json", WriteJSONReport},
+       {"csv", WriteCSVReport},
+       {"html", WriteHTMLReport}},
+      request.format);
+  commandLine.BeginGroup("Dictionaries");
+  AddEncodingOption(commandLine, request.encoding);
 }
 
 void CheckRequest(Request& request) {
@@ -139,7 +140,7 @@ class Counting {
 ExitStatus RunStats(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane stats", "FILE...", kAbout);
-  AddOptions(commandLine.Options(), request);
+  AddOptions(commandLine, request);
   request.files = commandLine.Parse(argc, argv);
   CheckRequest(request);
   return Counting(request).Run();

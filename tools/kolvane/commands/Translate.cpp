@@ -52,25 +52,28 @@ struct Request {
   std::vector<std::string> keys;
 };
 
-void AddOptions(CLI::App& options, Request& request) {
-  const auto addFiles = [&](const char* name, std::vector<std::string>& files, const char* text) {
-    options.add_option(name, files, text)
-        ->type_name("FILE")
-        ->allow_extra_args(false)
-        ->group("Dictionaries");
-  };
-  addFiles("--dictionary", request.dictionaries,
-           "Look keys up in FILE; of several, the later wins");
-  addFiles("--default-dictionary", request.defaultDictionaries,
-           "Look up in FILE what the dictionaries lack");
-  AddEncodingOption(options, request.encoding);
-  options.add_flag("--nul", request.nul, "Keys and translations end in NUL, not in a line end")
-      ->group("Input and output");
-  options.add_flag("--trace", request.trace, "Print the calls to the kernel on standard error")
-      ->group("Kernel");
-  options.add_option("--plugin", request.plugIn, "Translate with the plug-in FILE")
-      ->type_name("FILE")
-      ->group("Kernel");
+void AddOptions(CommandLine& commandLine, Request& request) {
+  commandLine.BeginGroup("Dictionaries");
+  commandLine.AddValues({.names = "--dictionary",
+                         .text = "Look keys up in FILE; of several, the later wins",
+                         .value = "FILE"},
+                        request.dictionaries);
+  commandLine.AddValues({.names = "--default-dictionary",
+                         .text = "Look up in FILE what the dictionaries lack",
+                         .value = "FILE"},
+                        request.defaultDictionaries);
+  AddEncodingOption(commandLine, request.encoding);
+  commandLine.BeginGroup("Input and output");
+  commandLine.AddFlag(
+      {.names = "--nul", .text = "Keys and translations end in NUL, not in a line end"},
+      request.nul);
+  commandLine.BeginGroup("Kernel");
+  commandLine.AddFlag(
+      {.names = "--trace", .text = "Print the calls to the kernel on standard error"},
+      request.trace);
+  commandLine.AddValue(
+      {.names = "--plugin", .text = "Translate with the plug-in FILE", .value = "FILE"},
+      request.plugIn);
 }
 
 // Standard input is read once: for one dictionary, or for the keys.
@@ -204,7 +207,7 @@ ExitStatus Translate(const Request& request) {
 ExitStatus RunTranslate(int argc, const char* const* argv) {
   Request request;
   CommandLine commandLine("kolvane translate", "[KEY]...", kAbout);
-  AddOptions(commandLine.Options(), request);
+  AddOptions(commandLine, request);
   request.keys = commandLine.Parse(argc, argv);
   CheckStandardInput(request);
   if (request.keys.empty() && platform::StandardInputIsTerminal()) {

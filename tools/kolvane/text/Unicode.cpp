@@ -51,6 +51,12 @@ std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian) {
   return units;
 }
 
+std::string_view UTF16Mark(TextEncoding encoding) noexcept {
+  if (encoding == TextEncoding::kUTF16LE) return "\xFF\xFE";
+  if (encoding == TextEncoding::kUTF16BE) return "\xFE\xFF";
+  return {};
+}
+
 std::string KeyText(std::string_view key) {
   if (IsValidUTF8(key)) return std::string(key);
   std::vector<uint16_t> units;

@@ -7,6 +7,8 @@
 #include <string_view>
 #include <vector>
 
+#include "kolvane/lib/LoadStatus.h"
+
 // Damaged text is replaced as translations replace it. Throws OVErrException where the text or the
 // result has more than 2^31 - 1 bytes or units.
 std::string ToUTF8(std::span<const uint16_t> units);
@@ -23,6 +25,9 @@ std::vector<uint16_t> UnitsOf(std::span<const uint8_t> bytes);
 
 // The units of UTF-16 in either byte order.
 std::vector<uint16_t> DecodedUTF16(std::string_view text, bool isBigEndian);
+
+// The byte-order mark that begins text in UTF-16; empty for other encodings.
+std::string_view UTF16Mark(TextEncoding encoding) noexcept;
 
 // A key, which is bytes, to be shown: as it is where it is UTF-8, else with a character for each
 // byte.

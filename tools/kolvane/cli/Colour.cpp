@@ -1,4 +1,4 @@
-#include "tools/kolvane/cli/ColourChoice.h"
+#include "tools/kolvane/cli/Colour.h"
 
 #include <cstdlib>
 #include <string_view>
@@ -22,4 +22,14 @@ bool WantsColour(ColourChoice choice) {
   if (!Variable("NO_COLOR").empty()) return false;
   const std::string_view force = Variable("CLICOLOR_FORCE");
   return shown || (!force.empty() && force != "0");
+}
+
+void AddColourOption(CommandLine& commandLine, ColourChoice& choice) {
+  commandLine.AddChoice<ColourChoice>({.names = "--color",
+                                       .text = "When the text has colours (auto, unless told)",
+                                       .value = "WHEN"},
+                                      {{"auto", ColourChoice::kAuto},
+                                       {"always", ColourChoice::kAlways},
+                                       {"never", ColourChoice::kNever}},
+                                      choice);
 }
