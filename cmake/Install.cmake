@@ -59,6 +59,7 @@ add_public_headers(
   wrapper-framework/source/ReportedCheck.h
   wrapper-framework/source/ResultCodes.h
   # Kolvane::Dictionary
+  kolvane/lib/CodePageSelector.h
   kolvane/lib/KolvaneDictionary.h
   kolvane/lib/KolvaneString.h
   kolvane/lib/LoadStatus.h

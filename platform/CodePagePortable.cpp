@@ -8,6 +8,7 @@
 #include <type_traits>
 
 #include "platform/CodePage.h"
+#include "platform/Unicode.h"
 
 namespace platform {
 namespace {
@@ -93,8 +94,6 @@ bool Walk(const Unit* text, size_t count, Sink& sink, Codec codec) noexcept {
 
 // UTF-8 to UTF-16.
 
-constexpr char32_t kReplacementCharacter = 0xFFFD;
-
 // How many bytes follow a lead byte, and what the first of them may be; the others are 80 to BF.
 struct Lead {
   uint8_t following;
@@ -158,13 +157,6 @@ constexpr auto kFromUTF8 = [](const char* text, size_t left, auto& sink) -> size
 
 // UTF-16 to UTF-8.
 
-constexpr bool IsHighSurrogate(uint16_t unit) noexcept {
-  return (unit & 0xFC00) == 0xD800;
-}
-constexpr bool IsLowSurrogate(uint16_t unit) noexcept {
-  return (unit & 0xFC00) == 0xDC00;
-}
-
 constexpr char Continuation(char32_t bits) noexcept {
   return static_cast<char>(0x80 | (bits & 0x3F));
 }
@@ -191,8 +183,7 @@ constexpr auto kToUTF8 = [](const uint16_t* units, size_t left, auto& sink) -> s
     const char32_t offset = ((unit & 0x3FFu) << 10) | (units[1] & 0x3FFu);
     return PutUTF8(0x10000 + offset, sink) ? 2 : 0;
   }
-  const bool unpaired = IsHighSurrogate(unit) || IsLowSurrogate(unit);
-  return PutUTF8(unpaired ? kReplacementCharacter : unit, sink) ? 1 : 0;
+  return PutUTF8(IsSurrogate(unit) ? kReplacementCharacter : unit, sink) ? 1 : 0;
 };
 
 // windows-1252.

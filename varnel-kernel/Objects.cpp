@@ -52,7 +52,7 @@ Objects::Objects(HandleTable& handleTable, TokenTable& tokenTable, Values& value
       tokens(tokenTable),
       values(valueStore),
       running(innermostCode),
-      objectDied(tokenTable.TokenOf("message:orvane.vrk.object-died")) {}
+      objectDied(tokenTable.TokenOf(kVRKMessageObjectDied)) {}
 
 VRKResult Objects::Create(VRKToken objectClass, VRKDictionary parameters, VRKObject& outObject) {
   if (objectClass == VRKToken{}) return CreatePlain(objectClass, outObject);

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "platform/CodePage.h"
+#include "platform/Unicode.h"
 
 namespace varnel_kernel {
 namespace {
@@ -16,10 +17,6 @@ namespace {
 static_assert(std::endian::native == std::endian::little);
 
 using Units = std::vector<uint16_t>;
-
-constexpr uint16_t kMark = 0xFEFF;
-constexpr uint16_t kSwappedMark = 0xFFFE;
-constexpr uint16_t kReplacement = 0xFFFD;
 
 int CheckedCount(size_t count) {
   if (count > std::numeric_limits<int>::max()) throw std::bad_alloc();
@@ -31,7 +28,7 @@ std::string_view TextOf(Data& data) {
 }
 
 Units FromUTF8(std::string_view text) {
-  if (text.starts_with("\xEF\xBB\xBF")) text.remove_prefix(3);
+  if (text.starts_with(platform::kBOMUTF8)) text.remove_prefix(platform::kBOMUTF8.size());
   const int byteCount = CheckedCount(text.size());
   const int unitCount =
       platform::MultiByteToWideChar(platform::kCodePageUTF8, 0, text.data(), byteCount, nullptr, 0);
@@ -42,17 +39,18 @@ Units FromUTF8(std::string_view text) {
 }
 
 void SwapBytes(Units& units) {
-  for (uint16_t& unit : units) unit = static_cast<uint16_t>(unit << 8 | unit >> 8);
+  for (uint16_t& unit : units) unit = platform::SwapBytes(unit);
 }
 
 void ReplaceUnpaired(Units& units) {
-  const auto isHigh = [](uint16_t unit) { return (unit & 0xFC00) == 0xD800; };
-  const auto isLow = [](uint16_t unit) { return (unit & 0xFC00) == 0xDC00; };
   for (size_t i = 0; i < units.size(); ++i) {
-    if (isHigh(units[i]) && i + 1 < units.size() && isLow(units[i + 1])) {
+    if (!platform::IsSurrogate(units[i])) continue;
+    const bool isPaired = platform::IsHighSurrogate(units[i]) && i + 1 < units.size() &&
+                          platform::IsLowSurrogate(units[i + 1]);
+    if (isPaired) {
       ++i;
-    } else if (isHigh(units[i]) || isLow(units[i])) {
-      units[i] = kReplacement;
+    } else {
+      units[i] = platform::kReplacementCharacter;
     }
   }
 }
@@ -60,11 +58,13 @@ void ReplaceUnpaired(Units& units) {
 Units FromUTF16(std::string_view bytes, bool bigEndian, bool marked) {
   Units units(bytes.size() / 2);
   std::copy_n(bytes.data(), units.size() * 2, reinterpret_cast<char*>(units.data()));
-  const bool swappedMark = marked && !units.empty() && units.front() == kSwappedMark;
+  const bool swappedMark =
+      marked && !units.empty() && units.front() == platform::SwapBytes(platform::kByteOrderMark);
   if (bigEndian || swappedMark) SwapBytes(units);
-  if (marked && !units.empty() && units.front() == kMark) units.erase(units.begin());
+  if (marked && !units.empty() && units.front() == platform::kByteOrderMark)
+    units.erase(units.begin());
   ReplaceUnpaired(units);
-  if (bytes.size() % 2 != 0) units.push_back(kReplacement);
+  if (bytes.size() % 2 != 0) units.push_back(platform::kReplacementCharacter);
   return units;
 }
 
@@ -89,10 +89,10 @@ std::unique_ptr<Data> MakeUTF16(VRKToken type, const Units& units) {
 }  // namespace
 
 TextCoercion::TextCoercion(TokenTable& tokens)
-    : utf8(tokens.TokenOf("type:orvane.vrk.utf8")),
-      utf16le(tokens.TokenOf("type:orvane.vrk.utf16le")),
-      utf16be(tokens.TokenOf("type:orvane.vrk.utf16be")),
-      utf16(tokens.TokenOf("type:orvane.vrk.utf16")) {}
+    : utf8(tokens.TokenOf(kVRKTypeUTF8)),
+      utf16le(tokens.TokenOf(kVRKTypeUTF16LE)),
+      utf16be(tokens.TokenOf(kVRKTypeUTF16BE)),
+      utf16(tokens.TokenOf(kVRKTypeUTF16)) {}
 
 std::unique_ptr<Data> TextCoercion::Coerce(Data& source, VRKToken toType) const {
   const auto from = EncodingOf(source.type);
@@ -103,7 +103,7 @@ std::unique_ptr<Data> TextCoercion::Coerce(Data& source, VRKToken toType) const 
                     ? FromUTF8(text)
                     : FromUTF16(text, from == Encoding::kUTF16BE, from == Encoding::kUTF16);
   if (to == Encoding::kUTF8) return MakeUTF8(toType, units);
-  if (to == Encoding::kUTF16) units.insert(units.begin(), kMark);
+  if (to == Encoding::kUTF16) units.insert(units.begin(), platform::kByteOrderMark);
   if (to == Encoding::kUTF16BE) SwapBytes(units);
   return MakeUTF16(toType, units);
 }

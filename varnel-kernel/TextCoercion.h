@@ -13,8 +13,7 @@ namespace varnel_kernel {
 //
 // - Malformed UTF-8, an unpaired surrogate and an odd last byte each become U+FFFD.
 // - A byte-order mark at the start of utf8 and utf16 text is consumed. For utf16 it selects the
-// byte
-//   order, which is little-endian without one. In utf16le and utf16be it is a character.
+//   byte order, which is little-endian without one. In utf16le and utf16be it is a character.
 // - utf16 data is produced in little-endian order with a byte-order mark.
 class TextCoercion {
  public:

@@ -47,9 +47,9 @@ void Dictionary::ReleaseReferences(Values& values) noexcept {
 }
 
 Values::Values(HandleTable& handleTable, TokenTable& tokenTable)
-    : tokenType(tokenTable.TokenOf("type:orvane.vrk.token")),
-      listType(tokenTable.TokenOf("type:orvane.vrk.list")),
-      dictionaryType(tokenTable.TokenOf("type:orvane.vrk.dictionary")),
+    : tokenType(tokenTable.TokenOf(kVRKTypeToken)),
+      listType(tokenTable.TokenOf(kVRKTypeList)),
+      dictionaryType(tokenTable.TokenOf(kVRKTypeDictionary)),
       handles(handleTable),
       tokens(tokenTable) {}
 

@@ -8,6 +8,7 @@
 #include "kolvane/lib/Converters.h"
 #include "kolvane/lib/DictionaryReader.h"
 #include "kolvane/lib/LittleEndian.h"
+#include "platform/Unicode.h"
 
 namespace tovali_private {
 namespace {
@@ -299,7 +300,7 @@ const int* SelectorFor(TextEncoding encoding) noexcept {
 
 bool IsBinary(std::string_view image) noexcept {
   const bool isMarked = EncodingByMark(image) != TextEncoding::kCodePage;
-  return image.substr(isMarked ? 2 : 0).starts_with(kBinaryMagic);
+  return image.substr(isMarked ? platform::kBOMUTF16LE.size() : 0).starts_with(kBinaryMagic);
 }
 
 ParsedImage ParseBinary(InputStream& image) {

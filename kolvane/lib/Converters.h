@@ -1,7 +1,5 @@
-// Conversion between UTF-16 and multibyte text, in the code page that a selector names.
-//
-// A code-page selector is a pointer to an int: 1 selects UTF-8; a null pointer or any other value
-// selects the system's default code page.
+// Conversion between UTF-16 and multibyte text, in the code page that a selector names
+// (CodePageSelector.h).
 //
 // Lengths are in code units for UTF-16 and in bytes for multibyte text; no text needs a terminator.
 // Damaged text is replaced, not refused (platform/CodePage.h says with what).
@@ -10,14 +8,13 @@
 #include <cstddef>
 #include <cstdint>
 
+#include "kolvane/lib/CodePageSelector.h"
 #include "kolvane/lib/GrowableBuffer.h"
 
 namespace tovali_private {
 
 // The selector that stands in for a missing one; itself missing, and so the default code page.
 inline constexpr const int* kDefaultSelector = nullptr;
-
-inline constexpr int kUTF8Selector = 1;
 
 uint32_t CodePageFor(const int* selector) noexcept;
 

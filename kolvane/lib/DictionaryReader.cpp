@@ -5,28 +5,26 @@
 #include "kolvane/lib/Converters.h"
 #include "kolvane/lib/LittleEndian.h"
 #include "kolvane/lib/Scan.h"
+#include "kolvane/lib/TextSyntax.h"
+#include "platform/Unicode.h"
 
 namespace tovali_private {
 namespace {
 
-// What ends a line, and the zero that ends the input too.
-using UnicodeEnds = UnitSet<0, 0x000A, 0x000D, 0x2028, 0x2029>;
-using MultibyteEnds = UnitSet<0, 0x0A, 0x0D>;
-
-constexpr uint16_t Swapped(uint16_t unit) noexcept {
-  return static_cast<uint16_t>(unit << 8 | unit >> 8);
-}
+// A zero ends a line as a line end does, and the input too if the line is empty.
+using UnicodeEnds = UnitSet<0, '\n', '\r', kLineSeparatorUnit, kParagraphSeparatorUnit>;
+using MultibyteEnds = UnitSet<0, '\n', '\r'>;
 
 }  // namespace
 
 TextEncoding EncodingByMark(std::string_view image) noexcept {
-  if (image.starts_with("\xFF\xFE")) return TextEncoding::kUTF16LE;
-  if (image.starts_with("\xFE\xFF")) return TextEncoding::kUTF16BE;
+  if (image.starts_with(platform::kBOMUTF16LE)) return TextEncoding::kUTF16LE;
+  if (image.starts_with(platform::kBOMUTF16BE)) return TextEncoding::kUTF16BE;
   return TextEncoding::kCodePage;
 }
 
 std::unique_ptr<DictionaryReader> DictionaryReader::Create(InputStream* stream) {
-  uint8_t mark[2] = {};
+  uint8_t mark[platform::kBOMUTF16LE.size()] = {};
   uint32_t count = sizeof mark;
   ReadStreamBytes(stream, mark, count);
   switch (EncodingByMark({reinterpret_cast<const char*>(mark), count})) {
@@ -76,7 +74,7 @@ void UnicodeReader::TakeBufferedUnits() {
     const auto buffered = Buffered();
     const std::span<uint16_t> block = line.Extend(std::min(buffered.size() / 2, kBlock));
     std::copy_n(buffered.data(), block.size_bytes(), reinterpret_cast<uint8_t*>(block.data()));
-    if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), Swapped);
+    if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), platform::SwapBytes);
     const size_t run = UnicodeEnds::RunBefore(std::span<const uint16_t>(block));
     line.SetLength(line.Length() - static_cast<uint32_t>(block.size() - run));
     Consume(2 * run);
@@ -94,7 +92,7 @@ bool UnicodeReader::ReadChar(uint16_t& unit) {
 
 bool ByteSwapUnicodeReader::ReadChar(uint16_t& unit) {
   const bool ended = UnicodeReader::ReadChar(unit);
-  unit = Swapped(unit);
+  unit = platform::SwapBytes(unit);
   return ended;
 }
 

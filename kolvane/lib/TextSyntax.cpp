@@ -115,8 +115,8 @@ LineObstacle ObstacleIn(Units value) noexcept {
     switch (value.front()) {
       case 0:
         return LineObstacle::kZeroCharacter;
-      case 0x2028:
-      case 0x2029:
+      case kLineSeparatorUnit:
+      case kParagraphSeparatorUnit:
         return LineObstacle::kLineSeparator;
       case '#':
         if (MatchNamedCharacter(value) != nullptr) return LineObstacle::kNamedCharacter;

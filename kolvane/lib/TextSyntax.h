@@ -36,6 +36,10 @@ std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept
 extern template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noexcept;
 extern template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
+// The line ends of UTF-16 text beside line feed and carriage return.
+inline constexpr uint16_t kLineSeparatorUnit = 0x2028;
+inline constexpr uint16_t kParagraphSeparatorUnit = 0x2029;
+
 // What can begin something that Unescape decodes.
 using EscapeStarts = UnitSet<'^', '\\', '#'>;
 

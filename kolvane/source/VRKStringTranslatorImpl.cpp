@@ -2,6 +2,7 @@
 
 #include <cstring>
 
+#include "kolvane/lib/CodePageSelector.h"
 #include "kolvane/lib/TranslatedString.h"
 #include "kolvane/source/VRKDefaultStringTranslator.h"
 #include "wrapper-framework/source/Exceptions.h"
@@ -9,7 +10,8 @@
 namespace Varnel::LocalizableStrings {
 namespace {
 
-constexpr uint32_t kMostBytes = 0x7FFFFFFF;
+// Images are whole units; bytes may be one more.
+constexpr uint32_t kMostBytes = kMostImageBytes + 1;
 
 }  // namespace
 
@@ -26,14 +28,13 @@ void StringTranslatorImpl::SetTranslations(const char* bytes, uint32_t byteCount
 }
 
 void StringTranslatorImpl::SetTranslations(const uint16_t* units, uint32_t unitCount) {
-  if (unitCount > kMostBytes / 2) throw InvariantViolation();
+  if (unitCount > kMostImageBytes / 2) throw InvariantViolation();
   SetTranslations(reinterpret_cast<const char*>(units), unitCount * 2);
 }
 
 void StringTranslatorImpl::TranslateString(const char* key, uint32_t,
                                            std::vector<uint16_t>& result) {
-  constexpr int kUTF8 = 1;
-  const TranslatedString translation = dictionary.Translate(key, &kUTF8);
+  const TranslatedString translation = dictionary.Translate(key, &kUTF8Selector);
   const uint32_t size = translation.BufferSize();
   result.resize(size);
   translation.CopyTo(result.data(), size, true);

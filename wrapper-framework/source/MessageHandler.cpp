@@ -14,7 +14,7 @@ bool gObjectDiedIsMissing = true;
 
 void MakeObjectDied() {
   if (!gObjectDiedIsMissing) return;
-  gObjectDied = MakeToken("message:orvane.vrk.object-died");
+  gObjectDied = MakeToken(kVRKMessageObjectDied);
   gObjectDiedIsMissing = false;
 }
 

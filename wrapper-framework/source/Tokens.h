@@ -6,18 +6,17 @@
 
 namespace Varnel {
 
-// Payloads: text as bytes or 16-bit units, without terminator; a double, 8 bytes; a bool, 1 byte
-// that is not 0 for true; a token or handle, 4 bytes.
-inline constexpr char kTypeUTF8[] = "type:orvane.vrk.utf8";
-inline constexpr char kTypeUTF16[] = "type:orvane.vrk.utf16";  // units in memory's byte order
-inline constexpr char kTypeUTF16LE[] = "type:orvane.vrk.utf16le";
-inline constexpr char kTypeUTF16BE[] = "type:orvane.vrk.utf16be";
-inline constexpr char kTypeDouble[] = "type:orvane.vrk.double";
-inline constexpr char kTypeBool[] = "type:orvane.vrk.bool";
-inline constexpr char kTypeNull[] = "type:orvane.vrk.null";
-inline constexpr char kTypeToken[] = "type:orvane.vrk.token";
-inline constexpr char kTypeList[] = "type:orvane.vrk.list";
-inline constexpr char kTypeDictionary[] = "type:orvane.vrk.dictionary";
+// VarnelKernel.h describes their payloads.
+inline constexpr char kTypeUTF8[] = kVRKTypeUTF8;
+inline constexpr char kTypeUTF16[] = kVRKTypeUTF16;
+inline constexpr char kTypeUTF16LE[] = kVRKTypeUTF16LE;
+inline constexpr char kTypeUTF16BE[] = kVRKTypeUTF16BE;
+inline constexpr char kTypeDouble[] = kVRKTypeDouble;
+inline constexpr char kTypeBool[] = kVRKTypeBool;
+inline constexpr char kTypeNull[] = kVRKTypeNull;
+inline constexpr char kTypeToken[] = kVRKTypeToken;
+inline constexpr char kTypeList[] = kVRKTypeList;
+inline constexpr char kTypeDictionary[] = kVRKTypeDictionary;
 
 // Returns the token of a text, which is borrowed for the call.
 VRKToken MakeToken(const char* text);

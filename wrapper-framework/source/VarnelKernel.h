@@ -51,6 +51,22 @@ typedef uint32_t VRKResult;
 #define kVRKNotHandled UINT32_C(256)
 #define kVRKCannotCoerce UINT32_C(512)
 
+/* Data types. Payloads: text as bytes or 16-bit units, without terminator; a double, 8 bytes; a
+ * bool, 1 byte that is not 0 for true; a token or handle, 4 bytes. */
+#define kVRKTypeUTF8 "type:orvane.vrk.utf8"
+#define kVRKTypeUTF16 "type:orvane.vrk.utf16" /* units in memory's byte order */
+#define kVRKTypeUTF16LE "type:orvane.vrk.utf16le"
+#define kVRKTypeUTF16BE "type:orvane.vrk.utf16be"
+#define kVRKTypeDouble "type:orvane.vrk.double"
+#define kVRKTypeBool "type:orvane.vrk.bool"
+#define kVRKTypeNull "type:orvane.vrk.null"
+#define kVRKTypeToken "type:orvane.vrk.token"
+#define kVRKTypeList "type:orvane.vrk.list"
+#define kVRKTypeDictionary "type:orvane.vrk.dictionary"
+
+/* The message that an object's handlers receive when its last reference is released. */
+#define kVRKMessageObjectDied "message:orvane.vrk.object-died"
+
 #ifdef __cplusplus
 enum class VRKObject : uint32_t {};
 enum class VRKMessageHandler : uint32_t {};

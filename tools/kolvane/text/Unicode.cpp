@@ -8,8 +8,6 @@
 #include "kolvane/lib/LittleEndian.h"
 #include "tools/kolvane/text/UTF8.h"
 
-using tovali_private::kUTF8Selector;
-
 std::string ToMultiByte(std::span<const uint16_t> units, const int* selector) {
   const int size = tovali_private::CountMultiByte(units.data(), units.size(), selector);
   std::string text(static_cast<size_t>(size), '\0');
