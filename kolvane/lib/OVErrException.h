@@ -1,14 +1,13 @@
-// The one exception that the dictionary library throws by itself, beside the allocation failures of
-// the standard library.
+// The exception of the dictionary library, which otherwise throws only std::bad_alloc.
 #pragma once
 
 #include <cstdint>
 
-// Four letters read as a big-endian number.
+// Four ASCII letters, as a big-endian number.
 inline constexpr uint32_t kErrorBufferTooSmall = 0x42554646;    // "BUFF"
 inline constexpr uint32_t kErrorConversionFailed = 0x6875683f;  // "huh?"
 
-// Holds an error code: one of the two above, or whatever other code a converter gave.
+// Carries one of the codes above, or another code of a converter.
 class OVErrException {
  public:
   explicit OVErrException(uint32_t errorCode) noexcept : code(errorCode) {}
