@@ -1,17 +1,19 @@
 // Conversion between UTF-16 and the multibyte text of a code page.
 //
-// Two code pages exist: UTF-8, and the system's own, which off Windows is windows-1252. On Windows
-// these functions are the system's; elsewhere a layer of ours keeps the same contract:
+// There are two code pages: UTF-8, and the system's own, which is windows-1252 on systems other
+// than Windows. On Windows these functions are the system's; elsewhere they are implemented here.
+// Contract:
 //
-// * flags must be 0; counts are positive (a text's terminator is not looked for); the text is not
+// * Requires: flags are 0, counts are positive (terminators are not searched for), the text is not
 //   null.
-// * capacity 0 asks for the size: the result is the number of units (or bytes) that the whole text
-//   needs, and the output, which may be null, is left alone.
-// * Otherwise the text is converted into the output, which holds `capacity` units (or bytes) and
-//   gets no terminator; the result is the number written.
-// * 0 means failure, and GetLastError tells why: kErrorInsufficientBuffer when the output is too
-//   small (what it then holds is not defined), kErrorInvalidParameter when a rule above is broken
-//   or the size does not fit an int.
+// * A capacity of 0 returns the number of units (or bytes) that the whole text needs; the output
+// may
+//   be null.
+// * Otherwise the text is converted into an output of `capacity` units (or bytes), without
+//   terminator. Returns the number written.
+// * Returns 0 on failure. GetLastError is then kErrorInsufficientBuffer if the output is too small
+//   (its contents are undefined), or kErrorInvalidParameter if a requirement is violated or the
+//   size does not fit an int.
 //
 // Ill-formed text never fails. In UTF-8 one U+FFFD replaces each of these:
 //
@@ -20,8 +22,8 @@
 // * a lead byte with a second byte of 80 to BF that it forbids (E0 80, and ED A0 in ED A0 80).
 //
 // Every well-formed sequence is converted. An unpaired surrogate becomes EF BF BD in UTF-8. The
-// bytes 81, 8D, 8F, 90 and 9D of windows-1252, which it leaves undefined, stand for the C1 control
-// of their value.
+// bytes 81, 8D, 8F, 90 and 9D, which windows-1252 leaves undefined, become the C1 controls of the
+// same value.
 //
 // Windows differs in two things:
 //
@@ -48,7 +50,7 @@ int MultiByteToWideChar(uint32_t codePage, uint32_t flags, const char* text, int
 int WideCharToMultiByte(uint32_t codePage, uint32_t flags, const uint16_t* units, int unitCount,
                         char* bytes, int capacity) noexcept;
 
-// The reason of the calling thread's latest failure; a success leaves it as it was.
+// Returns the reason of the calling thread's latest failure. Success does not change it.
 uint32_t GetLastError() noexcept;
 
 }  // namespace platform

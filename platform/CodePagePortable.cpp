@@ -1,6 +1,6 @@
-// The conversion layer for systems without code-page functions of their own. A text is walked once:
-// runs of ASCII go to a sink as they are, and a codec takes each other character. One sink counts,
-// the other writes.
+// Code-page conversion for systems without functions of their own. One pass over the text: runs of
+// ASCII go to a sink unchanged, every other character through a codec. One sink counts, the other
+// writes.
 #include <array>
 #include <cstddef>
 #include <cstring>
@@ -15,7 +15,7 @@ namespace {
 
 thread_local uint32_t gLastError = 0;
 
-// A sink takes what it is given whole and answers true, or takes nothing and answers false.
+// A sink takes all of its input and returns true, or nothing and returns false.
 struct Counter {
   template <class In>
   bool Put(const In*, size_t count) noexcept {
@@ -23,7 +23,7 @@ struct Counter {
     return true;
   }
 
-  // Puts for each byte the unit that stands for it.
+  // Puts the unit of each byte.
   template <class Units>
   bool PutAll(const char*, size_t count, const Units&) noexcept {
     total += count;
@@ -61,7 +61,7 @@ constexpr bool IsASCII(Unit unit) noexcept {
   return static_cast<std::make_unsigned_t<Unit>>(unit) < 0x80;
 }
 
-// How many units at the start of the text are ASCII, looked for eight bytes at a time.
+// Returns the number of leading ASCII units. Tests eight bytes at a time.
 template <class Unit>
 size_t ASCIIRun(const Unit* text, size_t count) noexcept {
   constexpr uint64_t kBeyondASCII = sizeof(Unit) == 1 ? 0x8080808080808080 : 0xFF80FF80FF80FF80;
@@ -76,8 +76,8 @@ size_t ASCIIRun(const Unit* text, size_t count) noexcept {
   return run;
 }
 
-// A codec converts the character at the start of a text, which is not ASCII, and answers how many
-// units it took, or 0 when the sink is full.
+// A codec converts the non-ASCII character at the start of a text and returns the number of units
+// consumed, or 0 if the sink is full.
 template <class Unit, class Sink, class Codec>
 bool Walk(const Unit* text, size_t count, Sink& sink, Codec codec) noexcept {
   for (size_t at = 0; at < count;) {

@@ -1,4 +1,4 @@
-// The system's own conversion, called as it is.
+// Forwards to the system's conversion.
 #include <windows.h>
 
 #include "platform/CodePage.h"

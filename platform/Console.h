@@ -1,4 +1,4 @@
-// What a command gets from the console that it is called from, and gives back.
+// The command line and the standard streams of a console program.
 #pragma once
 
 #include <string>
@@ -6,19 +6,20 @@
 
 namespace platform {
 
-// The words of the command line, in UTF-8, the command's own first. Takes what main was given.
+// Returns the arguments in UTF-8, beginning with the program's name. Takes the arguments of main.
 std::vector<std::string> Arguments(int count, char** words);
 
 bool StandardInputIsTerminal() noexcept;
 
-// Whether standard output is a terminal that shows colours. A console that has to be told to show
-// them is told, until the program ends.
+// Whether standard output is a terminal that shows colours. Enables colours in a console that needs
+// it, until the program ends.
 bool StandardOutputShowsColour() noexcept;
 
-// Whether what failed last was a write to a pipe that nobody reads any more. To be asked at once.
+// Whether the latest failure was a write to a closed pipe. Requires: no other call since that
+// write.
 bool HitClosedPipe() noexcept;
 
-// From now on every byte passes the standard streams as it is, and a console takes it for UTF-8.
+// Sets the standard streams to binary mode, and a console to UTF-8, until the program ends.
 void SpeakUTF8() noexcept;
 
 }  // namespace platform

@@ -1,9 +1,9 @@
-// Stopping for whoever debugs.
+// Debugger breakpoints.
 #pragma once
 
 namespace platform {
 
-// Stops in the debugger, from where execution can go on. Without one the process ends.
+// Stops in the debugger, which can continue execution. Ends the process if there is no debugger.
 void BreakIntoDebugger() noexcept;
 
 }  // namespace platform

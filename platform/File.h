@@ -1,4 +1,4 @@
-// Files by their names in UTF-8.
+// Files with UTF-8 names.
 #pragma once
 
 #include <cstdio>

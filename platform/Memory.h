@@ -1,7 +1,5 @@
-// Memory from the system, for tables that are looked into all over.
-//
-// Where the system has huge pages, large memory is made of them: otherwise, beyond a few megabytes,
-// to find out where a page is takes longer than what is wanted of it.
+// Allocator for large tables with random access. Uses huge pages where the system has them, to save
+// TLB misses.
 #pragma once
 
 #include <cstddef>
@@ -10,10 +8,10 @@ namespace platform {
 
 inline constexpr size_t kHugePage = size_t{1} << 21;
 
-// Aligned for any object. Null when there is none.
+// Aligned for any object. Returns null if there is no memory.
 void* AllocateMemory(size_t size) noexcept;
 
-// Frees what AllocateMemory returned for this size.
+// Frees memory that AllocateMemory returned for this size.
 void FreeMemory(void* memory, size_t size) noexcept;
 
 }  // namespace platform

@@ -12,12 +12,12 @@ constexpr size_t WholePages(size_t size) noexcept {
   return (size + kHugePage - 1) / kHugePage * kHugePage;
 }
 
-// Huge pages are for what fills them.
+// Whether at least eight ninths of the huge pages would be used.
 constexpr bool FillsHugePages(size_t size) noexcept {
   return size <= SIZE_MAX - 2 * kHugePage && WholePages(size) - size <= size / 8;
 }
 
-// They begin at multiples of their size.
+// Huge pages are aligned to their size: maps one more and unmaps the ends.
 void* MapHugePages(size_t size) noexcept {
   void* const mapped =
       mmap(nullptr, size + kHugePage, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);

@@ -4,7 +4,7 @@
 
 namespace platform {
 
-// Large pages need a privilege there that hosts do not have.
+// Large pages require a privilege on Windows that hosts do not have.
 void* AllocateMemory(size_t size) noexcept {
   return ::operator new(size, std::nothrow);
 }

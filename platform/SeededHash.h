@@ -1,5 +1,4 @@
-// A hash of texts from outside that differs from process to process. In std::hash, which is the
-// same in all of them, texts that collide are easy to make.
+// Per-process seeded hash for untrusted strings, against hash flooding.
 #pragma once
 
 #include <cstddef>
@@ -8,11 +7,11 @@
 
 namespace platform {
 
-// Random, and the same from one call to the next. Where the system has no random numbers, it is
-// what the time and the place of the process's memory make it.
+// The process's random seed. If the system has no random numbers, it is derived from the time and a
+// memory address.
 uint64_t ProcessSeed() noexcept;
 
-// For hash tables, whose maker need not know the seed.
+// A hash function for hash tables.
 struct SeededHash {
   using is_avalanching = void;
 

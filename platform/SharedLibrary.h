@@ -1,7 +1,7 @@
-// Loading libraries while a program runs.
+// Loading of shared libraries at run time.
 //
-// All functions take the system's loader lock, under which a library's constructors and destructors
-// run too. Callers hold no lock that such code may want.
+// All functions take the system's loader lock, under which constructors and destructors of
+// libraries run too. Requires: the caller holds no lock that such code takes.
 #pragma once
 
 #include <cstdint>
@@ -9,14 +9,14 @@
 
 namespace platform {
 
-// A loaded library; null for none.
+// A loaded library, or null.
 using SharedLibrary = void*;
 
-// Null when the library cannot be loaded; `reason` then says why, in the system's words.
+// Returns null and sets `reason` to the system's message if the library cannot be loaded.
 SharedLibrary LoadSharedLibrary(const char* path, std::string& reason);
 void UnloadSharedLibrary(SharedLibrary library) noexcept;
 
-// The address of a function that the library exports, or null.
+// Returns the address of an exported function, or null.
 void* FindFunction(SharedLibrary library, const char* name) noexcept;
 
 // The addresses from `begin` to just below `end`.
@@ -30,7 +30,8 @@ struct AddressRange {
   uintptr_t end;
 };
 
-// Where the library is in memory until it is unloaded; all addresses if the system does not say.
+// Returns the addresses of the library, valid until it is unloaded; all addresses if they are
+// unknown.
 AddressRange AddressesOf(SharedLibrary library) noexcept;
 
 }  // namespace platform

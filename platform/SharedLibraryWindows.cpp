@@ -6,7 +6,7 @@
 namespace platform {
 namespace {
 
-// Keeps the system from asking in a window what to do about a library that it cannot load.
+// Suppresses the system's error dialogs for libraries that cannot be loaded.
 class QuietErrors {
  public:
   QuietErrors() { ::SetThreadErrorMode(SEM_FAILCRITICALERRORS, &before); }
@@ -18,7 +18,7 @@ class QuietErrors {
   DWORD before = 0;
 };
 
-// The system would append an extension to a name that has none.
+// Appends a dot to a name without extension, so that the system appends none.
 std::wstring ExactName(const char* path) {
   std::wstring name = WideFromUTF8(path);
   const size_t last = name.find_last_of(L"/\\") + 1;

@@ -1,10 +1,10 @@
-// Requests from outside to end the program: signals, Ctrl-C, or a console that is closed.
+// Delays termination requests: signals, Ctrl-C, the closing of a console.
 #pragma once
 
 namespace platform {
 
-// While it lives, such a request waits; it takes effect right after. A program that is killed
-// outright (SIGKILL, TerminateProcess) is not protected. Requires: one at a time.
+// Termination requests take effect when the object is destroyed. It cannot delay SIGKILL or
+// TerminateProcess. Requires: one object at a time.
 class DelayedTermination {
  public:
   DelayedTermination() noexcept;

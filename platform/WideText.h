@@ -1,4 +1,4 @@
-// Texts of the system's wide functions.
+// Conversion for the system's wide-character functions.
 #pragma once
 
 #include <string>
@@ -6,7 +6,7 @@
 
 namespace platform {
 
-// Damaged text is replaced.
+// Ill-formed text is replaced.
 std::wstring WideFromUTF8(std::string_view text);
 std::string UTF8FromWide(std::wstring_view text);
 

@@ -21,10 +21,10 @@ struct Arena::Chunk {
 
   boost::local_shared_ptr<uint64_t> heldBytes;
   size_t size;
-  size_t holders;  // what was handed out, and the arena while this is its current chunk
+  size_t holders;  // reference count: live blocks, and the arena while this is its current chunk
 };
 
-// Stands before all that is handed out.
+// Precedes each block.
 struct Arena::Header {
   Chunk* chunk;
 };

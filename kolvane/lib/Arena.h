@@ -1,4 +1,4 @@
-// Memory for many small objects that are mostly made together and die together.
+// Bump allocation for many small objects that are created and freed together.
 #pragma once
 
 #include <boost/smart_ptr/local_shared_ptr.hpp>
@@ -7,31 +7,29 @@
 
 namespace tovali_private {
 
-// Hands memory out of chunks, in the order in which it lies there. A chunk is given back when all
-// that was handed out of it has been freed, which may be after the arena's own end; until then what
-// was freed is not used again. Chunks grow with what the arena has handed out, to two megabytes.
-//
-// An arena and all that it hands out stay on one thread at a time.
+// Bump allocator over refcounted chunks: a chunk is freed with its last block, even after the
+// arena. Freed blocks are not reused. Chunks grow with the bytes allocated, up to 2 MiB. Not
+// synchronised.
 class Arena {
  public:
-  Arena();  // throws std::bad_alloc
+  Arena();  // Throws: std::bad_alloc
   Arena(const Arena&) = delete;
   Arena& operator=(const Arena&) = delete;
   ~Arena() { Retire(); }
 
-  // Lets go of its own chunk and takes over the other's, which hands out nothing afterwards.
+  // `other` must not allocate again.
   Arena& operator=(Arena&& other) noexcept;
 
-  // Has the next chunk be large enough for this many bytes, as far as chunks become so large.
+  // Size hint for the next chunk, capped at the maximum chunk size.
   void Expect(uint64_t byteCount) noexcept;
 
-  // Aligned for pointers. Throws std::bad_alloc.
+  // Aligned for pointers. Throws: std::bad_alloc.
   void* Allocate(uint64_t size);
 
-  // The size of the chunks that are not given back yet.
+  // The size of all chunks that are not freed.
   uint64_t HeldBytes() const noexcept { return *heldBytes; }
 
-  // Gives back what any arena has handed out.
+  // Frees a block of any arena.
   static void Free(void* memory) noexcept;
 
  private:

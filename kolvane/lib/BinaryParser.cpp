@@ -298,8 +298,8 @@ const int* SelectorFor(TextEncoding encoding) noexcept {
   return encoding == TextEncoding::kUTF8 ? &kUTF8Selector : kDefaultSelector;
 }
 
-bool IsBinary(std::string_view image) noexcept {
-  const bool isMarked = EncodingByMark(image) != TextEncoding::kCodePage;
+bool HasBinaryMagic(std::string_view image) noexcept {
+  const bool isMarked = EncodingFromBOM(image) != TextEncoding::kCodePage;
   return image.substr(isMarked ? platform::kBOMUTF16LE.size() : 0).starts_with(kBinaryMagic);
 }
 

@@ -26,7 +26,7 @@ inline constexpr std::string_view kBinaryMagic = "Kolvane Binary Format";
 // Returns whether the image begins with the magic, optionally after a UTF-16 byte-order mark. A
 // load takes both for binary images. The latter is of no known version, because the header is read
 // from offset 0 all the same.
-bool IsBinary(std::string_view image) noexcept;
+bool HasBinaryMagic(std::string_view image) noexcept;
 
 // The contents of a binary image, up to where parsing stopped.
 struct ParsedImage {

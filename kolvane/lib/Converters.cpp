@@ -49,7 +49,7 @@ uint32_t UnicodeToMultiByteLength(const uint16_t* units, int unitCount, int* byt
                                   const int* selector) noexcept {
   const int needed =
       platform::WideCharToMultiByte(CodePageFor(selector), 0, units, unitCount, nullptr, 0);
-  // A text that needs every int there is leaves none for its terminator, and cannot be counted.
+  // INT_MAX bytes leave no room for the terminator in an int.
   *byteCount = needed < std::numeric_limits<int>::max() ? needed + 1 : 1;
   return 0;
 }
@@ -92,7 +92,7 @@ void ConvertToMultiByte(const uint16_t* units, size_t unitCount, char* bytes, in
   int written = 0;
   ThrowUnlessZero(gConverterTable.unicodeToMultiByte(units, CheckedCount(unitCount), bytes,
                                                      size - 1, &written, selector));
-  // With room for the terminator alone the converter has counted and not written.
+  // A capacity of 0 made the converter count instead of write.
   if (written > size - 1) throw OVErrException(kErrorBufferTooSmall);
   bytes[written] = 0;
 }

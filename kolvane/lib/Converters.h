@@ -1,8 +1,8 @@
 // Conversion between UTF-16 and multibyte text, in the code page that a selector names
 // (CodePageSelector.h).
 //
-// Lengths are in code units for UTF-16 and in bytes for multibyte text; no text needs a terminator.
-// Damaged text is replaced, not refused (platform/CodePage.h says with what).
+// Lengths are in code units for UTF-16 and in bytes for multibyte text. Input needs no terminator.
+// Ill-formed text is replaced as platform/CodePage.h says.
 #pragma once
 
 #include <cstddef>
@@ -13,27 +13,27 @@
 
 namespace tovali_private {
 
-// The selector that stands in for a missing one; itself missing, and so the default code page.
+// Used if no selector is given. It is null, which selects the default code page.
 inline constexpr const int* kDefaultSelector = nullptr;
 
 uint32_t CodePageFor(const int* selector) noexcept;
 
-// The four converters. They never throw: each returns 0, or kErrorBufferTooSmall when the output is
-// too small, or kErrorConversionFailed when the conversion fails for any other reason.
+// The four converters. Each returns 0, kErrorBufferTooSmall if the output is too small, or
+// kErrorConversionFailed for any other failure.
 
-// Never reports a failure: a text that cannot be counted counts as 0 units.
+// Never fails: a text that cannot be counted has 0 units.
 uint32_t MultiByteToUnicodeLength(const char* text, int byteCount, int* unitCount,
                                   const int* selector) noexcept;
 
-// A capacity of 0 counts and writes nothing, as it does on the platform.
+// A capacity of 0 writes nothing.
 uint32_t MultiByteToUnicode(const char* text, int byteCount, uint16_t* units, int unitCapacity,
                             const int* selector) noexcept;
 
-// Counts one byte more than the text needs, for a terminator. Never reports a failure.
+// Stores the number of bytes plus 1 for a terminator. Never fails.
 uint32_t UnicodeToMultiByteLength(const uint16_t* units, int unitCount, int* byteCount,
                                   const int* selector) noexcept;
 
-// *bytesWritten is to be read only after a success. A capacity of 0 counts and writes nothing.
+// *bytesWritten is valid only after success. A capacity of 0 writes nothing.
 uint32_t UnicodeToMultiByte(const uint16_t* units, int unitCount, char* bytes, int byteCapacity,
                             int* bytesWritten, const int* selector) noexcept;
 
@@ -44,25 +44,25 @@ struct ConverterTable {
   decltype(&UnicodeToMultiByte) unicodeToMultiByte;
 };
 
-// Every conversion of the library calls through this table; ASCII that stands for itself in every
-// code page may go without one.
+// Every conversion of the library calls through this table, except that of ASCII text, which is the
+// same in every code page.
 extern ConverterTable gConverterTable;
 
-// The guarded forms. They throw OVErrException with whatever non-zero code the converter returned,
-// and with kErrorConversionFailed for a text longer than 2^31 - 1.
+// The guarded forms. Throws: OVErrException with the converter's code if it is not 0, and with
+// kErrorConversionFailed for a text longer than 2^31 - 1.
 
 int CountUnicode(const char* text, size_t byteCount, const int* selector = kDefaultSelector);
 
-// Replaces what `units` held; no terminator is stored. When it throws, the buffer's length is the
-// counted one and its contents are undefined.
+// Replaces the contents of `units`, without terminator. If it throws, the buffer has the counted
+// length and undefined contents.
 void ConvertToUnicode(const char* text, size_t byteCount, UnicodeBuffer& units,
                       const int* selector = kDefaultSelector);
 
-// The bytes that ConvertToMultiByte needs, its terminator included.
+// Returns the number of bytes that ConvertToMultiByte needs, including the terminator.
 int CountMultiByte(const uint16_t* units, size_t unitCount, const int* selector = kDefaultSelector);
 
-// Stores the text and a terminating 0 byte in `size` bytes. A null buffer and one that is too small
-// throw kErrorBufferTooSmall.
+// Stores the text and a terminating 0 byte in `size` bytes. Throws: OVErrException with
+// kErrorBufferTooSmall if the buffer is null or too small.
 void ConvertToMultiByte(const uint16_t* units, size_t unitCount, char* bytes, int size,
                         const int* selector = kDefaultSelector);
 

@@ -1,4 +1,4 @@
-// What a dictionary's table holds: keys, and keys with their translations.
+// The items on a table's chains: keys, and entries with key and value.
 #pragma once
 
 #include <cstdint>
@@ -84,12 +84,10 @@ inline bool ByteRunKey::Equals(const HashItem& other) const noexcept {
 
 class DictionaryEntry;
 
-// The value of an entry, with the entry's key before it: all that a lookup looks into, side by
-// side.
+// The value of an entry, with its key stored before it, so that a lookup touches one block.
 class KeyedRun final : public ByteRunValue {
  public:
-  // Copies both. Goes with the last handle to it, of which there is none yet. Throws
-  // std::bad_alloc.
+  // Copies both. The initial reference count is 0. Throws: std::bad_alloc.
   static KeyedRun* Create(Arena& arena, std::span<const uint8_t> key,
                           std::span<const uint8_t> bytes);
 
@@ -104,15 +102,16 @@ class KeyedRun final : public ByteRunValue {
 
   const uint8_t* KeyBytes() const noexcept { return reinterpret_cast<const uint8_t*>(this + 1); }
 
-  uint32_t keyLength;  // fills the gap that the base leaves
+  uint32_t keyLength;  // in the padding after the base
 
  public:
-  DictionaryEntry* entry = nullptr;  // while there is one
+  DictionaryEntry* entry = nullptr;  // null after the entry is destroyed
 };
 
-// What lookups look into, apart from what they do not. It may end before what was made in it.
+// Separate arenas for hot data (keys and values) and cold data (entries). May be destroyed before
+// the objects allocated from it.
 struct EntryMemory {
-  // For entries from so many bytes of text, or as many of their own.
+  // Size hint: the bytes of the text or of the entries that will be allocated.
   void Expect(uint64_t byteCount) noexcept {
     runs.Expect(byteCount);
     entries.Expect(byteCount / 2);
@@ -134,7 +133,7 @@ class DictionaryEntry final : public ByteRunKey {
   static std::unique_ptr<DictionaryEntry> Create(EntryMemory& memory, const ByteRunKey& key,
                                                  std::span<const uint16_t> text);
 
-  // The same key and value, on no chain.
+  // Returns an entry with the same key and value, on no chain.
   std::unique_ptr<DictionaryEntry> CopyIn(EntryMemory& memory) const;
 
   ~DictionaryEntry() override { run.entry = nullptr; }
@@ -145,14 +144,13 @@ class DictionaryEntry final : public ByteRunKey {
   uint32_t WriteKey(OutputStream& out, bool binary, const int* selector) const override;
   uint32_t WriteValue(OutputStream& out, bool binary, const int* selector) const override;
 
-  // About what it was handed of its EntryMemory.
+  // Approximate bytes allocated from EntryMemory.
   uint64_t MemorySize() const noexcept;
 
   const KolvaneString& Value() const noexcept { return value; }
   KeyedRun& Run() const noexcept { return run; }
 
-  // The entry behind this one in its chain that has the same key and is found once this one is
-  // gone, or null. The table keeps it.
+  // The entry of the same key that this one shadows, or null. Maintained by the table.
   DictionaryEntry* hidden = nullptr;
 
  private:

@@ -1,4 +1,4 @@
-// The road of an image into a dictionary.
+// Loading images: format detection, text lines, and adoption of parsed binary images.
 #include <algorithm>
 #include <array>
 #include <utility>
@@ -20,15 +20,15 @@ namespace {
 
 using tovali_private::kBinaryMagic;
 
-enum class Recognised { kTooShort, kText, kBinary };
+enum class DetectedFormat { kTooShort, kText, kBinary };
 
 // Tests for the binary format, with the 21 bytes at the stream's position. Leaves the stream at its
 // start.
-Recognised Recognise(InputStream& image) {
+DetectedFormat DetectFormat(InputStream& image) {
   std::array<uint8_t, kBinaryMagic.size()> head{};
-  if (image.Read(head) < head.size()) return Recognised::kTooShort;
+  if (image.Read(head) < head.size()) return DetectedFormat::kTooShort;
   image.Rewind();
-  return std::ranges::equal(head, kBinaryMagic) ? Recognised::kBinary : Recognised::kText;
+  return std::ranges::equal(head, kBinaryMagic) ? DetectedFormat::kBinary : DetectedFormat::kText;
 }
 
 // Returns the damage at the end of a text image whose last line has been read.
@@ -58,16 +58,16 @@ class DictionaryTable::MoveAtEnd {
 void DictionaryTable::Load(InputStream& image) {
   lastLoad.Begin();
   const auto reader = DictionaryReader::Create(&image);
-  switch (Recognise(image)) {
-    case Recognised::kTooShort:
+  switch (DetectFormat(image)) {
+    case DetectedFormat::kTooShort:
       if (!image.HasFailed()) lastLoad.End({LoadDamage::kTooShort});
       break;
-    case Recognised::kText: {
+    case DetectedFormat::kText: {
       const MoveAtEnd moving(*this);
       LoadText(image, *reader);
       break;
     }
-    case Recognised::kBinary:
+    case DetectedFormat::kBinary:
       LoadBinary(image);
       break;
   }
@@ -108,9 +108,9 @@ void DictionaryTable::Adopt(StoredImage&& image) {
 }
 
 StoredLine DictionaryTable::StoreLine(std::span<const uint16_t> line) {
-  const auto split = tovali_private::SplitKolvane(tovali_private::EntryText(line));
+  const auto split = tovali_private::SplitKolvane(tovali_private::QuotedPart(line));
   if (!split) return StoredLine::kDropped;
-  const auto bytes = tovali_private::NarrowKey(split->key);
+  const auto bytes = tovali_private::ToKeyBytes(split->key);
   const ByteRunKey probe(bytes.data(), static_cast<uint32_t>(bytes.size()), false);
   const KeyHashes key = HashesOf(probe);
   index.Prepare(key.inIndex);

@@ -1,4 +1,4 @@
-// The road of a key through a dictionary.
+// Translating keys: own table, then default dictionary, then default text.
 #include <algorithm>
 #include <boost/container/small_vector.hpp>
 #include <cstring>
@@ -23,7 +23,7 @@ void DictionaryTable::MakeDefault() noexcept {
 
 namespace {
 
-// Whether it is ASCII, which stands for itself in every code page.
+// ASCII text is the same in every code page and needs no conversion.
 bool IsASCII(std::span<const char> text) noexcept {
   uint8_t all = 0;
   for (const char byte : text) all |= static_cast<uint8_t>(byte);

@@ -1,4 +1,4 @@
-// What a dictionary does about memory that is held by few entries among many that are gone.
+// Compaction of sparse entry memory.
 #include <memory>
 #include <new>
 #include <utility>
@@ -18,8 +18,8 @@ DictionaryEntry& EntryOf(HashItem& item) noexcept {
 
 }  // namespace
 
-// A move takes time in proportion to the entries that it moves, and there is none before chunks of
-// three times their size were begun since the last. Where memory runs out, the other entries stay.
+// O(live entries), amortised: at least 3 times their size was allocated since the last compaction.
+// If memory runs out, the remaining entries stay where they are.
 void DictionaryTable::MoveFromMostlyDeadMemory() noexcept {
   constexpr uint64_t kMostHeld = 4;
   constexpr uint64_t kLittle = uint64_t{1} << 16;
@@ -28,7 +28,7 @@ void DictionaryTable::MoveFromMostlyDeadMemory() noexcept {
     memory = EntryMemory();
     memory.Expect(liveBytes);
     for (HashItem*& head : buckets) MoveChain(head);
-  } catch (const std::bad_alloc&) {  // what is moved already is in its place
+  } catch (const std::bad_alloc&) {  // the entries copied so far are consistent
   }
 }
 
@@ -45,7 +45,7 @@ void DictionaryTable::MoveChain(HashItem*& head) {
   ReplaceByMoved(head);
 }
 
-// The run of each entry names the one that takes its place.
+// While a chain is copied, each old run's `entry` is the forwarding pointer to its copy.
 void DictionaryTable::ReplaceByMoved(HashItem*& head) noexcept {
   HashItem* last = nullptr;
   for (HashItem* item = std::exchange(head, nullptr); item != nullptr;) {

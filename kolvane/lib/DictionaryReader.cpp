@@ -11,13 +11,13 @@
 namespace tovali_private {
 namespace {
 
-// A zero ends a line as a line end does, and the input too if the line is empty.
-using UnicodeEnds = UnitSet<0, '\n', '\r', kLineSeparatorUnit, kParagraphSeparatorUnit>;
-using MultibyteEnds = UnitSet<0, '\n', '\r'>;
+// A zero ends a line like a line end; if the line is empty, it ends the input.
+using UnicodeEnds = DelimiterSet<0, '\n', '\r', kLineSeparatorUnit, kParagraphSeparatorUnit>;
+using MultibyteEnds = DelimiterSet<0, '\n', '\r'>;
 
 }  // namespace
 
-TextEncoding EncodingByMark(std::string_view image) noexcept {
+TextEncoding EncodingFromBOM(std::string_view image) noexcept {
   if (image.starts_with(platform::kBOMUTF16LE)) return TextEncoding::kUTF16LE;
   if (image.starts_with(platform::kBOMUTF16BE)) return TextEncoding::kUTF16BE;
   return TextEncoding::kCodePage;
@@ -27,7 +27,7 @@ std::unique_ptr<DictionaryReader> DictionaryReader::Create(InputStream* stream) 
   uint8_t mark[platform::kBOMUTF16LE.size()] = {};
   uint32_t count = sizeof mark;
   ReadStreamBytes(stream, mark, count);
-  switch (EncodingByMark({reinterpret_cast<const char*>(mark), count})) {
+  switch (EncodingFromBOM({reinterpret_cast<const char*>(mark), count})) {
     case TextEncoding::kUTF16LE:
       return std::make_unique<UnicodeReader>(stream);
     case TextEncoding::kUTF16BE:
@@ -66,7 +66,7 @@ const uint16_t* UnicodeReader::GetNextLine() {
   return line.Data();
 }
 
-// Takes the units up to the first that ends the line or the input.
+// Appends buffered units up to the first that ends the line or the input.
 void UnicodeReader::TakeBufferedUnits() {
   constexpr size_t kBlock = 64;
   const bool isSwapped = Encoding() == TextEncoding::kUTF16BE;
@@ -75,7 +75,7 @@ void UnicodeReader::TakeBufferedUnits() {
     const std::span<uint16_t> block = line.Extend(std::min(buffered.size() / 2, kBlock));
     std::copy_n(buffered.data(), block.size_bytes(), reinterpret_cast<uint8_t*>(block.data()));
     if (isSwapped) std::transform(block.begin(), block.end(), block.begin(), platform::SwapBytes);
-    const size_t run = UnicodeEnds::RunBefore(std::span<const uint16_t>(block));
+    const size_t run = UnicodeEnds::FindFirst(std::span<const uint16_t>(block));
     line.SetLength(line.Length() - static_cast<uint32_t>(block.size() - run));
     Consume(2 * run);
     if (run < kBlock) return;
@@ -115,10 +115,10 @@ const uint16_t* MultibyteReader::GetNextLine() {
   return line.Data();
 }
 
-// Takes the bytes up to the first that ends the line or the input.
+// Appends buffered bytes up to the first that ends the line or the input.
 void MultibyteReader::TakeBufferedBytes() {
   const auto buffered = Buffered();
-  const size_t run = MultibyteEnds::RunBefore(buffered);
+  const size_t run = MultibyteEnds::FindFirst(buffered);
   const std::span<uint8_t> block = bytes.Extend(run);
   std::copy_n(buffered.data(), run, block.data());
   Consume(run);

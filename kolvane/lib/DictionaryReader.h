@@ -1,4 +1,4 @@
-// Text images as lines of UTF-16, whatever they are encoded in.
+// Reads the lines of text images as UTF-16, in each of their encodings.
 #pragma once
 
 #include <cstdint>
@@ -12,36 +12,36 @@
 
 namespace tovali_private {
 
-// The encoding of a text image, told from its first two bytes: a byte-order mark of UTF-16, or else
-// the system's code page.
-TextEncoding EncodingByMark(std::string_view image) noexcept;
+// Returns the encoding of a text image: UTF-16 if it begins with a byte-order mark, else the
+// system's code page.
+TextEncoding EncodingFromBOM(std::string_view image) noexcept;
 
-// Reads one stream, which it borrows, from where it stands; whoever owns the stream may move it
-// between two lines. Buffers are kept from line to line, and lines have no length limit but theirs.
+// Borrows the stream and reads from its position; the owner may seek between calls. Lines up to
+// 2^31 - 1 units. Buffers are reused from line to line.
 class DictionaryReader {
  public:
   virtual ~DictionaryReader() = default;
 
-  // The next line without its terminator but with a zero unit behind it, valid until the next call;
-  // null when the input ends and no line is pending. A zero character ends a line, and the input
-  // where no line is pending; the next call reads on behind it. Throws OVErrException for a line
-  // that cannot be converted and std::bad_alloc for one that cannot be held.
+  // Returns the next line, its terminator replaced by a zero unit, valid until the next call; or
+  // null at the end of the input. A zero character ends a line; if the line is empty, it ends the
+  // input. The next call continues after it. Throws: OVErrException if a line cannot be converted,
+  // std::bad_alloc.
   virtual const uint16_t* GetNextLine() = 0;
 
-  // The length in units of the line that GetNextLine returned last, its zero unit not counted.
+  // The length in units of the latest line, without its zero unit.
   uint32_t LineLength() const noexcept { return line.Length() - 1; }
 
   TextEncoding Encoding() const noexcept { return encoding; }
 
-  // For the encoding that the mark tells. A mark is left behind the stream's position; without one
-  // the stream is moved back to position 0.
+  // Creates the reader for the stream's encoding. Consumes a byte-order mark; without one, seeks
+  // back to offset 0.
   static std::unique_ptr<DictionaryReader> Create(InputStream* stream);
 
  protected:
   DictionaryReader(InputStream* input, TextEncoding inputEncoding)
       : stream(input), encoding(inputEncoding) {}
 
-  // Reads up to `count` bytes and sets `count` to the number read, which is less only at the end.
+  // Reads up to `count` bytes and sets `count` to the number read; fewer only at the end.
   void ReadBytes(uint8_t* bytes, uint32_t& count) { ReadStreamBytes(stream, bytes, count); }
   static void ReadStreamBytes(InputStream* stream, uint8_t* bytes, uint32_t& count);
 
@@ -63,8 +63,8 @@ class UnicodeReader : public DictionaryReader {
 
   const uint16_t* GetNextLine() override;
 
-  // Reads one unit and returns whether the input ends with it, which it does where no byte is left
-  // and at a zero unit. A single last byte counts as followed by a zero byte.
+  // Reads one unit and returns whether the input ends with it: at the end of the stream and at a
+  // zero unit. An odd last byte is read as if a zero byte followed.
   virtual bool ReadChar(uint16_t& unit);
 
  protected:

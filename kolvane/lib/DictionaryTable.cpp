@@ -71,8 +71,8 @@ const HashItem* DictionaryTable::Bucket(uint32_t bucket) {
   return buckets[bucket];
 }
 
-// Oldest groups go first, and of each the last entry: what comes to the head of a chain after
-// something stands before it. Should memory run out, the rest waits on.
+// Entries are prepended, so the oldest group comes first, and of each group its last entry. On
+// std::bad_alloc the rest stays pending.
 void DictionaryTable::Settle(uint32_t bucket) {
   while (StoredGroup* const group = waiting.Oldest(bucket)) {
     while (group->entryCount != 0) SettleLastOf(*group);

@@ -1,7 +1,7 @@
-// The dictionary proper: entries in 1021 buckets, found by key, loaded from images.
+// The table behind KolvaneDictionary: entries in 1021 buckets, with an index by key.
 //
-// DictionaryTable.cpp keeps the entries, DictionaryLoad.cpp is the road of an image in,
-// DictionaryLookup.cpp the road of a key through, and DictionaryMove.cpp keeps their memory small.
+// DictionaryTable.cpp stores entries, DictionaryLoad.cpp loads images, DictionaryLookup.cpp
+// translates keys, and DictionaryMove.cpp compacts sparse memory.
 #pragma once
 
 #include <cstdint>
@@ -20,11 +20,11 @@ class DictionaryReader;
 class InputStream;
 }  // namespace tovali_private
 
-// Owns its entries. Not for concurrent use: even a lookup writes to the table, and values are
-// shared with plain reference counts. The memory of an entry that is replaced comes back with that
-// of the entries that were made next to it, and at the end of a text load at the latest: entries
-// move there to fresh memory, as far as there is any, when more than four times as much is held for
-// them as they take, and 64 KB. Pointers to entries are good until the next load.
+// Owns its entries; pointers to them are valid until the next load. Not synchronised: even a lookup
+// writes to the table, and values have plain reference counts.
+//
+// The memory of a replaced entry is freed with its chunk, or by compaction after a text load: if
+// more is reserved than 4 times the live bytes plus 64 KB, entries are copied to new memory.
 class DictionaryTable {
  public:
   using DictionaryEntry = tovali_private::DictionaryEntry;
@@ -46,27 +46,19 @@ class DictionaryTable {
   void Load(tovali_private::InputStream& image);
   void Load(std::istream& image);
 
-  // How the latest load went, one that threw included; valid until the next one. To know it all, it
-  // looks into every bucket. Throws std::bad_alloc.
+  // Returns the result of the latest load, also of one that threw; valid until the next load.
+  // Materialises all pending buckets first. Throws: std::bad_alloc.
   const LoadStatus& LastLoad();
 
-  // Makes this the process's default dictionary, in which every table looks for what it lacks. The
-  // table stays with its owner.
+  // Makes this the process-wide default dictionary, where other tables look up the keys that they
+  // lack. The caller keeps ownership.
   void MakeDefault() noexcept;
 
-  // Translates UTF-8 text of the form `$$$/Key=Default text`: the value that this table or else the
-  // default dictionary has for the key, or else the default text, decoded. The result is empty when
-  // there is none of them, for null, for an empty text, and for one that begins with `$` but not
-  // `$$$`.
-  //
-  // The selector (Converters.h) says what the default text is encoded in; with null and 0 each of
-  // its bytes becomes the unit of the same value. Keys are compared as bytes. Throws OVErrException
-  // when the default text cannot be converted, and std::bad_alloc. The first lookup in a bucket
-  // also takes what it takes to make the entries that a binary image has there.
+  // As KolvaneDictionary::Translate. The first lookup in a bucket materialises its pending entries.
   TranslatedString Translate(const char* text, const int* selector);
 
-  // Puts the definition of one line of text (TextSyntax.h) in place of the one that its key had.
-  // When it throws, the table is as it was.
+  // Stores the definition of a text line (TextSyntax.h) and replaces an earlier one of its key. An
+  // exception leaves the table unchanged.
   StoredLine StoreLine(std::span<const uint16_t> line);
 
   // These work on the table's chains, and may have to make a bucket's entries first that a binary
@@ -82,7 +74,7 @@ class DictionaryTable {
   // throws.
   void Insert(std::unique_ptr<DictionaryEntry> entry);
 
-  // The first item of a bucket's chain, or null.
+  // Returns the first item of a bucket's chain, or null.
   const tovali_private::HashItem* Bucket(uint32_t bucket);
 
   // Destroys every entry.
@@ -115,10 +107,10 @@ class DictionaryTable {
   void Adopt(tovali_private::StoredImage&& image);
 
   tovali_private::EntryMemory memory;
-  uint64_t liveBytes = 0;  // what the entries take
+  uint64_t liveBytes = 0;  // the size of all entries
 
-  // The chains are the truth, as far as no group waits for its bucket. The index finds what a walk
-  // from a chain's head would find first.
+  // The chains are authoritative, except for buckets with pending groups. The index finds the entry
+  // that a walk from the head of a chain would find first.
   tovali_private::HashItem* buckets[kBucketCount] = {};
   tovali_private::WaitingGroups waiting;
   tovali_private::KeyIndex index;

@@ -22,7 +22,7 @@ using Units = std::span<const uint16_t>;
 
 constexpr size_t kHeaderSize = kBinaryMagic.size() + 3;
 
-// What the header says of the values' encoding.
+// The header's byte for the encoding of values.
 uint8_t EncodingByte(TextEncoding values) noexcept {
   switch (values) {
     case TextEncoding::kUTF8:
@@ -34,7 +34,7 @@ uint8_t EncodingByte(TextEncoding values) noexcept {
   }
 }
 
-// How many of the value's units come back from the encoding as they are.
+// Returns the number of leading units that survive a round trip through the encoding.
 size_t CarriedUnits(TextEncoding encoding, Bytes stored, Units value) {
   if (encoding == TextEncoding::kUTF16LE) return value.size();
   UnicodeBuffer buffer;
@@ -44,7 +44,7 @@ size_t CarriedUnits(TextEncoding encoding, Bytes stored, Units value) {
   return static_cast<size_t>(std::ranges::mismatch(value, back).in1 - value.begin());
 }
 
-// Lays entries out as an image stores them, group by group.
+// Collects the parts of an image, group by group.
 class ImageComposer {
  public:
   explicit ImageComposer(TextEncoding valueEncoding)
@@ -67,7 +67,7 @@ class ImageComposer {
 
   const std::vector<LostValue>& Lost() const noexcept { return lost; }
 
-  // There is no image without a group.
+  // The format requires at least one group.
   const StoredImage& Finish() {
     if (image.groups.empty()) image.BeginGroup(0);
     return image;
@@ -118,7 +118,7 @@ uint64_t Size1_5(const StoredImage& image) noexcept {
          image.data.size();
 }
 
-// Each offset is the place in the file where the group before ends.
+// Each offset is the end of the previous group in the file.
 void PutBody1_0(std::ostream& out, const StoredImage& image) {
   const size_t recordCount = image.groups.size() + 1;
   const size_t dataAt = kHeaderSize + 2 + 6 * recordCount;

@@ -1,4 +1,4 @@
-// Dictionaries out: a table as an image in the Kolvane Binary Format (BinaryParser.h).
+// Writes a table as an image in the Kolvane Binary Format (BinaryParser.h).
 #pragma once
 
 #include <cstddef>
@@ -14,28 +14,27 @@ namespace tovali_private {
 
 class DictionaryEntry;
 
-// The order of two entries by their keys as bytes.
+// Orders entries by the bytes of their keys.
 bool KeyComesBefore(const DictionaryEntry* one, const DictionaryEntry* other) noexcept;
 
-// The entries that lookups find, by bucket and, within each, by their keys as bytes: an order that
-// depends on nothing but the keys. They stay the table's. Throws std::bad_alloc.
+// Returns the entries that lookups find, ordered by bucket, then by the bytes of the key, so that
+// the order depends on the keys only. The table keeps ownership. Throws: std::bad_alloc.
 std::vector<const DictionaryEntry*> FoundEntries(DictionaryTable& table);
 
 enum class BinaryVersion : uint8_t { k1_0, k1_5 };
 
-// A value that does not come back from its encoding as it is, from this unit on.
+// A value that the encoding cannot represent, from this unit on.
 struct LostValue {
   const DictionaryEntry* entry;
   size_t unit;
 };
 
-// Writes what lookups find in the table: equal contents give equal bytes, and a table that loads
-// the image gives the same answers. Values are encoded in UTF-16LE, UTF-8 or the code page.
+// Writes the entries that lookups find, with values in UTF-16LE, UTF-8 or the code page. Equal
+// contents give equal bytes, and a table that loads the image gives the same answers.
 //
-// Returns the values that the encoding cannot carry; where there is one, nothing was written.
-// Throws std::length_error for an image of more than 2^31 - 2 bytes, which no translator takes,
-// OVErrException for a value that cannot be converted, and std::bad_alloc. Failures of the stream
-// stay with the stream.
+// Returns the values that the encoding cannot represent; if there are any, nothing was written. The
+// stream keeps its own failures. Throws: std::length_error for an image of more than
+// kMostImageBytes, OVErrException for a value that cannot be converted, std::bad_alloc.
 [[nodiscard]] std::vector<LostValue> WriteBinary(DictionaryTable& table, BinaryVersion version,
                                                  TextEncoding values, std::ostream& out);
 

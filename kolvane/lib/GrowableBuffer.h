@@ -1,4 +1,4 @@
-// A growable array that is filled over and over again without giving its storage back.
+// A growable array that keeps its storage when it is cleared.
 #pragma once
 
 #include <algorithm>
@@ -27,7 +27,7 @@ class GrowableBuffer {
     storage[length++] = element;
   }
 
-  // Appends elements that hold nothing yet, and returns their place.
+  // Appends uninitialised elements and returns them.
   std::span<Element> Extend(size_t count) {
     if (count > kMostElements - length) throw std::bad_alloc();  // before the sum wraps, on 32 bits
     Reserve(length + count);
@@ -36,12 +36,12 @@ class GrowableBuffer {
     return place;
   }
 
-  // Makes room for `count` elements in all, keeping those it holds.
+  // Increases the capacity to at least `count`.
   void Reserve(size_t count) {
     if (count > capacity) Grow(count);
   }
 
-  // New elements are whatever the storage holds; `count` is at most the capacity.
+  // New elements are uninitialised. Requires: `count` is at most the capacity.
   void SetLength(uint32_t count) noexcept { length = count; }
 
   void Clear() noexcept { length = 0; }

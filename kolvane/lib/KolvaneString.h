@@ -1,4 +1,4 @@
-// The text of a translation: immutable UTF-16 that many holders share.
+// Immutable, reference-counted UTF-16 text.
 #pragma once
 
 #include <cstddef>
@@ -8,9 +8,9 @@
 
 namespace tovali_private {
 
-// Counts its handles and destroys itself when the last one lets go. The count is a plain integer:
-// handles that share an object stay on one thread at a time, and so do all that come from one
-// dictionary, which share memory.
+// An intrusive reference count; the initial count is 0, and the last Release deletes the object.
+// The count is a plain integer: objects of one dictionary, which also share memory, are used on one
+// thread at a time.
 class RefCountObj {
  public:
   RefCountObj(const RefCountObj&) = delete;
@@ -29,21 +29,20 @@ class RefCountObj {
   uint32_t count = 0;
 };
 
-// A run of bytes, in one block of memory with the object.
+// Bytes, stored in one block of memory with the object.
 class ByteRunValue : public RefCountObj {
  public:
-  // Copies the bytes. Goes with the last handle to it, of which there is none yet. Throws
-  // std::bad_alloc.
+  // Copies the bytes. The initial reference count is 0. Throws: std::bad_alloc.
   static ByteRunValue* Create(const uint8_t* bytes, uint32_t byteCount);
 
-  // Null when there are none.
+  // Null if there are none.
   const uint8_t* Data() const noexcept { return length == 0 ? nullptr : Bytes(); }
   uint32_t Length() const noexcept { return length; }
 
   static void operator delete(void* block) noexcept { ::operator delete(block); }
 
  protected:
-  // The bytes stand `offset` bytes behind the object's start.
+  // The bytes begin `offset` bytes after the object's start.
   ByteRunValue(uint32_t byteCount, uint32_t offset) noexcept
       : length(byteCount), bytesOffset(offset) {}
   ~ByteRunValue() override = default;
@@ -59,15 +58,15 @@ class ByteRunValue : public RefCountObj {
 
 }  // namespace tovali_private
 
-// A handle to a ByteRunValue whose bytes are UTF-16 code units in the machine's order, without a
-// terminator; an odd last byte belongs to no unit. Copying shares the bytes. The data stays valid
-// while any handle to it lives, and is null for an empty string.
+// Shares ownership of UTF-16 code units in the machine's byte order, without terminator. Copying
+// shares the units. Data is valid while any copy exists, and null for an empty string. An odd last
+// byte is not part of the text.
 class KolvaneString {
  public:
-  // The process's one empty string.
+  // The process-wide empty string.
   KolvaneString() : KolvaneString(Empty()) {}
 
-  // Both copy what they are given, and throw std::bad_alloc also when it exceeds 2^32 - 1 bytes.
+  // Copy their input. Throws: std::bad_alloc, also for more than 2^32 - 1 bytes.
   KolvaneString(const uint16_t* units, uint32_t unitCount);
   KolvaneString(const uint8_t* bytes, uint32_t byteCount);
 

@@ -1,4 +1,4 @@
-// Every turning of bytes into integers, and back, that the dictionary library does.
+// All little-endian integer encoding in this library.
 #pragma once
 
 #include <bit>
@@ -6,8 +6,7 @@
 
 namespace tovali_private {
 
-// Texts are stored, and dictionary files are laid out, in little-endian order; code units are used
-// where they lie.
+// Stored text and dictionary files are little-endian, and code units are used in place.
 static_assert(std::endian::native == std::endian::little);
 
 inline uint16_t Read16(const uint8_t* bytes) noexcept {

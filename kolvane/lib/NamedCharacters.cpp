@@ -48,8 +48,8 @@ static_assert(std::size(kNamedCharacters) == 132);
 constexpr size_t kShortestName = 2;
 constexpr size_t kLongestName = 6;
 
-// The places of all names in the table by their first letter, which is ASCII, and for each letter
-// where its places begin; they end where those of the next letter begin.
+// The table's indices sorted by the first letter of the name, and for each ASCII letter the start
+// of its range, which ends at the start of the next letter's.
 struct LetterIndex {
   uint8_t places[std::size(kNamedCharacters)];
   uint8_t begins[0x80 + 1];

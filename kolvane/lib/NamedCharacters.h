@@ -1,4 +1,4 @@
-// The characters that a dictionary may write by name, as `#{nbsp}`.
+// The characters that dictionaries write by name, such as `#{nbsp}`.
 #pragma once
 
 #include <cstddef>
@@ -10,21 +10,21 @@ namespace tovali_private {
 
 struct NamedCharacter {
   std::string_view name;
-  uint16_t character[2];  // the second is 0 but for `endl`, the only name of two units
+  uint16_t character[2];  // the second unit is 0, except in `endl`
 
   std::span<const uint16_t> Units() const noexcept {
     return {character, character[1] == 0 ? size_t{1} : size_t{2}};
   }
 
-  // The units that `#{name}` takes.
+  // The length of `#{name}` in units.
   size_t WrittenLength() const noexcept { return name.size() + 3; }
 };
 
-// All of them: four controls, then the entity names of HTML 4 for Latin-1 by code point, then its
-// special ones. No name is the start of another.
+// All named characters: four controls, the Latin-1 entities of HTML 4 by code point, then its
+// special entities. No name is a prefix of another.
 std::span<const NamedCharacter> NamedCharacters() noexcept;
 
-// The character whose `#{name}` stands at the start of the text, or null. Names are case-sensitive.
+// Returns the character whose `#{name}` the text begins with, or null. Names are case-sensitive.
 const NamedCharacter* MatchNamedCharacter(std::span<const uint16_t> text) noexcept;
 
 }  // namespace tovali_private

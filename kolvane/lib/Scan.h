@@ -1,4 +1,4 @@
-// Looking through text for what ends a part of it.
+// SIMD search for the first of a few delimiters.
 #pragma once
 
 #include <bit>
@@ -22,9 +22,10 @@ inline __m128i EqualUnits(__m128i block, uint8_t unit) noexcept {
   return _mm_cmpeq_epi8(block, _mm_set1_epi8(static_cast<char>(unit)));
 }
 
-// Like UnitSet's RunBefore, for as many whole blocks of 16 bytes as there are.
+// DelimiterSet::FindFirst for the whole blocks of 16 bytes, each compared with all delimiters at
+// once. Returns the end of the blocks if they have none.
 template <auto... kUnits, class Unit>
-size_t RunOfBlocksBefore(std::span<const Unit> text) noexcept {
+size_t FindFirstInBlocks(std::span<const Unit> text) noexcept {
   constexpr size_t kBlock = 16 / sizeof(Unit);
   size_t at = 0;
   for (; text.size() - at >= kBlock; at += kBlock) {
@@ -40,24 +41,24 @@ size_t RunOfBlocksBefore(std::span<const Unit> text) noexcept {
 #else
 
 template <auto... kUnits, class Unit>
-size_t RunOfBlocksBefore(std::span<const Unit>) noexcept {
+size_t FindFirstInBlocks(std::span<const Unit>) noexcept {
   return 0;
 }
 
 #endif
 
-// A few units that are looked for together.
+// A compile-time set of delimiters.
 template <auto... kUnits>
-struct UnitSet {
+struct DelimiterSet {
   template <class Unit>
   static constexpr bool Has(Unit unit) noexcept {
     return ((unit == kUnits) || ...);
   }
 
-  // The length of the part before the first of them, or of the whole text.
+  // Returns the index of the first delimiter, or the text's length.
   template <class Unit>
-  static size_t RunBefore(std::span<const Unit> text) noexcept {
-    size_t at = RunOfBlocksBefore<kUnits...>(text);
+  static size_t FindFirst(std::span<const Unit> text) noexcept {
+    size_t at = FindFirstInBlocks<kUnits...>(text);
     while (at < text.size() && !Has(text[at])) ++at;
     return at;
   }

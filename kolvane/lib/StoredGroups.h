@@ -1,7 +1,5 @@
-// Entries of binary images that stay as they were stored until somebody looks into their bucket.
-//
-// To make entries of an image takes several times as long as to read it, and most programs ask for
-// few of their keys.
+// Deferred entries of binary images, materialised on first access to a bucket: creating entries
+// takes several times as long as reading them, and most programs look up few keys.
 #pragma once
 
 #include <array>
@@ -18,7 +16,7 @@ namespace tovali_private {
 
 struct StoredImage;
 
-// What is left of one group; entries are taken from its end.
+// The rest of a group; entries are taken from its end.
 struct StoredGroup {
   uint32_t bucket = 0;
   uint32_t entryCount = 0;
@@ -79,22 +77,22 @@ struct StoredImage {
   size_t place = 0;
 };
 
-// For every bucket the groups that wait for it, oldest first. Owns their images, each for as long
-// as one of its groups waits.
+// The pending groups of every bucket, oldest first. Owns their images; an image is freed with its
+// last pending group.
 class WaitingGroups {
  public:
   static constexpr uint32_t kBucketCount = 1021;
 
   bool Any() const noexcept { return !images.empty(); }
 
-  // Adds those groups of an image whose buckets there are, and returns how many entries they have.
-  // Throws std::bad_alloc, and has then added none.
+  // Adds the groups of an image whose bucket index is in range, and returns the number of their
+  // entries. Throws: std::bad_alloc; none is added then.
   uint32_t Add(StoredImage&& image);
 
-  // The bucket's oldest group, or null.
+  // Returns the bucket's oldest group, or null.
   StoredGroup* Oldest(uint32_t bucket) const noexcept;
 
-  // Lets go of the bucket's oldest group, and of its image when no other group needs it.
+  // Removes the bucket's oldest group, and frees its image with its last group.
   void DropOldest(uint32_t bucket) noexcept;
 
   void Clear() noexcept;
@@ -105,7 +103,7 @@ class WaitingGroups {
 
   std::vector<std::unique_ptr<StoredImage>> images;
 
-  // The newest group of each bucket; behind it, in a ring, stands the oldest.
+  // Tail of each bucket's circular FIFO; tail->next is the head.
   using Queues = std::array<StoredGroup*, kBucketCount>;
   std::unique_ptr<Queues> newest;
 };

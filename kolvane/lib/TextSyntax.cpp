@@ -20,14 +20,14 @@ size_t KeyLength(std::span<const char> text) noexcept {
 }
 
 size_t KeyLength(Units text) noexcept {
-  return UnitSet<'='>::RunBefore(text);
+  return DelimiterSet<'='>::FindFirst(text);
 }
 
-// The place of the first double quote from `start` on that no backslash immediately precedes, or
-// the line's length. Only the one unit before a quote counts.
+// Returns the index of the first double quote from `start` on that no backslash immediately
+// precedes, or the line's length. Only the unit before a quote counts: `\\"` is escaped too.
 size_t FindQuote(Units line, size_t start) noexcept {
   for (size_t at = start;; ++at) {
-    at += UnitSet<kQuote>::RunBefore(line.subspan(at));
+    at += DelimiterSet<kQuote>::FindFirst(line.subspan(at));
     if (at == line.size() || at == 0 || line[at - 1] != kBackslash) return at;
   }
 }
@@ -58,20 +58,20 @@ const Escape* FindEscape(uint16_t escapeCharacter, uint16_t letter) noexcept {
   return found == table.end() ? nullptr : &*found;
 }
 
-// Returns where the decoded text ends.
+// Returns the end of the decoded text.
 uint16_t* DecodeEscapes(Units text, uint16_t* out) noexcept {
   for (;;) {
-    const size_t plain = UnitSet<kCaret, kBackslash>::RunBefore(text);
+    const size_t plain = DelimiterSet<kCaret, kBackslash>::FindFirst(text);
     out = std::copy_n(text.begin(), plain, out);
     text = text.subspan(plain);
     if (text.empty()) return out;
-    const DecodedStart start = DecodeStart(text);
+    const EscapeToken start = DecodeNext(text);
     out = std::copy_n(start.units, start.count, out);
     text = text.subspan(start.taken);
   }
 }
 
-// In place: a name is longer than its character. Returns where the expanded text ends.
+// Works in place, because a name is longer than its character. Returns the end of the result.
 uint16_t* ExpandNamedCharacters(uint16_t* text, uint16_t* end) noexcept {
   uint16_t* out = std::find(text, end, '#');
   for (const uint16_t* in = out; in != end;) {
@@ -86,8 +86,7 @@ uint16_t* ExpandNamedCharacters(uint16_t* text, uint16_t* end) noexcept {
   return out;
 }
 
-// The letter that stands for a unit after a backslash in written text, or 0 for a unit that is
-// written as it is.
+// Returns the letter that represents a unit after a backslash, or 0 if the unit needs no escape.
 constexpr char LetterFor(uint16_t unit) noexcept {
   switch (unit) {
     case '\n':
@@ -110,26 +109,26 @@ bool IsWritableKey(std::span<const uint8_t> key) noexcept {
   return true;
 }
 
-LineObstacle ObstacleIn(Units value) noexcept {
+UnwritableReason UnwritableReasonOf(Units value) noexcept {
   for (; !value.empty(); value = value.subspan(1)) {
     switch (value.front()) {
       case 0:
-        return LineObstacle::kZeroCharacter;
+        return UnwritableReason::kZeroCharacter;
       case kLineSeparatorUnit:
       case kParagraphSeparatorUnit:
-        return LineObstacle::kLineSeparator;
+        return UnwritableReason::kLineSeparator;
       case '#':
-        if (MatchNamedCharacter(value) != nullptr) return LineObstacle::kNamedCharacter;
+        if (MatchNamedCharacter(value) != nullptr) return UnwritableReason::kNamedCharacter;
     }
   }
-  return LineObstacle::kNone;
+  return UnwritableReason::kNone;
 }
 
 constexpr bool IsInvisible(uint16_t unit) noexcept {
   return unit == 0x00A0 || unit == 0x00AD || (unit >= 0x2000 && unit <= 0x200F);
 }
 
-// The name of what would not be seen in a line, or null.
+// Returns the name of an invisible character, or null.
 const NamedCharacter* NameOfInvisible(uint16_t unit) noexcept {
   if (!IsInvisible(unit)) return nullptr;
   const auto names = NamedCharacters();
@@ -160,29 +159,29 @@ void AppendEscaped(uint16_t unit, std::vector<uint16_t>& line) {
 
 }  // namespace
 
-Units EntryText(Units line) noexcept {
+Units QuotedPart(Units line) noexcept {
   const size_t opening = FindQuote(line, 0);
   if (opening == line.size()) return line;
   const size_t closing = FindQuote(line, opening + 1);
   return line.subspan(opening + 1, closing - opening - 1);
 }
 
-KeyBytes NarrowKey(Units key) {
+KeyBytes ToKeyBytes(Units key) {
   KeyBytes bytes(key.size(), boost::container::default_init);
   std::transform(key.begin(), key.end(), bytes.begin(),
                  [](uint16_t unit) { return static_cast<uint8_t>(unit); });
   return bytes;
 }
 
-DecodedStart DecodeStart(Units text) noexcept {
+EscapeToken DecodeNext(Units text) noexcept {
   const uint16_t unit = text[0];
-  if (!IsEscapeCharacter(unit)) return {DecodedStart::kPlain, 1, 1, {unit}};
-  if (text.size() == 1) return {DecodedStart::kUnfinishedEscape, 1, 1, {unit}};
+  if (!IsEscapeCharacter(unit)) return {EscapeToken::kPlain, 1, 1, {unit}};
+  if (text.size() == 1) return {EscapeToken::kUnfinishedEscape, 1, 1, {unit}};
   const uint16_t letter = text[1];
-  if (letter == unit) return {DecodedStart::kEscape, 2, 1, {unit}};
+  if (letter == unit) return {EscapeToken::kEscape, 2, 1, {unit}};
   const Escape* const escape = FindEscape(unit, letter);
-  if (escape == nullptr) return {DecodedStart::kUnknownEscape, 2, 2, {unit, letter}};
-  return {DecodedStart::kEscape, 2, 1, {escape->character}};
+  if (escape == nullptr) return {EscapeToken::kUnknownEscape, 2, 2, {unit, letter}};
+  return {EscapeToken::kEscape, 2, 1, {escape->character}};
 }
 
 template <class Unit>
@@ -200,7 +199,7 @@ template std::optional<SplitText<char>> SplitKolvane(std::span<const char>) noex
 template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const uint16_t>) noexcept;
 
 Units Unescape(Units text, std::vector<uint16_t>& decoded) {
-  if (EscapeStarts::RunBefore(text) == text.size()) return text;
+  if (EscapeStarts::FindFirst(text) == text.size()) return text;
   decoded.resize(text.size());
   uint16_t* const end = ExpandNamedCharacters(decoded.data(), DecodeEscapes(text, decoded.data()));
   decoded.resize(static_cast<size_t>(end - decoded.data()));
@@ -226,16 +225,17 @@ std::optional<std::vector<uint16_t>> EscapeForText(Units text) {
   return written;
 }
 
-LineObstacle AppendLine(std::span<const uint8_t> key, Units value, std::vector<uint16_t>& line) {
-  if (!IsWritableKey(key)) return LineObstacle::kKey;
-  const LineObstacle obstacle = ObstacleIn(value);
-  if (obstacle != LineObstacle::kNone) return obstacle;
+UnwritableReason AppendLine(std::span<const uint8_t> key, Units value,
+                            std::vector<uint16_t>& line) {
+  if (!IsWritableKey(key)) return UnwritableReason::kKey;
+  const UnwritableReason obstacle = UnwritableReasonOf(value);
+  if (obstacle != UnwritableReason::kNone) return obstacle;
   line.insert(line.end(), {kQuote, '$', '$', '$'});
   line.insert(line.end(), key.begin(), key.end());
   line.push_back('=');
   for (const uint16_t unit : value) AppendEscaped(unit, line);
   if (line.back() != kBackslash) line.push_back(kQuote);
-  return LineObstacle::kNone;
+  return UnwritableReason::kNone;
 }
 
 }  // namespace tovali_private

@@ -1,8 +1,8 @@
-// The grammar of text dictionaries: how a line is taken apart, and how a value is decoded.
+// The grammar of text dictionaries: splitting a line into key and value, and decoding a value.
 //
 //   anything "$$$/Key=Value" anything
 //
-// The functions take code units or bytes and give back parts of them; nothing here keeps state.
+// The results borrow their input unless they are values. Nothing here keeps state.
 #pragma once
 
 #include <boost/container/small_vector.hpp>
@@ -16,10 +16,10 @@
 
 namespace tovali_private {
 
-// The part of a line that holds its definition: what stands between the first two double quotes
-// that no backslash immediately precedes. Without a second one it runs to the end of the line;
-// without a first one it is the whole line.
-std::span<const uint16_t> EntryText(std::span<const uint16_t> line) noexcept;
+// Returns the part of a line between the first two double quotes that no backslash immediately
+// precedes. Without a second quote it extends to the end of the line; without a first one it is the
+// whole line.
+std::span<const uint16_t> QuotedPart(std::span<const uint16_t> line) noexcept;
 
 template <class Unit>
 struct SplitText {
@@ -27,9 +27,9 @@ struct SplitText {
   std::span<const Unit> value;
 };
 
-// Takes `$$$/Key=Value` apart at its first `=`, without which the whole is key and the value empty.
-// The `$$$` belongs to neither part and may be missing; nothing is returned for a text that begins
-// with fewer than three dollar signs but at least one.
+// Splits `$$$/Key=Value` at its first `=`; without one, the whole text is the key and the value is
+// empty. The `$$$` is optional and belongs to neither part. Returns nothing for a text that begins
+// with one or two dollar signs.
 template <class Unit>
 std::optional<SplitText<Unit>> SplitKolvane(std::span<const Unit> text) noexcept;
 
@@ -40,52 +40,50 @@ extern template std::optional<SplitText<uint16_t>> SplitKolvane(std::span<const 
 inline constexpr uint16_t kLineSeparatorUnit = 0x2028;
 inline constexpr uint16_t kParagraphSeparatorUnit = 0x2029;
 
-// What can begin something that Unescape decodes.
-using EscapeStarts = UnitSet<'^', '\\', '#'>;
+// The first units of what Unescape decodes.
+using EscapeStarts = DelimiterSet<'^', '\\', '#'>;
 
-// Keys are bytes: of each unit the low 8 bits.
+// Returns a key's bytes, the low 8 bits of each unit.
 using KeyBytes = boost::container::small_vector<uint8_t, 256>;
-KeyBytes NarrowKey(std::span<const uint16_t> key);
+KeyBytes ToKeyBytes(std::span<const uint16_t> key);
 
-// What the first pass of Unescape, over the escapes, makes of the start of a text.
-struct DecodedStart {
+// One step of the escapes pass of Unescape.
+struct EscapeToken {
   enum Kind : uint8_t { kPlain, kEscape, kUnknownEscape, kUnfinishedEscape };
 
   Kind kind = kPlain;
-  uint8_t taken = 1;  // units of the text, and what they decode to
+  uint8_t taken = 1;  // the number of units consumed, then the units that they decode to
   uint8_t count = 1;
   uint16_t units[2] = {};
 };
 
-// The text is not empty. An escape that is not known, and one without the unit that it escapes, is
-// given back as it is.
-DecodedStart DecodeStart(std::span<const uint16_t> text) noexcept;
+// Decodes the start of a text. An unknown escape, and one at the end of the text, decodes to
+// itself. Requires: the text is not empty.
+EscapeToken DecodeNext(std::span<const uint16_t> text) noexcept;
 
-// Decodes caret and backslash escapes, then named characters such as `#{nbsp}`; what it does not
-// know stays as it is. The result is never longer than the text. The second form gives the text
-// back where there is nothing to decode, and otherwise stores in `decoded` what it gives.
+// Decodes caret and backslash escapes, then named characters such as `#{nbsp}`. Unknown ones stay
+// unchanged. The result is never longer than the text. The second form returns the text itself if
+// there is nothing to decode, else a view of `decoded`.
 KolvaneString Unescape(std::span<const uint16_t> text);
 std::span<const uint16_t> Unescape(std::span<const uint16_t> text, std::vector<uint16_t>& decoded);
 
-// Writes line ends and double quotes as backslash escapes; nothing is returned when the text has
-// none of them. Unescape undoes these escapes, but it also decodes what the text itself held of
-// escapes and named characters.
+// Replaces line ends and double quotes by backslash escapes. Returns nothing if there are none.
+// Unescape is not its inverse: it also decodes escapes and named characters of the text itself.
 std::optional<std::vector<uint16_t>> EscapeForText(std::span<const uint16_t> text);
 
-// Why no line defines a key with a value.
-enum class LineObstacle : uint8_t {
+// Why a key and value cannot be written as text.
+enum class UnwritableReason : uint8_t {
   kNone,
   kKey,            // the key has a zero, a line end, an equals sign, or a quote without a backslash
   kZeroCharacter,  // the value has a zero,
   kLineSeparator,  // or U+2028 or U+2029,
-  kNamedCharacter  // or the name of a named character spelt out: `#{amp}`
+  kNamedCharacter  // or the written form of a named character: `#{amp}`
 };
 
-// Appends the line that defines the key, which is bytes, with the value: StoreLine stores exactly
-// them. Spaces and the like that cannot be seen are written by name, where they have one. No
-// terminator is appended, and nothing at all where there is an obstacle. Where the value
-// ends in a backslash, the line has no closing quote: it would be taken for an escaped one.
-LineObstacle AppendLine(std::span<const uint8_t> key, std::span<const uint16_t> value,
-                        std::vector<uint16_t>& line);
+// Appends a line, without terminator, from which StoreLine stores exactly this key and value.
+// Writes invisible characters by name if they have one. If the value ends in a backslash, the line
+// has no closing quote, which would be read as escaped. Appends nothing if the result is not kNone.
+UnwritableReason AppendLine(std::span<const uint8_t> key, std::span<const uint16_t> value,
+                            std::vector<uint16_t>& line);
 
 }  // namespace tovali_private

@@ -21,7 +21,7 @@ std::u16string Unescaped(const std::u16string& text) {
 std::u16string DecodedByStarts(UnitSpan text) {
   std::u16string decoded;
   while (!text.empty()) {
-    const DecodedStart start = DecodeStart(text);
+    const EscapeToken start = DecodeNext(text);
     Require(start.taken > 0 && start.taken <= text.size(), "a start is a part of the text");
     Require(start.count > 0 && start.count <= start.taken, "a start never grows");
     decoded += TextOf({start.units, start.count});
@@ -50,9 +50,10 @@ void CheckEscaping(const std::u16string& text) {
 void CheckWriting(const std::string& key, const std::u16string& value) {
   std::vector<uint16_t> line = {'x'};
   const std::span bytes(reinterpret_cast<const uint8_t*>(key.data()), key.size());
-  const LineObstacle obstacle = AppendLine(bytes, Units(value), line);
+  const UnwritableReason obstacle = AppendLine(bytes, Units(value), line);
   const std::u16string written = TextOf(line).substr(1);
-  if (obstacle != LineObstacle::kNone) return Require(written.empty(), "nothing is half written");
+  if (obstacle != UnwritableReason::kNone)
+    return Require(written.empty(), "nothing is half written");
   DictionaryTable stored, loaded;
   const Contents expected = {{BucketOf(key), key, value}};
   stored.StoreLine(Units(written));

@@ -78,7 +78,7 @@ void RequireSameLoad(const std::string& name, FileEncoding encoding, const Loade
   const ImageFile file = ReadImageFile(name, encoding);
   const bool isUTF8 = !file.utf8.empty();
   const bool isMarked =
-      !isUTF8 && tovali_private::EncodingByMark(file.bytes) != TextEncoding::kCodePage;
+      !isUTF8 && tovali_private::EncodingFromBOM(file.bytes) != TextEncoding::kCodePage;
   const bool isQuoted = WithoutUTF8Mark(isUTF8 ? file.utf8 : file.bytes).starts_with('"');
   const bool isLoaded = (isMarked || isQuoted) && !loaded.isTooShort && !expected.isTooShort;
   Require(!isLoaded || loaded.answers == expected.answers, "the encoding alone changes");

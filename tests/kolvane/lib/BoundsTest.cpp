@@ -300,7 +300,7 @@ TEST(Bounds, TextsBeyond31And32BitsAreRefusedUnread) {
     }
     EXPECT_THROW(KolvaneString(&byte, static_cast<uint32_t>(size)), std::bad_alloc);
     EXPECT_THROW(KolvaneString(&unit, static_cast<uint32_t>(size)), std::bad_alloc);
-    EXPECT_THROW(NarrowKey({&unit, std::min(size, std::numeric_limits<size_t>::max() / 4)}), std::bad_alloc);
+    EXPECT_THROW(ToKeyBytes({&unit, std::min(size, std::numeric_limits<size_t>::max() / 4)}), std::bad_alloc);
     if (size == 0x7FFFFFFF) continue;
     EXPECT_THROW(CountUnicode("x", size), OVErrException);
     EXPECT_THROW(CountMultiByte(&unit, size), OVErrException);

@@ -72,7 +72,7 @@ TEST(WriterTest, SaysWhyThereIsNoLine) {
     const auto* bytes = reinterpret_cast<const uint8_t*>(key.data());
     return AppendLine({bytes, key.size()}, Units(value), line);
   };
-  using enum LineObstacle;
+  using enum UnwritableReason;
   EXPECT_EQ(obstacle("/a\\\"b", u"#{bogus} #{amp"), kNone);
   for (const std::string& key : {std::string("a=b"), std::string("\""), std::string("a\n"), std::string("a\0", 2)}) {
     EXPECT_EQ(obstacle(key, u""), kKey);

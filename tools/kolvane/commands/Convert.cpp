@@ -78,14 +78,14 @@ std::string PlaceBehind(Units text, const std::string& name) {
 // Throws Failure for what is no text, or malformed.
 std::vector<uint16_t> Decoded(const ImageFile& file) {
   const std::string name = Printable(file.name);
-  if (tovali_private::IsBinary(file.bytes)) {
+  if (tovali_private::HasBinaryMagic(file.bytes)) {
     throw Failure(name +
                   ": a binary dictionary has no encoding to change; 'kolvane dump' prints it");
   }
   if (KindOf(file) == FileKind::kUTF16WithoutMark) RequireDictionary(file);
   if (const auto malformed = MalformedText(file)) throw Failure(*malformed);
   if (!file.utf8.empty()) return ToUTF16(WithoutUTF8Mark(file.utf8));
-  const TextEncoding source = tovali_private::EncodingByMark(file.bytes);
+  const TextEncoding source = tovali_private::EncodingFromBOM(file.bytes);
   if (source == TextEncoding::kCodePage) {
     return FromMultiByte(file.bytes, tovali_private::kDefaultSelector);
   }
@@ -102,8 +102,8 @@ std::vector<uint16_t> Decoded(const ImageFile& file) {
 void RefuseMisreading(const std::string& name, std::string_view text, TextEncoding target) {
   if (target == TextEncoding::kUTF16LE || target == TextEncoding::kUTF16BE) return;
   const bool isUTF16 =
-      tovali_private::EncodingByMark(text) != TextEncoding::kCodePage || LooksLikeUTF16(text);
-  if (!isUTF16 && !tovali_private::IsBinary(text)) return;
+      tovali_private::EncodingFromBOM(text) != TextEncoding::kCodePage || LooksLikeUTF16(text);
+  if (!isUTF16 && !tovali_private::HasBinaryMagic(text)) return;
   throw Failure(
       fmt::format("{}:1:1: nothing was written, for without a byte-order mark the text "
                   "would be taken for {}",

@@ -20,7 +20,7 @@
 namespace {
 
 using tovali_private::DictionaryEntry;
-using tovali_private::LineObstacle;
+using tovali_private::UnwritableReason;
 using Entries = std::vector<const DictionaryEntry*>;
 
 constexpr const char* kAbout =
@@ -61,17 +61,17 @@ Entries EntriesOf(const Request& request, DictionaryTable& table, const ImageFil
   return entries;
 }
 
-const char* ObstacleText(LineObstacle obstacle) {
+const char* ReasonText(UnwritableReason obstacle) {
   switch (obstacle) {
-    case LineObstacle::kNone:
+    case UnwritableReason::kNone:
       return nullptr;
-    case LineObstacle::kKey:
+    case UnwritableReason::kKey:
       return "its key holds a zero, a line end, '=' or a bare quote";
-    case LineObstacle::kZeroCharacter:
+    case UnwritableReason::kZeroCharacter:
       return "its value holds a zero character";
-    case LineObstacle::kLineSeparator:
+    case UnwritableReason::kLineSeparator:
       return "its value holds U+2028 or U+2029, which end a line";
-    case LineObstacle::kNamedCharacter:
+    case UnwritableReason::kNamedCharacter:
       return "its value spells out a named character";
   }
   return nullptr;
@@ -85,9 +85,9 @@ class TextDump {
   // Returns why text cannot hold the entry, or null.
   const char* Append(const DictionaryEntry& entry) {
     std::vector<uint16_t> line;
-    const LineObstacle obstacle =
+    const UnwritableReason obstacle =
         tovali_private::AppendLine(entry.Bytes(), entry.Value().Units(), line);
-    if (obstacle != LineObstacle::kNone) return ObstacleText(obstacle);
+    if (obstacle != UnwritableReason::kNone) return ReasonText(obstacle);
     if (!utf16 && ToUTF16(ToUTF8(line)) != line) {
       return "its value holds an unpaired surrogate, which takes --utf-16";
     }

@@ -33,9 +33,9 @@ class FoundOnce {
 void FindLines(const ImageFile& file, FoundOnce& found) {
   TextLines lines(file);
   for (TextLine line; lines.Next(line);) {
-    const auto split = tovali_private::SplitKolvane(tovali_private::EntryText(line.text));
+    const auto split = tovali_private::SplitKolvane(tovali_private::QuotedPart(line.text));
     if (!split) continue;
-    const auto key = tovali_private::NarrowKey(split->key);
+    const auto key = tovali_private::ToKeyBytes(split->key);
     found.Find(ByteRunKey(key.data(), static_cast<uint32_t>(key.size()), false));
   }
 }
@@ -57,7 +57,7 @@ LoadStatus LoadInto(DictionaryTable& table, const ImageFile& file) {
 std::vector<const DictionaryEntry*> EntriesInFileOrder(DictionaryTable& table,
                                                        const ImageFile& file) {
   FoundOnce found(table);
-  const bool isBinary = tovali_private::IsBinary(file.bytes);
+  const bool isBinary = tovali_private::HasBinaryMagic(file.bytes);
   isBinary ? FindStored(file, found) : FindLines(file, found);
   return found.Take();
 }

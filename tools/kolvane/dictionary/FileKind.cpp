@@ -19,14 +19,14 @@ namespace {
 constexpr std::string_view kSpace = " \t\r\n";
 
 bool IsUTF16(std::string_view image) noexcept {
-  return tovali_private::EncodingByMark(image) != TextEncoding::kCodePage;
+  return tovali_private::EncodingFromBOM(image) != TextEncoding::kCodePage;
 }
 
 // In UTF-8, of the first `most` bytes.
 std::string TextOf(const ImageFile& file, size_t most) {
   if (!file.utf8.empty()) return std::string(WithoutUTF8Mark(file.utf8).substr(0, most));
   const std::string_view bytes = std::string_view(file.bytes).substr(0, most);
-  const TextEncoding encoding = tovali_private::EncodingByMark(bytes);
+  const TextEncoding encoding = tovali_private::EncodingFromBOM(bytes);
   return ToUTF8(encoding == TextEncoding::kCodePage
                     ? FromMultiByte(bytes, tovali_private::kDefaultSelector)
                     : DecodedUTF16(bytes.substr(2), encoding == TextEncoding::kUTF16BE));
@@ -97,7 +97,7 @@ bool LooksLikeUTF16(std::string_view bytes) noexcept {
 }
 
 FileKind KindOf(const ImageFile& file) {
-  if (tovali_private::IsBinary(file.bytes)) return FileKind::kDictionary;
+  if (tovali_private::HasBinaryMagic(file.bytes)) return FileKind::kDictionary;
   if (IsUTF16(file.utf8)) return FileKind::kUTF16AsUTF8;
   if (LooksLikeUTF16(file.utf8.empty() ? file.bytes : file.utf8)) {
     return FileKind::kUTF16WithoutMark;

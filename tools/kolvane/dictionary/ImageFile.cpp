@@ -44,9 +44,9 @@ std::string ReadBytes(const std::string& name) {
 }
 
 bool IsUTF8(std::string_view bytes, FileEncoding encoding) {
-  if (bytes.empty() || tovali_private::IsBinary(bytes)) return false;
+  if (bytes.empty() || tovali_private::HasBinaryMagic(bytes)) return false;
   if (encoding != FileEncoding::kAuto) return encoding == FileEncoding::kUTF8;
-  const bool isUnmarked = tovali_private::EncodingByMark(bytes) == TextEncoding::kCodePage;
+  const bool isUnmarked = tovali_private::EncodingFromBOM(bytes) == TextEncoding::kCodePage;
   return isUnmarked && IsMeantAsUTF8(bytes);
 }
 

@@ -66,7 +66,7 @@ std::string ImageOfUTF8(std::string_view utf8) {
 
   std::vector<uint16_t> image = {kByteOrderMark};
   image.reserve(units.size() + 2);
-  if (tovali_private::EntryText(line).data() == line.data()) image.push_back('"');
+  if (tovali_private::QuotedPart(line).data() == line.data()) image.push_back('"');
   image.insert(image.end(), first.begin(), first.end());
   image.insert(image.end(), emptyLines.begin(), emptyLines.end());
   image.insert(image.end(), rest.begin(), rest.end());

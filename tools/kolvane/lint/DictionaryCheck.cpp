@@ -62,7 +62,7 @@ Definitions CheckText(const ImageFile& file, FileEncoding encoding,
 
 Definitions CheckFile(const ImageFile& file, FileEncoding encoding,
                       std::vector<Finding>& findings) {
-  const bool isBinary = tovali_private::IsBinary(file.bytes);
+  const bool isBinary = tovali_private::HasBinaryMagic(file.bytes);
   return isBinary ? CheckImage(file, findings) : CheckText(file, encoding, findings);
 }
 

@@ -38,7 +38,7 @@ class EncodingCheck {
     }
     if (!file.utf8.empty()) {
       CheckUTF8(encoding, file.utf8, "a byte here is no UTF-8");
-    } else if (tovali_private::EncodingByMark(file.bytes) != TextEncoding::kCodePage) {
+    } else if (tovali_private::EncodingFromBOM(file.bytes) != TextEncoding::kCodePage) {
       return true;
     } else if (IsMeantAsUTF8(file.bytes)) {
       CheckUTF8(encoding, file.bytes,

@@ -11,7 +11,7 @@
 
 namespace {
 
-using tovali_private::DecodedStart;
+using tovali_private::EscapeToken;
 using tovali_private::MatchNamedCharacter;
 using Units = std::span<const uint16_t>;
 
@@ -39,7 +39,7 @@ class EscapeCheck {
 
  private:
   size_t TakeEscape(size_t at) {
-    const DecodedStart start = tovali_private::DecodeStart(value.subspan(at));
+    const EscapeToken start = tovali_private::DecodeNext(value.subspan(at));
     if (room != 0) CheckEscape(start, at);
     for (size_t i = 0; i < start.count; ++i) {
       decoded.push_back(start.units[i]);
@@ -48,13 +48,13 @@ class EscapeCheck {
     return start.taken;
   }
 
-  void CheckEscape(const DecodedStart& start, size_t at) {
-    if (start.kind == DecodedStart::kUnknownEscape) {
+  void CheckEscape(const EscapeToken& start, size_t at) {
+    if (start.kind == EscapeToken::kUnknownEscape) {
       const size_t length = 1 + UnitCount(CodePointAt(value, at + 1));
       Report(
           rules::kUnknownEscape, at,
           fmt::format("'{}' is no escape and stays as it is", ToUTF8(value.subspan(at, length))));
-    } else if (start.kind == DecodedStart::kUnfinishedEscape) {
+    } else if (start.kind == EscapeToken::kUnfinishedEscape) {
       Report(rules::kUnknownEscape, at,
              fmt::format("'{}' at the end escapes nothing", ToUTF8(value.subspan(at, 1))));
     } else if (start.taken == 2 && value[at + 1] == '#') {
@@ -105,6 +105,6 @@ class EscapeCheck {
 }  // namespace
 
 std::vector<EscapeFault> FaultsOfEscapes(Units value, size_t most) {
-  if (tovali_private::EscapeStarts::RunBefore(value) == value.size()) return {};
+  if (tovali_private::EscapeStarts::FindFirst(value) == value.size()) return {};
   return EscapeCheck(value, most).Run();
 }

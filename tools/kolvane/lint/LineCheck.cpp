@@ -41,11 +41,11 @@ class LineCheck {
       : file(fileName),
         line(checkedLine),
         markLength(MarkLength(line)),
-        entry(tovali_private::EntryText(line.text)),
+        entry(tovali_private::QuotedPart(line.text)),
         split(tovali_private::SplitKolvane(entry)),
         findings(list) {
     if (!split) return;
-    const auto bytes = tovali_private::NarrowKey(split->key);
+    const auto bytes = tovali_private::ToKeyBytes(split->key);
     key.assign(bytes.begin(), bytes.end());
   }
 
