@@ -78,8 +78,8 @@ class CommandLine::Parser {
 
   void AddWord(const Option& option, std::vector<std::string> words,
                std::function<void(size_t)> whenChosen) {
-    const auto choose = [words, whenChosen](const std::string& word) {
-      whenChosen(static_cast<size_t>(std::ranges::find(words, word) - words.begin()));
+    const auto choose = [words, call = std::move(whenChosen)](const std::string& word) {
+      call(static_cast<size_t>(std::ranges::find(words, word) - words.begin()));
     };
     Describe(option, app.add_option_function<std::string>(option.names, choose, option.text))
         ->check(CLI::IsMember(std::move(words)));
