@@ -69,14 +69,17 @@ std::optional<BadCharacter> BadCharacterIn(Bytes value, TextEncoding encoding) {
   return std::nullopt;
 }
 
+tovali_private::ParsedImage Parse(const ImageFile& file) {
+  tovali_private::MemoryInput stream(file.bytes);
+  return tovali_private::ParseBinary(stream);
+}
+
 class ImageCheck {
  public:
   ImageCheck(const ImageFile& checked, std::vector<Finding>& list)
-      : file(checked), findings(list) {}
+      : file(checked), findings(list), parsed(Parse(checked)) {}
 
   Definitions Run() {
-    tovali_private::MemoryInput stream(file.bytes);
-    parsed = tovali_private::ParseBinary(stream);
     CheckDamage();
     parsed.stored.ForEachEntry(
         [this](const StoredGroup& group, const StoredEntry& entry) { CheckEntry(group, entry); });
@@ -162,7 +165,7 @@ class ImageCheck {
 
   const ImageFile& file;
   std::vector<Finding>& findings;
-  tovali_private::ParsedImage parsed;
+  const tovali_private::ParsedImage parsed;
   Definitions definitions;
   std::unordered_map<std::string, const StoredGroup*, platform::SeededHash> definingGroups;
   size_t number = 0;
