@@ -125,9 +125,11 @@ void Conversion::Begin(const DataRef& datum) {
   } else if (becomes(kTypeToken)) {
     finished.emplace(TokenName(GetToken(coerced)));
   } else if (becomes(kTypeList)) {
-    Enter(GetList(coerced)).Hold(std::move(source), std::move(coerced));
+    Frame& frame = Enter(GetList(coerced));
+    frame.Hold(std::move(source), std::move(coerced));
   } else if (becomes(kTypeDictionary)) {
-    Enter(GetDictionary(coerced)).Hold(std::move(source), std::move(coerced));
+    Frame& frame = Enter(GetDictionary(coerced));
+    frame.Hold(std::move(source), std::move(coerced));
   } else {
     throw std::domain_error("Attempt to convert unsupported data type in Varnel::AsValue");
   }
