@@ -14,8 +14,9 @@ class DictionaryTable;
 
 // Maps keys to UTF-16 text. It is empty at first, and each load adds to it.
 //
-// Not synchronised, not even for lookups, which share values by plain reference counts: use a
-// dictionary, and the TranslatedStrings from it, on one thread at a time.
+// Not synchronised, not even for lookups. All dictionaries of a process, and the TranslatedStrings
+// from them, must be used by one thread at a time: they share the default dictionary and plain
+// reference counts.
 //
 // Example:
 //
